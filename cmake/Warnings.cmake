@@ -1,0 +1,10 @@
+# Compiler settings shared by every target of ours.
+add_library(mewlo_options INTERFACE)
+target_compile_options(mewlo_options INTERFACE -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Wundef)
+if(MEWLO_WERROR)
+  target_compile_options(mewlo_options INTERFACE -Werror)
+endif()
+if(MEWLO_SANITIZE)
+  add_compile_options(-fsanitize=${MEWLO_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
+  add_link_options(-fsanitize=${MEWLO_SANITIZE})
+endif()

@@ -1,0 +1,20 @@
+// Preferences of the package: survive restarts and power cuts, shared by all its instances. Reads and writes from
+// any thread; change callbacks on the main loop, also for unchanged values and for writes of this process.
+#pragma once
+
+enum preference_error_e {
+    PREFERENCE_ERROR_NONE = 0,
+    PREFERENCE_ERROR_INVALID_PARAMETER = -22,
+    PREFERENCE_ERROR_NO_KEY = -126,
+    PREFERENCE_ERROR_IO_ERROR = -5
+};
+typedef void (*preference_changed_cb)(const char* key, void* user_data);
+
+extern "C" {
+int preference_get_int(const char* key, int* value);
+int preference_set_int(const char* key, int value);
+int preference_get_boolean(const char* key, bool* value);
+int preference_set_boolean(const char* key, bool value);
+int preference_set_changed_cb(const char* key, preference_changed_cb callback, void* user_data);
+int preference_unset_changed_cb(const char* key, preference_changed_cb callback);
+}

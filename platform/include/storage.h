@@ -1,0 +1,16 @@
+// Where recordings live and how much room is left. Any thread.
+#pragma once
+
+#include <sys/statvfs.h>
+
+extern "C" {
+int storage_get_internal_memory_size(struct statvfs* size);
+int storage_get_external_memory_size(struct statvfs* size);
+
+// Storage roots, borrowed for the life of the process: MEWLO_DEVICE_ROOT, MEWLO_CARD_ROOT and MEWLO_PRIVATE_ROOT,
+// else the fixed path where it may be written, else the desktop's own place. Device and private root are resolved
+// once; the card root on every call (the answer stays valid until the next call on the same thread).
+const char* storage_device_root(void);
+const char* storage_card_root(void);
+const char* storage_private_root(void);
+}
