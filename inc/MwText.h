@@ -1,0 +1,18 @@
+#pragma once
+
+#include <cstdlib>
+#include <memory>
+#include <string>
+
+// A std::string in printf style.
+std::string mwFormat(const char* format, ...) __attribute__((format(printf, 1, 2)));
+
+// The translated text of a string identifier.
+std::string mwTranslate(const char* id);
+
+// Adopts a text that a service allocated; null becomes the empty string.
+inline std::string mwAdopt(char* text)
+{
+    const std::unique_ptr<char, decltype(&std::free)> owner(text, &std::free);
+    return text != nullptr ? std::string(text) : std::string();
+}

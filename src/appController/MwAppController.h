@@ -1,0 +1,185 @@
+#pragma once
+
+#include <media_key.h>
+#include <panekit/WTimer.h>
+#include <player.h>
+
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <string>
+
+#include "MwPlayer.h"
+#include "MwRecorder.h"
+#include "MwSignalMgr.h"
+#include "WSignal.h"
+
+class MwAvrcp;
+class MwModel;
+class MwSoundSession;
+
+namespace panekit {
+class WPopupController;
+class WWindowController;
+}
+
+// Owns the media engines and is the only place that starts, pauses, moves or stops them. Everybody else sends commands:
+// synchronously on the main loop, or through one worker that executes them in order and reports each result on the main
+// loop. A command never overlaps another one: the main loop waits for the worker's command and the other way round.
+class MwAppController {
+public:
+    // In the order of their numbers, which are logged.
+    enum Command : unsigned {
+        START_RECORDING,
+        PAUSE_RECORDING,
+        RESUME_RECORDING,
+        CANCEL_RECORDING,
+        STOP_RECORDING,
+        STOP_RECORDING_INTERRUPTED,
+        START_PLAYING,
+        PAUSE_PLAYING,
+        RESUME_PLAYING,
+        STOP_PLAYING,
+        PLAY_PREVIOUS,
+        PLAY_NEXT,
+        SET_PLAYER_POSITION,
+        RESTART_PLAYING,
+    };
+    enum Result : int { SUCCESS, FAIL };
+    // Called on the main loop.
+    using AsyncCallback = std::function<void(Command command, Result result, void* userData)>;
+
+    MwAppController();
+    virtual ~MwAppController();
+    MwAppController(const MwAppController&) = delete;
+    MwAppController& operator=(const MwAppController&) = delete;
+
+    // Model and window controller are borrowed until deinitialize.
+    bool initialize(MwModel* model, panekit::WWindowController* windowController);
+    void deinitialize();
+
+    // Executes at once; false when it was refused or failed.
+    bool dispatchCommand(Command command);
+    // Queues for the worker. True also for a repeat of the waiting head command, whose callback is then never called.
+    bool dispatchCommandAsync(Command command, AsyncCallback callback, void* userData);
+
+    panekit::WSignal<void()>& getPlayerUpdatedSignal() { return _playerUpdatedSignal; }
+    panekit::WSignal<void()>& getRecorderUpdatedSignal() { return _recorderUpdatedSignal; }
+
+    // What opens the recordings after a stop. Handed in at start-up so that the controller knows no screen.
+    void setRecordingsOpener(std::function<void()> opener) { _recordingsOpener = std::move(opener); }
+    void openRecordings();
+
+    // The path of the last recording saved by this process; empty when none.
+    [[nodiscard]] std::string getLastSavedPath() const;
+
+private:
+    class AsyncCmdControl;
+    struct AsyncRequest;
+    using Closure = void (*)(void* data);
+
+    void _initAsyncCmdControl();
+    void _deinitAsyncCmdControl();
+    void _executeAsyncRequest(std::unique_ptr<AsyncRequest> request);
+    void _callSafetyMainThread(Closure closure, void* data);
+    static void _pipeCb(void* data, void* buffer, unsigned int size);
+
+    bool _createRecorder();
+    bool _destroyRecorder();
+    bool _createPlayer();
+    bool _destroyPlayer();
+    void _destroyRecorderHandle();
+
+    bool _execute(Command command);
+    bool _executeStart();
+    bool _executePauseRecording();
+    bool _executeResumeRecording();
+    bool _executeCancel();
+    bool _executeStop(bool interrupted);
+    bool _executeStartPlaying();
+    bool _executePausePlaying();
+    bool _executeResumePlaying();
+    bool _executeStopPlaying();
+    bool _executePlayPrevious();
+    bool _executePlayNext();
+    bool _executeRestartPlaying();
+
+    bool _startRecording();
+    bool _pauseRecording();
+    bool _resumeRecording();
+    bool _cancelRecording(bool interrupted);
+    bool _stopRecording(bool interrupted);
+    void _discardTemporaryRecording();
+    bool _saveRecordingFile();
+    bool _checkRecordedFileDir();
+    bool _moveTempRecordingFile(const char* destFilePath);
+    void _insertRecordedFileToDB(const char* filePath, std::string& mediaId);
+    void _insertBookmarkList(const std::string& mediaId);
+    void _emitSignalAfterStopRecording(bool interrupted);
+    bool _setUpRecorder();
+    static void _postStartFailure(MwRecorder::ErrorType error);
+
+    bool _startPlaying();
+    bool _pausePlaying();
+    bool _resumePlaying();
+    bool _stopPlaying();
+    bool _setPlayerPosition(unsigned int position);
+    bool _isPlayingAllowed();
+    bool _refusedByRecording();
+    bool _playOther(const std::string& path);
+    void _closePlayView();
+    void _playerCompleted();
+    void _playerInterrupted(player_interrupted_code_e code);
+    void _playerErrorOccurred(MwPlayer::PlayerErrorType type);
+
+    void _lifeCycleChanged(MwSignalMgr::LifeCycle lifeCycle);
+    void _pauseInRequestMode();
+    void _recorderErrorOccurred(MwRecorder::ErrorType type);
+    void _grabMediaKey();
+    void _ungrabMediaKey();
+    static void _mediaKeyStatusChanged(media_key_e key, media_key_event_e status, void* userData);
+    void _mediaKeyPressed(media_key_e key);
+    void _mediaKeyReleased(media_key_e key);
+    void _toggleRecording();
+    void _pausePlayingByKey();
+    void _resumePlayingByKey();
+    void _playOtherByKey(Command command);
+    void _holdSeekKey(panekit::WTimer::Weak& timer, bool forward);
+    void _releaseSeekKey(panekit::WTimer::Weak& timer, Command shortPress);
+    bool _seekTick(bool forward);
+    void _dispatchByKey(Command command, const char* failure);
+
+    void _emitPlayerUpdatedSignal();
+    void _emitRecorderUpdatedSignal();
+    void _createErrorPopup(const char* text);
+    bool _sendMessagePort();
+    void _requestLock();
+    void _releaseLock();
+
+    panekit::WWindowController* _windowController = nullptr;
+    MwModel* _model = nullptr;
+    std::unique_ptr<MwSoundSession> _soundSession;
+    std::unique_ptr<MwRecorder> _recorder;
+    std::unique_ptr<MwPlayer> _player;
+    std::unique_ptr<MwAvrcp> _avrcp;
+    bool _resumeAfterInterruption = false;
+    unsigned int _lifeCycleListener = 0;
+    unsigned int _recorderErrorListener = 0;
+    unsigned int _recorderInterruptedListener = 0;
+    unsigned int _recorderLimitListener = 0;
+    unsigned int _playerCompletedListener = 0;
+    unsigned int _playerInterruptedListener = 0;
+    unsigned int _playerErrorListener = 0;
+    panekit::WSignal<void()> _playerUpdatedSignal;
+    panekit::WSignal<void()> _recorderUpdatedSignal;
+    std::unique_ptr<AsyncCmdControl> _asyncCmdControl;
+    panekit::WTimer::Weak _rewindTimer;
+    panekit::WTimer::Weak _fastForwardTimer;
+    panekit::WPopupController* _errorPopup = nullptr;
+    unsigned int _seekStep = 0; // milliseconds
+    struct _Ecore_Pipe* _pipe = nullptr;
+    std::function<void()> _recordingsOpener;
+    // Held for the whole execution of a command, by whichever thread executes it.
+    mutable std::recursive_mutex _commandMutex;
+    std::string _lastSavedPath;
+};

@@ -1,0 +1,23 @@
+#include "MwText.h"
+
+#include <glib.h>
+
+#include <cstdarg>
+#include <libintl.h>
+
+std::string mwFormat(const char* format, ...)
+{
+    va_list arguments;
+    va_start(arguments, format);
+    char* text = g_strdup_vprintf(format, arguments);
+    va_end(arguments);
+    std::string result = text != nullptr ? text : "";
+    g_free(text);
+    return result;
+}
+
+std::string mwTranslate(const char* id)
+{
+    const char* text = gettext(id);
+    return text != nullptr ? text : id;
+}

@@ -1,0 +1,182 @@
+#pragma once
+
+#include <app_control.h>
+#include <media_content.h>
+
+#include <atomic>
+#include <ctime>
+#include <mutex>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "MwHandle.h"
+
+enum MwStorageType : int { MW_STORAGE_DEVICE = 0, MW_STORAGE_CARD = 1 };
+
+// One listed recording.
+struct MwFileInfo {
+    std::string path;
+    std::string displayName; // with extension
+    std::string mediaId;
+    time_t modifiedTime = 0;
+    int duration = 0; // milliseconds
+};
+
+struct MwBookmark {
+    int index = 0;
+    unsigned int markedTime = 0; // seconds
+    std::string name;
+};
+
+// The state that every component shares: settings of the next recording, mirrors of the engines' states, the catalogue,
+// names and bookmarks. Created by MwApp before anything else. Single values, names and bookmarks may be used from the
+// main loop and the command worker; the catalogue (recorded file list) belongs to the main loop.
+class MwModel {
+public:
+    static constexpr int APP_STATE_CREATED = 0, APP_STATE_RESUMED = 1, APP_STATE_PAUSED = 2, APP_STATE_TERMINATED = 3;
+    static constexpr int FORMAT_MP4 = 1, FORMAT_AMR = 2;
+    static constexpr int CODEC_AMR = 0, CODEC_AAC = 1;
+    static constexpr int NO_SIZE_LIMIT = 4194304; // kilobytes
+    static constexpr double SILENCE = -300.0; // decibels
+    static constexpr size_t MAX_BOOKMARKS = 50;
+
+    using RecordedFileCallback = bool (*)(media_info_h media, void* userData);
+
+    MwModel() = default;
+    MwModel(const MwModel&) = delete;
+    MwModel& operator=(const MwModel&) = delete;
+
+    // Catalogue and play order
+    bool createRecordedFileList();
+    void destroyRecordedFileList();
+    bool foreachRecordedFiles(RecordedFileCallback callback, void* userData);
+    [[nodiscard]] const std::vector<MwFileInfo>& getRecordedFileList() const { return _recordedFiles; }
+    // Borrowed until the list changes; null when it is not listed.
+    [[nodiscard]] const MwFileInfo* getRecordedFileInfoByPath(const std::string& path) const;
+    [[nodiscard]] std::optional<std::string> getPreviousPlayPath() const;
+    [[nodiscard]] std::optional<std::string> getNextPlayPath() const;
+    // Milliseconds, 0 when unknown.
+    [[nodiscard]] unsigned int getCurrentPlayDuration() const;
+    [[nodiscard]] static std::string getDurationText(unsigned int milliseconds, bool withHours);
+
+    // Storage
+    [[nodiscard]] MwStorageType getStorageType() const;
+    void setStorageType(MwStorageType type);
+    [[nodiscard]] std::string getStorageRoot() const;
+    // The recorder's temporary file and the final path of a name in the current storage and format.
+    [[nodiscard]] std::string getTemporaryFilePath() const;
+    [[nodiscard]] std::string getRecordingsDirectory() const;
+    [[nodiscard]] std::string getRecordingPath(const std::string& name) const;
+    [[nodiscard]] const char* getFileExtension() const;
+
+    // Names and numbering
+    bool updateLastRecordedFileNumber();
+    bool updateNextRecordingFileName();
+    [[nodiscard]] std::string getDefaultRecordingFileName() const;
+    [[nodiscard]] bool checkRecordFileNameExist(const std::string& name) const;
+    // Releases the number of a recording that was discarded.
+    void windBackRecordingFileName();
+
+    // Bookmarks of the running recording
+    bool addBookMark(unsigned int& markedTime);
+    void clearBookMark();
+    bool saveBookMark(const char* mediaId);
+    [[nodiscard]] std::vector<MwBookmark> getBookmarkList() const;
+    // Keeps name and bookmarks of the running recording beside its temporary file, for a rescue after a crash.
+    bool saveRecordingNotes() const;
+
+    // The request to reply to: a clone owned by the model, null to forget it.
+    void setRequestHandle(app_control_h request);
+    [[nodiscard]] app_control_h getRequestHandle() const { return _request.get(); }
+
+    int getAppState() const { return _appState; }
+    void setAppState(int state) { _appState = state; }
+    int getRecorderState() const { return _recorderState; }
+    // Also publishes the state to other instances, unless this one serves a request.
+    void setRecorderState(int state);
+    int getAudioCodec() const { return _audioCodec; }
+    void setAudioCodec(int codec) { _audioCodec = codec; }
+    int getFileFormat() const { return _fileFormat; }
+    void setFileFormat(int format) { _fileFormat = format; }
+    int getSizeLimit() const { return _sizeLimit; } // kilobytes
+    void setSizeLimit(int kilobytes) { _sizeLimit = kilobytes; }
+    int getSampleRate() const { return _sampleRate; } // hertz
+    void setSampleRate(int hertz) { _sampleRate = hertz; }
+    int getBitRate() const { return _bitRate; } // bits per second
+    void setBitRate(int bitsPerSecond) { _bitRate = bitsPerSecond; }
+    int getEstimatedRecordingMaxTime() const { return _maxTime; } // seconds, 0 for no limit
+    void setEstimatedRecordingMaxTime(int seconds) { _maxTime = seconds; }
+    [[nodiscard]] std::string getCurrentRecordingFileName() const { return _text(_currentName); }
+    void setCurrentRecordingFileName(const std::string& name) { _setText(_currentName, name); }
+    // The user's name for the next recording, empty for the default one.
+    [[nodiscard]] std::string getRenameString() const { return _text(_renameString); }
+    void setRenameString(const std::string& name) { _setText(_renameString, name); }
+    unsigned long long getElapsedTime() const { return _elapsedTime; } // milliseconds recorded
+    void setElapsedTime(unsigned long long milliseconds) { _elapsedTime = milliseconds; }
+    double getLevel() const { return _level; } // decibels
+    void setLevel(double decibels) { _level = decibels; }
+    int getPlayerState() const { return _playerState; }
+    void setPlayerState(int state) { _playerState = state; }
+    [[nodiscard]] std::string getCurrentPlayPath() const { return _text(_playPath); }
+    void setCurrentPlayPath(const std::string& path) { _setText(_playPath, path); }
+    unsigned int getCurrentPlayPosition() const { return _playPosition; } // milliseconds
+    void setCurrentPlayPosition(unsigned int milliseconds) { _playPosition = milliseconds; }
+    bool isRequestMode() const { return _requestMode; }
+    void setRequestMode(bool on) { _requestMode = on; }
+    bool isTrimMode() const { return _trimMode; }
+    void setTrimMode(bool on) { _trimMode = on; }
+    bool isPlayViewShown() const { return _playView; }
+    void setPlayViewShown(bool shown) { _playView = shown; }
+
+private:
+    struct FileNumbers {
+        unsigned long long last = 0;
+        unsigned long long prefix = 0;
+        unsigned long long postfix = 0;
+    };
+
+    static void _getFileNumberFromFileName(
+        const char* fileName, unsigned long long& last, unsigned long long& prefix, unsigned long long& postfix);
+    static bool _collectNumbersCb(media_info_h media, void* userData);
+    static bool _collectFileCb(media_info_h media, void* userData);
+    std::string _advanceToFreeName(FileNumbers& numbers) const;
+    [[nodiscard]] std::optional<size_t> _currentPlayIndex() const;
+
+    std::string _text(const std::string& field) const
+    {
+        const std::lock_guard lock(_mutex);
+        return field;
+    }
+    void _setText(std::string& field, const std::string& value)
+    {
+        const std::lock_guard lock(_mutex);
+        field = value;
+    }
+
+    using RequestHandle = MwHandle<app_control_h, app_control_destroy>;
+
+    mutable std::mutex _mutex; // guards names, numbers, play path and bookmarks
+    std::atomic<int> _appState = APP_STATE_CREATED;
+    std::atomic<int> _recorderState = 0;
+    std::atomic<int> _audioCodec = CODEC_AAC;
+    std::atomic<int> _fileFormat = FORMAT_MP4;
+    std::atomic<int> _sizeLimit = NO_SIZE_LIMIT;
+    std::atomic<int> _sampleRate = 44100;
+    std::atomic<int> _bitRate = 288000;
+    std::atomic<int> _maxTime = 0;
+    std::string _currentName;
+    std::string _renameString;
+    FileNumbers _numbers;
+    std::atomic<unsigned long long> _elapsedTime = 0;
+    std::atomic<double> _level = SILENCE;
+    std::atomic<int> _playerState = 0;
+    std::string _playPath;
+    std::atomic<unsigned int> _playPosition = 0;
+    std::atomic<bool> _requestMode = false;
+    std::atomic<bool> _trimMode = false;
+    std::atomic<bool> _playView = false;
+    RequestHandle _request;
+    std::vector<MwFileInfo> _recordedFiles;
+    std::vector<MwBookmark> _bookmarks;
+};
