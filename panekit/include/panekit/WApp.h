@@ -33,6 +33,7 @@ protected:
     virtual void onAppControl(app_control_h request, bool firstLaunch);
 
 private:
+    void _terminate();
     std::unique_ptr<WWindowController> _window;
 };
 

@@ -35,7 +35,8 @@ public:
     void destroyAttachedPopup();
     [[nodiscard]] bool hasAttachedPopup() const;
 
-    // Installs the more key and the title's more button.
+    // Installs the more key and a more button: in the view's own part "more_button" when its layout has one, else in
+    // the title's part "title_more_btn".
     void setMoreButton(std::function<void()> handler);
 
     // The screen whose view is this object, null when there is none.
@@ -44,6 +45,7 @@ public:
 protected:
     friend class WNaviframeController;
     ~WContentViewController() override;
+    void onDeleteView(Evas_Object* view) override;
 
     virtual void onSetContainerProperties();
     // Puts the view into the naviframe and answers its item.
@@ -51,14 +53,16 @@ protected:
     virtual void onPushed(Evas_Object* item);
     // Called when the screen is about to leave; true lets the naviframe drop it.
     virtual bool onPop();
+    // The screen has been pushed or uncovered.
     virtual void onBecomeTop();
     virtual void onSetAsPageContent();
     virtual void onSetMoreButton();
-    // The screen is on top (again).
+    // The screen above this one has been left.
     virtual void onTop();
 
 private:
     static void _moreKeyCb(void* data, Evas_Object* object, void* info);
+    void _setItemTitle();
 
     std::string _title;
     WNaviframeController* _naviframe = nullptr;

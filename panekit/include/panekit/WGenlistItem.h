@@ -17,6 +17,7 @@ public:
 
     // Appends the row with its style; answers the toolkit's item, null on failure.
     Evas_Object* append(Evas_Object* genlist, Evas_Object* after = nullptr);
+    Evas_Object* prepend(Evas_Object* genlist);
     [[nodiscard]] Evas_Object* getItem() const { return _item; }
     [[nodiscard]] Evas_Object* getGenlist() const { return _genlist; }
     // The row of a toolkit item; null when it is none of ours.
@@ -32,6 +33,9 @@ protected:
     virtual void onRealized();
 
 private:
+    struct Callbacks;
+    friend struct Callbacks;
+    Evas_Object* _adopt(Evas_Object* genlist, Evas_Object* item);
     Evas_Object* _item = nullptr;
     Evas_Object* _genlist = nullptr;
 };

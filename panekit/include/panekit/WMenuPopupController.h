@@ -1,6 +1,7 @@
 #pragma once
 
 #include <functional>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -13,7 +14,7 @@ namespace panekit {
 // tap outside. Create with new; deletes itself when it closes. Main loop only.
 class WMenuPopupController {
 public:
-    WMenuPopupController() = default;
+    WMenuPopupController();
     WMenuPopupController(const WMenuPopupController&) = delete;
     WMenuPopupController& operator=(const WMenuPopupController&) = delete;
 
@@ -29,9 +30,10 @@ public:
 
 private:
     ~WMenuPopupController();
+    friend class WContentViewController;
+    void _setOnDetached(std::function<void()> handler);
     struct Impl;
-    Impl* _impl = nullptr;
-    Impl& _state();
+    std::unique_ptr<Impl> _impl;
 };
 
 }

@@ -27,6 +27,8 @@ protected:
     Evas_Object* onCreateView(Evas_Object* parent, void* viewParam) override;
 
 private:
+    [[nodiscard]] bool _isBottom(const WContentViewController* screen) const;
+    void _popBottom(WContentViewController* screen);
     std::function<bool()> _onLastItemPop;
 };
 

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <functional>
+#include <memory>
 #include <string>
 
 typedef struct _Eo_Opaque Eo;
@@ -17,7 +18,7 @@ public:
 
     enum class Text { Plain, Translatable };
 
-    WPopupController() = default;
+    WPopupController();
     WPopupController(const WPopupController&) = delete;
     WPopupController& operator=(const WPopupController&) = delete;
 
@@ -35,17 +36,20 @@ public:
     bool create(Evas_Object* window);
     void destroy();
     [[nodiscard]] Evas_Object* getEvasObject() const;
+    // Presses a button by its position, as a user would. For tests.
+    void press(size_t button);
 
-    // Every popup of the window that is open, topmost last. For tests and for closing all at exit.
+    // The popup opened last of those that are open, null when there is none. For tests.
     static WPopupController* topmost();
 
 protected:
     virtual ~WPopupController();
 
 private:
+    friend class WContentViewController;
+    void _setOnDetached(std::function<void()> handler);
     struct Impl;
-    Impl* _impl = nullptr;
-    Impl& _state();
+    std::unique_ptr<Impl> _impl;
 };
 
 }

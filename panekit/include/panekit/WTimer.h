@@ -3,9 +3,6 @@
 #include <functional>
 #include <memory>
 
-struct _Ecore_Timer;
-typedef struct _Eo_Opaque Eo;
-
 namespace panekit {
 
 // A timer, job or idler of the main loop. The framework owns it; callers keep a weak pointer, which expires when it
@@ -34,8 +31,9 @@ public:
 
 private:
     struct Impl;
-    explicit WTimer(std::unique_ptr<Impl> impl);
-    std::unique_ptr<Impl> _impl;
+    explicit WTimer(std::shared_ptr<Impl> impl);
+    static Weak _adopt(const std::shared_ptr<Impl>& impl);
+    std::shared_ptr<Impl> _impl;
 };
 
 }

@@ -27,9 +27,12 @@ protected:
     virtual Evas_Object* onCreateView(Evas_Object* parent, void* viewParam) = 0;
     virtual void onCreated();
     virtual void onDestroy();
+    // Deletes the view; called by destroy() only.
+    virtual void onDeleteView(Evas_Object* view);
 
 private:
-    static void _viewDeletedCb(void* data, void* evas, Evas_Object* object, void* info);
+    static void _viewDeletedCb(void* data, Eo* canvas, Evas_Object* object, void* info);
+    void _end();
     Evas_Object* _view = nullptr;
     bool _destroying = false;
 };

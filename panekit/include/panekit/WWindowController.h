@@ -1,5 +1,6 @@
 #pragma once
 
+#include <memory>
 #include <string>
 
 typedef struct _Eo_Opaque Eo;
@@ -14,13 +15,19 @@ class WNaviframeController;
 // that). Main loop only.
 class WWindowController {
 public:
-    // type: an Elm_Win_Type; values that would not be an ordinary window of the desktop make an ordinary one.
+    // type: an Elm_Win_Type. Every value makes an ordinary window: the desktop would frame the other kinds alike.
     WWindowController(std::string name, int type);
     ~WWindowController();
     WWindowController(const WWindowController&) = delete;
     WWindowController& operator=(const WWindowController&) = delete;
 
+    // What the window list of the desktop shows; the name when it is never set.
+    void setTitle(const std::string& title);
     bool create();
+    // Minimises the window: the way to the background on a desktop.
+    void minimise();
+    // The application's window, null when there is none.
+    static WWindowController* getInstance();
     // Takes over the naviframe and builds it inside the window.
     bool attachBaseViewController(WNaviframeController* naviframe);
     [[nodiscard]] WNaviframeController* getBaseViewController() const { return _base; }
@@ -29,11 +36,14 @@ public:
 
 private:
     struct Watch;
+    void _applySize();
+    void _watchVisibility();
+    static void _closeCb(void* data, Evas_Object* object, void* info);
     std::string _name;
-    int _type;
+    std::string _title;
     Evas_Object* _window = nullptr;
     WNaviframeController* _base = nullptr;
-    Watch* _watch = nullptr;
+    std::unique_ptr<Watch> _watch;
 };
 
 }

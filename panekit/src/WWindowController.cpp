@@ -1,0 +1,158 @@
+#include <panekit/WWindowController.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <utility>
+
+#include <Ecore_X.h>
+#include <Elementary.h>
+
+#include <app.h>
+#include <eext_event.h>
+#include <panekit/WNaviframeController.h>
+
+namespace panekit {
+
+namespace {
+
+    // The screens are designed on 720 x 1280 units; on a fresh desktop one unit is half a pixel.
+    constexpr int DESIGN_WIDTH = 720;
+    constexpr int DESIGN_HEIGHT = 1280;
+    constexpr double DESKTOP_SCALE = 1.3;
+
+    WWindowController* instance = nullptr;
+
+    int scaled(int units) { return static_cast<int>(units * elm_config_scale_get() / elm_app_base_scale_get()); }
+
+    void applyDesktopScale()
+    {
+        if (!std::getenv("ELM_SCALE"))
+            elm_config_scale_set(DESKTOP_SCALE);
+        elm_config_scroll_thumbscroll_enabled_set(EINA_TRUE);
+    }
+
+}
+
+// Follows the window manager's word on whether the window is minimised.
+struct WWindowController::Watch {
+    explicit Watch(Ecore_X_Window id)
+        : window(id)
+        , handler(ecore_event_handler_add(ECORE_X_EVENT_WINDOW_PROPERTY, propertyCb, this))
+    {
+    }
+    ~Watch() { ecore_event_handler_del(handler); }
+    Watch(const Watch&) = delete;
+    Watch& operator=(const Watch&) = delete;
+
+    static Eina_Bool propertyCb(void* data, int, void* event)
+    {
+        const auto* self = static_cast<Watch*>(data);
+        const auto* property = static_cast<Ecore_X_Event_Window_Property*>(event);
+        if (property->win == self->window && property->atom == ECORE_X_ATOM_NET_WM_STATE)
+            ui_app_set_window_visible(!self->isHidden());
+        return ECORE_CALLBACK_PASS_ON;
+    }
+    [[nodiscard]] bool isHidden() const
+    {
+        unsigned int count = 0;
+        Ecore_X_Window_State* states = nullptr;
+        ecore_x_netwm_window_state_get(window, &states, &count);
+        const bool hidden = states && std::find(states, states + count, ECORE_X_WINDOW_STATE_HIDDEN) != states + count;
+        std::free(states);
+        return hidden;
+    }
+
+    Ecore_X_Window window;
+    Ecore_Event_Handler* handler;
+};
+
+WWindowController::WWindowController(std::string name, int)
+    : _name(std::move(name))
+{
+}
+
+WWindowController::~WWindowController() { destroy(); }
+
+WWindowController* WWindowController::getInstance() { return instance; }
+
+void WWindowController::setTitle(const std::string& title)
+{
+    _title = title;
+    if (_window)
+        elm_win_title_set(_window, _title.c_str());
+}
+
+bool WWindowController::create()
+{
+    if (_window)
+        return true;
+    applyDesktopScale();
+    _window = elm_win_util_standard_add(_name.c_str(), (_title.empty() ? _name : _title).c_str());
+    if (!_window)
+        return false;
+    instance = this;
+    elm_win_icon_name_set(_window, _name.c_str());
+    evas_object_smart_callback_add(_window, "delete,request", _closeCb, this);
+    eext_window_arm(_window);
+    _applySize();
+    _watchVisibility();
+    ui_app_set_window(_window);
+    evas_object_show(_window);
+    return true;
+}
+
+// Never larger than the screen: at twice the scale the design would not fit on many.
+void WWindowController::_applySize()
+{
+    int width = scaled(DESIGN_WIDTH);
+    int height = scaled(DESIGN_HEIGHT);
+    int screenWidth = 0;
+    int screenHeight = 0;
+    elm_win_screen_size_get(_window, nullptr, nullptr, &screenWidth, &screenHeight);
+    if (screenWidth > 0 && screenHeight > 0) {
+        width = std::min(width, screenWidth);
+        height = std::min(height, screenHeight);
+    }
+    evas_object_resize(_window, width, height);
+}
+
+void WWindowController::_watchVisibility()
+{
+    if (const Ecore_X_Window id = elm_win_xwindow_get(_window); id)
+        _watch = std::make_unique<Watch>(id);
+}
+
+bool WWindowController::attachBaseViewController(WNaviframeController* naviframe)
+{
+    if (!naviframe)
+        return false;
+    if (!_window || _base || !naviframe->create(_window)) {
+        naviframe->destroy();
+        return false;
+    }
+    _base = naviframe;
+    elm_win_resize_object_add(_window, _base->getEvasObject());
+    return true;
+}
+
+void WWindowController::minimise()
+{
+    if (_window)
+        elm_win_iconified_set(_window, EINA_TRUE);
+}
+
+void WWindowController::destroy()
+{
+    if (!_window)
+        return;
+    _watch.reset();
+    ui_app_set_window(nullptr);
+    if (instance == this)
+        instance = nullptr;
+    _base = nullptr;
+    evas_object_del(std::exchange(_window, nullptr));
+}
+
+void WWindowController::_closeCb(void*, Evas_Object*, void*) { ui_app_close(); }
+
+}
