@@ -14,6 +14,7 @@
 #include "MwSignalMgr.h"
 #include "WSignal.h"
 
+struct _Ecore_Pipe;
 class MwAvrcp;
 class MwModel;
 class MwSoundSession;
@@ -109,7 +110,9 @@ private:
     bool _resumeRecording();
     bool _cancelRecording(bool interrupted);
     bool _stopRecording(bool interrupted);
-    void _discardTemporaryRecording();
+    void _releaseTemporaryFile();
+    bool _replyWithRecording();
+    void _recorderLimitReached(MwRecorder::LimitType type);
     bool _saveRecordingFile();
     bool _checkRecordedFileDir();
     bool _moveTempRecordingFile(const char* destFilePath);
@@ -141,6 +144,7 @@ private:
     void _mediaKeyPressed(media_key_e key);
     void _mediaKeyReleased(media_key_e key);
     void _toggleRecording();
+    void _togglePlaying();
     void _pausePlayingByKey();
     void _resumePlayingByKey();
     void _playOtherByKey(Command command);
@@ -177,7 +181,7 @@ private:
     panekit::WTimer::Weak _fastForwardTimer;
     panekit::WPopupController* _errorPopup = nullptr;
     unsigned int _seekStep = 0; // milliseconds
-    struct _Ecore_Pipe* _pipe = nullptr;
+    _Ecore_Pipe* _pipe = nullptr;
     std::function<void()> _recordingsOpener;
     // Held for the whole execution of a command, by whichever thread executes it.
     mutable std::recursive_mutex _commandMutex;

@@ -62,6 +62,8 @@ public:
 
     // Storage
     [[nodiscard]] MwStorageType getStorageType() const;
+    // The stored choice, whether or not a card is mounted.
+    [[nodiscard]] MwStorageType getStorageChoice() const;
     void setStorageType(MwStorageType type);
     [[nodiscard]] std::string getStorageRoot() const;
     // The recorder's temporary file and the final path of a name in the current storage and format.

@@ -8,6 +8,8 @@
 #include <system_settings.h>
 #include <vconf.h>
 
+#include <array>
+
 class MwModel;
 struct _Ecore_Pipe;
 
@@ -56,6 +58,9 @@ public:
     void _callSafetyMainThread(Closure closure, void* data);
 
 private:
+    struct KeyWatch;
+    static const std::array<KeyWatch, 6>& _keyWatches();
+
     static void _mmcStatusChangedCb(keynode_t* node, void* userData);
     static void _lockscreenStateChangedCb(keynode_t* node, void* userData);
     static void _powerOffStateChangedCb(keynode_t* node, void* userData);

@@ -1,0 +1,340 @@
+#include "media/MediaDatabase.h"
+
+#include <dlog.h>
+
+#include <cstdio>
+#include <ctime>
+#include <filesystem>
+#include <utility>
+
+namespace media {
+
+namespace {
+
+    constexpr int BUSY_TIMEOUT_MS = 3000;
+
+    constexpr auto SCHEMA = R"(
+CREATE TABLE IF NOT EXISTS media(
+  MEDIA_ID TEXT PRIMARY KEY NOT NULL, MEDIA_PATH TEXT COLLATE NOCASE NOT NULL,
+  MEDIA_DISPLAY_NAME TEXT COLLATE NOCASE NOT NULL, MEDIA_MIME_TYPE TEXT COLLATE NOCASE NOT NULL,
+  MEDIA_MODE INTEGER NOT NULL DEFAULT 0, MEDIA_STORAGE INTEGER NOT NULL DEFAULT 0, MEDIA_SIZE INTEGER NOT NULL DEFAULT 0,
+  MEDIA_ADDED_TIME INTEGER NOT NULL DEFAULT 0, MEDIA_MODIFIED_TIME INTEGER NOT NULL DEFAULT 0,
+  MEDIA_TIMELINE INTEGER NOT NULL, MEDIA_DURATION INTEGER NOT NULL DEFAULT -1,
+  UNIQUE(MEDIA_PATH COLLATE BINARY)) WITHOUT ROWID;
+CREATE INDEX IF NOT EXISTS media_path ON media(MEDIA_PATH);
+CREATE INDEX IF NOT EXISTS media_timeline ON media(MEDIA_TIMELINE DESC);
+CREATE TABLE IF NOT EXISTS bookmark(
+  BOOKMARK_ID INTEGER PRIMARY KEY, MEDIA_ID TEXT NOT NULL REFERENCES media ON DELETE CASCADE,
+  BOOKMARK_MARKED_TIME INTEGER NOT NULL, BOOKMARK_THUMBNAIL_PATH TEXT, BOOKMARK_NAME TEXT);
+CREATE INDEX IF NOT EXISTS bookmark_media ON bookmark(MEDIA_ID, BOOKMARK_MARKED_TIME);
+)";
+
+    constexpr auto MEDIA_COLUMNS
+        = "MEDIA_ID, MEDIA_PATH, MEDIA_DISPLAY_NAME, MEDIA_MIME_TYPE, MEDIA_MODE, MEDIA_STORAGE, "
+          "MEDIA_SIZE, MEDIA_ADDED_TIME, MEDIA_MODIFIED_TIME, MEDIA_TIMELINE, MEDIA_DURATION";
+
+    bool isDamage(int code) { return (code & 0xff) == SQLITE_CORRUPT || (code & 0xff) == SQLITE_NOTADB; }
+
+    std::string tailOf(const Query& query)
+    {
+        std::string sql;
+        if (!query.condition.empty())
+            sql += " AND (" + query.condition + ")";
+        if (!query.order.empty())
+            sql += " ORDER BY " + query.order;
+        return sql + " LIMIT " + std::to_string(query.count) + " OFFSET " + std::to_string(query.offset);
+    }
+
+}
+
+// A prepared statement; finalized with the object. Binding and stepping keep the first error.
+class Database::Statement {
+public:
+    Statement(sqlite3* db, const std::string& sql)
+    {
+        _code = sqlite3_prepare_v2(db, sql.c_str(), static_cast<int>(sql.size()), &_statement, nullptr);
+        if (_code != SQLITE_OK)
+            __dlog_print(LOG_ID_MAIN, DLOG_ERROR, "MEWLO", "media database: %s", sqlite3_errmsg(db));
+    }
+    ~Statement() { sqlite3_finalize(_statement); }
+    Statement(const Statement&) = delete;
+    Statement& operator=(const Statement&) = delete;
+
+    Statement& bind(const std::string& text)
+    {
+        return _keep(
+            sqlite3_bind_text(_statement, ++_parameter, text.data(), static_cast<int>(text.size()), SQLITE_TRANSIENT));
+    }
+    Statement& bind(long long value) { return _keep(sqlite3_bind_int64(_statement, ++_parameter, value)); }
+
+    // True while there is a row.
+    bool step()
+    {
+        if (_code != SQLITE_OK)
+            return false;
+        const int result = sqlite3_step(_statement);
+        if (result != SQLITE_ROW && result != SQLITE_DONE)
+            _code = result;
+        return result == SQLITE_ROW;
+    }
+    int run()
+    {
+        while (step()) { }
+        return _code;
+    }
+    [[nodiscard]] int code() const { return _code; }
+    [[nodiscard]] std::string text(int column) const
+    {
+        const auto* data = reinterpret_cast<const char*>(sqlite3_column_text(_statement, column));
+        return data != nullptr ? std::string(data, static_cast<size_t>(sqlite3_column_bytes(_statement, column)))
+                               : std::string();
+    }
+    [[nodiscard]] long long number(int column) const { return sqlite3_column_int64(_statement, column); }
+
+private:
+    Statement& _keep(int code)
+    {
+        if (_code == SQLITE_OK)
+            _code = code;
+        return *this;
+    }
+
+    sqlite3_stmt* _statement = nullptr;
+    int _parameter = 0;
+    int _code = SQLITE_OK;
+};
+
+Database::Database(std::string path)
+    : _path(std::move(path))
+{
+}
+
+Database::~Database() { _close(); }
+
+int Database::open()
+{
+    const std::lock_guard lock(_mutex);
+    if (_db != nullptr)
+        return SQLITE_OK;
+    std::error_code ignored;
+    std::filesystem::create_directories(std::filesystem::path(_path).parent_path(), ignored);
+    int result = _openOnce();
+    if (isDamage(result)) {
+        _setAside();
+        result = _openOnce();
+    }
+    return result;
+}
+
+int Database::_openOnce()
+{
+    int result = sqlite3_open_v2(
+        _path.c_str(), &_db, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE | SQLITE_OPEN_FULLMUTEX, nullptr);
+    if (result == SQLITE_OK) {
+        sqlite3_busy_timeout(_db, BUSY_TIMEOUT_MS);
+        // A row is written after its file was flushed; losing the last rows in a power cut only means that the next
+        // start catalogues those files again. Bookmarks have no second copy, hence FULL and not NORMAL.
+        result = sqlite3_exec(_db, "PRAGMA journal_mode=WAL; PRAGMA synchronous=FULL; PRAGMA foreign_keys=ON;", nullptr,
+            nullptr, nullptr);
+    }
+    if (result == SQLITE_OK)
+        result = sqlite3_exec(_db, SCHEMA, nullptr, nullptr, nullptr);
+    if (result != SQLITE_OK) {
+        __dlog_print(LOG_ID_MAIN, DLOG_ERROR, "MEWLO", "media database cannot be opened: %s", sqlite3_errstr(result));
+        _close();
+    }
+    return result;
+}
+
+void Database::_close()
+{
+    sqlite3_close_v2(_db);
+    _db = nullptr;
+    _dataVersion = -1;
+}
+
+void Database::_setAside()
+{
+    _close();
+    const std::string aside = _path + ".damaged-" + std::to_string(std::time(nullptr));
+    for (const char* suffix : {"", "-wal", "-shm"})
+        std::rename((_path + suffix).c_str(), (aside + suffix).c_str());
+    _replaced = true;
+    __dlog_print(LOG_ID_MAIN, DLOG_ERROR, "MEWLO", "the media database is damaged and was set aside");
+}
+
+bool Database::takeReplaced()
+{
+    const std::lock_guard lock(_mutex);
+    return std::exchange(_replaced, false);
+}
+
+bool Database::takeForeignCommit()
+{
+    const std::lock_guard lock(_mutex);
+    if (_db == nullptr)
+        return false;
+    Statement statement(_db, "PRAGMA data_version");
+    if (!statement.step())
+        return false;
+    const long long before = std::exchange(_dataVersion, statement.number(0));
+    return before != -1 && before != _dataVersion;
+}
+
+// Runs the work under the lock; a database found damaged is replaced and the work tried once more.
+int Database::_guarded(const Work& work)
+{
+    const std::lock_guard lock(_mutex);
+    if (_db == nullptr) {
+        if (const int result = open(); result != SQLITE_OK)
+            return result;
+    }
+    int result = work();
+    if (isDamage(result)) {
+        _setAside();
+        result = _openOnce();
+        if (result == SQLITE_OK)
+            result = work();
+    }
+    return result;
+}
+
+int Database::_transaction(const Work& work)
+{
+    return _guarded([&] {
+        int result = sqlite3_exec(_db, "BEGIN IMMEDIATE", nullptr, nullptr, nullptr);
+        if (result != SQLITE_OK)
+            return result;
+        result = work();
+        const int end = sqlite3_exec(_db, result == SQLITE_OK ? "COMMIT" : "ROLLBACK", nullptr, nullptr, nullptr);
+        if (result == SQLITE_OK && end != SQLITE_OK)
+            sqlite3_exec(_db, "ROLLBACK", nullptr, nullptr, nullptr);
+        return result != SQLITE_OK ? result : end;
+    });
+}
+
+int Database::select(const Query& query, std::vector<MediaRow>& rows)
+{
+    return _guarded([&] {
+        rows.clear();
+        Statement statement(_db, std::string("SELECT ") + MEDIA_COLUMNS + " FROM media WHERE 1" + tailOf(query));
+        while (statement.step()) {
+            MediaRow& row = rows.emplace_back();
+            row.id = statement.text(0);
+            row.path = statement.text(1);
+            row.displayName = statement.text(2);
+            row.mimeType = statement.text(3);
+            row.mode = static_cast<int>(statement.number(4));
+            row.storage = static_cast<int>(statement.number(5));
+            row.size = statement.number(6);
+            row.addedTime = statement.number(7);
+            row.modifiedTime = statement.number(8);
+            row.timeline = statement.number(9);
+            row.duration = static_cast<int>(statement.number(10));
+        }
+        return statement.code();
+    });
+}
+
+int Database::_putRow(MediaRow& row)
+{
+    {
+        Statement known(_db, "SELECT MEDIA_ID, MEDIA_ADDED_TIME FROM media WHERE MEDIA_PATH = ? COLLATE BINARY");
+        known.bind(row.path);
+        if (known.step()) {
+            row.id = known.text(0);
+            row.addedTime = known.number(1);
+        }
+        if (known.code() != SQLITE_OK)
+            return known.code();
+    }
+    Statement insert(_db,
+        std::string("INSERT INTO media(") + MEDIA_COLUMNS
+            + ") VALUES(?,?,?,?,?,?,?,?,?,?,?) ON CONFLICT(MEDIA_ID) DO UPDATE SET "
+              "MEDIA_DISPLAY_NAME=excluded.MEDIA_DISPLAY_NAME, "
+              "MEDIA_MIME_TYPE=excluded.MEDIA_MIME_TYPE, MEDIA_MODE=excluded.MEDIA_MODE, "
+              "MEDIA_STORAGE=excluded.MEDIA_STORAGE, "
+              "MEDIA_SIZE=excluded.MEDIA_SIZE, MEDIA_MODIFIED_TIME=excluded.MEDIA_MODIFIED_TIME, "
+              "MEDIA_TIMELINE=excluded.MEDIA_TIMELINE, MEDIA_DURATION=excluded.MEDIA_DURATION");
+    insert.bind(row.id).bind(row.path).bind(row.displayName).bind(row.mimeType).bind(row.mode).bind(row.storage);
+    insert.bind(row.size).bind(row.addedTime).bind(row.modifiedTime).bind(row.timeline).bind(row.duration);
+    return insert.run();
+}
+
+int Database::put(MediaRow& row)
+{
+    return _transaction([&] { return _putRow(row); });
+}
+
+int Database::_removePath(const std::string& path)
+{
+    Statement statement(_db, "DELETE FROM media WHERE MEDIA_PATH = ? COLLATE BINARY");
+    return statement.bind(path).run();
+}
+
+int Database::putAll(std::vector<MediaRow>& rows, const std::vector<std::string>& removedPaths)
+{
+    return _transaction([&] {
+        for (MediaRow& row : rows) {
+            if (const int result = _putRow(row); result != SQLITE_OK)
+                return result;
+        }
+        for (const std::string& path : removedPaths) {
+            if (const int result = _removePath(path); result != SQLITE_OK)
+                return result;
+        }
+        return SQLITE_OK;
+    });
+}
+
+int Database::removeById(const std::string& mediaId)
+{
+    return _transaction([&] { return Statement(_db, "DELETE FROM media WHERE MEDIA_ID = ?").bind(mediaId).run(); });
+}
+
+int Database::rename(const std::string& mediaId, const MediaRow& row)
+{
+    return _transaction([&] {
+        Statement statement(_db,
+            "UPDATE media SET MEDIA_PATH = ?, MEDIA_DISPLAY_NAME = ?, MEDIA_MODE = ?, MEDIA_STORAGE = ? "
+            "WHERE MEDIA_ID = ?");
+        return statement.bind(row.path).bind(row.displayName).bind(row.mode).bind(row.storage).bind(mediaId).run();
+    });
+}
+
+int Database::insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name)
+{
+    return _transaction([&] {
+        Statement statement(_db, "INSERT INTO bookmark(MEDIA_ID, BOOKMARK_MARKED_TIME, BOOKMARK_NAME) VALUES(?,?,?)");
+        return statement.bind(mediaId).bind(static_cast<long long>(markedTime)).bind(name).run();
+    });
+}
+
+int Database::removeBookmark(int bookmarkId)
+{
+    return _transaction([&] {
+        return Statement(_db, "DELETE FROM bookmark WHERE BOOKMARK_ID = ?")
+            .bind(static_cast<long long>(bookmarkId))
+            .run();
+    });
+}
+
+int Database::selectBookmarks(const std::string& mediaId, const Query& query, std::vector<BookmarkRow>& rows)
+{
+    return _guarded([&] {
+        rows.clear();
+        Query ordered = query;
+        if (ordered.order.empty())
+            ordered.order = "BOOKMARK_MARKED_TIME";
+        Statement statement(_db,
+            "SELECT BOOKMARK_ID, BOOKMARK_MARKED_TIME, BOOKMARK_NAME FROM bookmark WHERE MEDIA_ID = ?"
+                + tailOf(ordered));
+        statement.bind(mediaId);
+        while (statement.step())
+            rows.push_back({static_cast<int>(statement.number(0)), static_cast<unsigned int>(statement.number(1)),
+                statement.text(2)});
+        return statement.code();
+    });
+}
+
+}

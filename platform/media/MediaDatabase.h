@@ -1,0 +1,89 @@
+#pragma once
+
+#include <sqlite3.h>
+
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <vector>
+
+namespace media {
+
+// One row of the media table.
+struct MediaRow {
+    std::string id;
+    std::string path;
+    std::string displayName;
+    std::string mimeType;
+    int mode = 0;
+    int storage = 0; // 0 device, 1 card
+    long long size = 0; // bytes
+    long long addedTime = 0; // seconds since the epoch
+    long long modifiedTime = 0; // seconds since the epoch
+    long long timeline = 0; // milliseconds since the epoch: the order of the list
+    int duration = -1; // milliseconds, -1 when the file does not tell
+};
+
+struct BookmarkRow {
+    int id = 0;
+    unsigned int markedTime = 0; // seconds
+    std::string name;
+};
+
+// A condition with its order and window, as SQL text.
+struct Query {
+    std::string condition;
+    std::string order;
+    int offset = 0;
+    int count = -1; // all
+};
+
+// The SQLite file behind the media content interface: one connection, shared by all threads under a lock. A damaged
+// file is set aside and replaced by an empty one; the caller fills it again from the recordings.
+class Database {
+public:
+    explicit Database(std::string path);
+    ~Database();
+    Database(const Database&) = delete;
+    Database& operator=(const Database&) = delete;
+
+    // 0, or SQLite's code. Creates the file and its folder as needed.
+    int open();
+    [[nodiscard]] const std::string& path() const { return _path; }
+    // Whether a damaged file was replaced since the last call.
+    bool takeReplaced();
+    // Whether another connection committed since the last call.
+    bool takeForeignCommit();
+
+    int select(const Query& query, std::vector<MediaRow>& rows);
+    // Inserts the row, or refreshes the one of the same path and takes over its identifier.
+    int put(MediaRow& row);
+    int putAll(std::vector<MediaRow>& rows, const std::vector<std::string>& removedPaths);
+    int removeById(const std::string& mediaId);
+    int rename(const std::string& mediaId, const MediaRow& row);
+
+    int insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name);
+    int removeBookmark(int bookmarkId);
+    int selectBookmarks(const std::string& mediaId, const Query& query, std::vector<BookmarkRow>& rows);
+
+private:
+    class Statement;
+    using Work = std::function<int()>;
+
+    int _guarded(const Work& work);
+    int _transaction(const Work& work);
+    int _openOnce();
+    int _putRow(MediaRow& row);
+    int _removePath(const std::string& path);
+    void _setAside();
+    void _close();
+
+    std::string _path;
+    sqlite3* _db = nullptr;
+    bool _replaced = false;
+    long long _dataVersion = -1;
+    std::recursive_mutex _mutex;
+};
+
+}

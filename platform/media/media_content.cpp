@@ -1,0 +1,492 @@
+#include <media_content.h>
+
+#include <Ecore.h>
+#include <dlog.h>
+#include <storage.h>
+
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <map>
+#include <memory>
+#include <string>
+#include <sys/stat.h>
+#include <system_error>
+#include <unistd.h>
+
+#include "media/MediaDatabase.h"
+#include "media/MediaFile.h"
+#include "media/MediaNotice.h"
+
+struct media_info_s {
+    media::MediaRow row;
+};
+struct audio_meta_s {
+    int duration;
+};
+struct filter_s {
+    media::Query query;
+};
+struct media_bookmark_s {
+    media::BookmarkRow row;
+};
+
+namespace {
+
+constexpr auto RECORDINGS_DIRECTORY = "/Sounds/Mewlo";
+
+struct Connection {
+    explicit Connection(const std::string& path)
+        : database(path)
+        , notice(path + ".changed")
+    {
+    }
+    media::Database database;
+    media::Notice notice;
+    media_content_db_updated_cb callback = nullptr;
+    void* userData = nullptr;
+};
+
+std::mutex connectionMutex; // guards the pointer and the count
+std::shared_ptr<Connection> connection;
+int connectionCount = 0;
+
+std::shared_ptr<Connection> current()
+{
+    const std::lock_guard lock(connectionMutex);
+    return connection;
+}
+
+std::string databasePath()
+{
+    if (const char* path = std::getenv("MEWLO_MEDIA_DB"); path != nullptr && *path != '\0')
+        return path;
+    const char* data = std::getenv("XDG_DATA_HOME");
+    const char* home = std::getenv("HOME");
+    const std::string root
+        = data != nullptr && *data == '/' ? data : std::string(home != nullptr ? home : "/tmp") + "/.local/share";
+    return root + "/mewlo-lite/media.db";
+}
+
+int toError(int code)
+{
+    switch (code & 0xff) {
+    case SQLITE_OK:
+        return MEDIA_CONTENT_ERROR_NONE;
+    case SQLITE_BUSY:
+    case SQLITE_LOCKED:
+        return MEDIA_CONTENT_ERROR_DB_BUSY;
+    case SQLITE_NOMEM:
+        return MEDIA_CONTENT_ERROR_OUT_OF_MEMORY;
+    default:
+        return MEDIA_CONTENT_ERROR_DB_FAILED;
+    }
+}
+
+char* copyText(const std::string& text)
+{
+    auto* copy = static_cast<char*>(std::malloc(text.size() + 1));
+    if (copy != nullptr)
+        std::memcpy(copy, text.c_str(), text.size() + 1);
+    return copy;
+}
+
+int giveText(const std::string& text, char** result)
+{
+    if (result == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    *result = copyText(text);
+    return *result != nullptr ? MEDIA_CONTENT_ERROR_NONE : MEDIA_CONTENT_ERROR_OUT_OF_MEMORY;
+}
+
+// Another process committed, or this one did (it is told too; who does not care compares the process id).
+void committed(int pid)
+{
+    const auto held = current();
+    if (!held || held->callback == nullptr)
+        return;
+    held->callback(MEDIA_CONTENT_ERROR_NONE, pid, MEDIA_ITEM_DIRECTORY, MEDIA_CONTENT_UPDATE, MEDIA_CONTENT_TYPE_SOUND,
+        nullptr, nullptr, nullptr, held->userData);
+}
+
+void refill(Connection& held);
+
+// Common to all writes: run, then tell everybody; after a damaged database was replaced, fill the new one first.
+template <typename Work>
+int write(const Work& work)
+{
+    const auto held = current();
+    if (!held)
+        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    const int result = work(held->database);
+    if (held->database.takeReplaced())
+        refill(*held);
+    if (result == SQLITE_OK)
+        held->notice.touch(::getpid());
+    return toError(result);
+}
+
+struct ScanResult {
+    std::vector<media::MediaRow> changed;
+    std::vector<std::string> removed;
+    int added = 0;
+};
+
+std::map<std::string, media::MediaRow> knownRows(media::Database& database, const std::string& directory)
+{
+    std::vector<media::MediaRow> rows;
+    database.select({}, rows);
+    std::map<std::string, media::MediaRow> known;
+    for (auto& row : rows) {
+        const size_t slash = row.path.rfind('/');
+        if (slash == directory.size() && row.path.compare(0, slash, directory) == 0)
+            known.emplace(row.path, std::move(row));
+    }
+    return known;
+}
+
+bool isUnchanged(const media::MediaRow& row, const std::string& path)
+{
+    struct stat status { };
+    return ::stat(path.c_str(), &status) == 0 && row.size == status.st_size
+        && row.modifiedTime == status.st_mtim.tv_sec;
+}
+
+ScanResult compareFolder(media::Database& database, const std::string& directory)
+{
+    ScanResult result;
+    auto known = knownRows(database, directory);
+    std::error_code error;
+    for (auto entry = std::filesystem::directory_iterator(directory, error);
+         !error && entry != std::filesystem::directory_iterator(); entry.increment(error)) {
+        const std::string name = entry->path().filename().string();
+        if (!media::isRecordingName(name))
+            continue;
+        const std::string path = directory + "/" + name;
+        const auto row = known.extract(path);
+        if (!row.empty() && isUnchanged(row.mapped(), path))
+            continue;
+        if (auto described = media::describeFile(path)) {
+            result.added += row.empty() ? 1 : 0;
+            result.changed.push_back(std::move(*described));
+        }
+    }
+    // A folder that cannot be read (a card pulled out) says nothing about its files.
+    if (!error) {
+        for (const auto& [path, row] : known)
+            result.removed.push_back(path);
+    }
+    return result;
+}
+
+int scan(Connection& held, const std::string& directory, int* added, int* removed)
+{
+    std::error_code ignored;
+    if (!std::filesystem::is_directory(directory, ignored))
+        return MEDIA_CONTENT_ERROR_NONE;
+    ScanResult result = compareFolder(held.database, directory);
+    if (added != nullptr)
+        *added = result.added;
+    if (removed != nullptr)
+        *removed = static_cast<int>(result.removed.size());
+    if (result.changed.empty() && result.removed.empty())
+        return MEDIA_CONTENT_ERROR_NONE;
+    const int code = held.database.putAll(result.changed, result.removed);
+    // The finds are nobody's own change: process id 0 makes every listener reload.
+    if (code == SQLITE_OK)
+        held.notice.touch(0);
+    return toError(code);
+}
+
+void refill(Connection& held)
+{
+    for (const std::string& root : {std::string(storage_device_root()), std::string(storage_card_root())})
+        scan(held, root + RECORDINGS_DIRECTORY, nullptr, nullptr);
+    scan(held, storage_private_root(), nullptr, nullptr);
+}
+
+}
+
+extern "C" {
+
+int media_content_connect(void)
+{
+    const std::lock_guard lock(connectionMutex);
+    if (connectionCount++ > 0)
+        return MEDIA_CONTENT_ERROR_NONE;
+    connection = std::make_shared<Connection>(databasePath());
+    const int result = connection->database.open();
+    if (connection->database.takeReplaced())
+        refill(*connection);
+    connection->database.takeForeignCommit();
+    return toError(result);
+}
+
+int media_content_disconnect(void)
+{
+    const std::lock_guard lock(connectionMutex);
+    if (connectionCount == 0)
+        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    if (--connectionCount == 0)
+        connection.reset();
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_content_set_db_updated_cb(media_content_db_updated_cb callback, void* user_data)
+{
+    const auto held = current();
+    if (!held || callback == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    held->callback = callback;
+    held->userData = user_data;
+    return held->notice.watch(committed) ? MEDIA_CONTENT_ERROR_NONE : MEDIA_CONTENT_ERROR_DB_FAILED;
+}
+
+int media_content_unset_db_updated_cb(void)
+{
+    const auto held = current();
+    if (!held)
+        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    held->notice.unwatch();
+    held->callback = nullptr;
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_content_scan_folder(const char* directory, int* added, int* removed)
+{
+    const auto held = current();
+    if (!held)
+        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    if (directory == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    return scan(*held, directory, added, removed);
+}
+
+char* media_content_escape(const char* text)
+{
+    std::string escaped;
+    for (const char* c = text != nullptr ? text : ""; *c != '\0'; ++c) {
+        if (*c == '"')
+            escaped += '"';
+        escaped += *c;
+    }
+    return copyText(escaped);
+}
+
+int media_filter_create(filter_h* filter)
+{
+    if (filter == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    *filter = new filter_s;
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_filter_destroy(filter_h filter)
+{
+    delete filter;
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_filter_set_condition(filter_h filter, const char* condition, media_content_collation_e)
+{
+    // Comparison without regard to case is a property of the columns; both collations select the same.
+    if (filter == nullptr || condition == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    filter->query.condition = condition;
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_filter_set_order(
+    filter_h filter, media_content_order_e order, const char* keyword, media_content_collation_e collation)
+{
+    if (filter == nullptr || keyword == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    filter->query.order = std::string(keyword) + (collation == MEDIA_CONTENT_COLLATE_NOCASE ? " COLLATE NOCASE" : "")
+        + (order == MEDIA_CONTENT_ORDER_DESC ? " DESC" : " ASC");
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_filter_set_offset(filter_h filter, int offset, int count)
+{
+    if (filter == nullptr || offset < 0 || count < -1)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    filter->query.offset = offset;
+    filter->query.count = count;
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_info_foreach_media_from_db(filter_h filter, media_info_cb callback, void* user_data)
+{
+    const auto held = current();
+    if (!held)
+        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    if (callback == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    std::vector<media::MediaRow> rows;
+    const int result = held->database.select(filter != nullptr ? filter->query : media::Query(), rows);
+    if (held->database.takeReplaced())
+        refill(*held);
+    // The rows are copied first, so the callback may change the database.
+    for (auto& row : rows) {
+        media_info_s media{std::move(row)};
+        if (!callback(&media, user_data))
+            break;
+    }
+    return toError(result);
+}
+
+int media_info_foreach_media_from_db_with_media_mode(filter_h filter, media_info_cb callback, void* user_data)
+{
+    return media_info_foreach_media_from_db(filter, callback, user_data);
+}
+
+int media_info_insert_to_db(const char* path, media_info_h* media)
+{
+    if (path == nullptr || media == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    *media = nullptr;
+    auto row = media::describeFile(path);
+    if (!row)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    const int result = write([&](media::Database& database) { return database.put(*row); });
+    if (result == MEDIA_CONTENT_ERROR_NONE)
+        *media = new media_info_s{std::move(*row)};
+    return result;
+}
+
+int media_info_delete_from_db(const char* media_id)
+{
+    if (media_id == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    return write([&](media::Database& database) { return database.removeById(media_id); });
+}
+
+int media_info_move_to_db(media_info_h media, const char* path)
+{
+    if (media == nullptr || path == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    media::MediaRow row = media->row;
+    media::describePath(row, path);
+    const int result = write([&](media::Database& database) { return database.rename(row.id, row); });
+    if (result == MEDIA_CONTENT_ERROR_NONE)
+        media->row = std::move(row);
+    return result;
+}
+
+int media_info_destroy(media_info_h media)
+{
+    delete media;
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_info_get_media_id(media_info_h media, char** media_id)
+{
+    return media != nullptr ? giveText(media->row.id, media_id) : MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+}
+
+int media_info_get_file_path(media_info_h media, char** path)
+{
+    return media != nullptr ? giveText(media->row.path, path) : MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+}
+
+int media_info_get_display_name(media_info_h media, char** name)
+{
+    return media != nullptr ? giveText(media->row.displayName, name) : MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+}
+
+int media_info_get_modified_time(media_info_h media, time_t* time)
+{
+    if (media == nullptr || time == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    *time = static_cast<time_t>(media->row.modifiedTime);
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_info_get_audio(media_info_h media, audio_meta_h* audio)
+{
+    if (media == nullptr || audio == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    if (media->row.duration < 0)
+        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    *audio = new audio_meta_s{media->row.duration};
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int audio_meta_get_duration(audio_meta_h audio, int* milliseconds)
+{
+    if (audio == nullptr || milliseconds == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    *milliseconds = audio->duration;
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int audio_meta_destroy(audio_meta_h audio)
+{
+    delete audio;
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_bookmark_insert_to_db(const char* media_id, unsigned int marked_time, const char* name)
+{
+    if (media_id == nullptr || name == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    return write([&](media::Database& database) { return database.insertBookmark(media_id, marked_time, name); });
+}
+
+int media_bookmark_delete_from_db(int bookmark_id)
+{
+    return write([&](media::Database& database) { return database.removeBookmark(bookmark_id); });
+}
+
+int media_info_foreach_bookmark_from_db(
+    const char* media_id, filter_h filter, media_bookmark_cb callback, void* user_data)
+{
+    const auto held = current();
+    if (!held)
+        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    if (media_id == nullptr || callback == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    std::vector<media::BookmarkRow> rows;
+    const int result
+        = held->database.selectBookmarks(media_id, filter != nullptr ? filter->query : media::Query(), rows);
+    for (auto& row : rows) {
+        media_bookmark_s bookmark{std::move(row)};
+        if (!callback(&bookmark, user_data))
+            break;
+    }
+    return toError(result);
+}
+
+int media_info_get_bookmark_count_from_db(const char* media_id, filter_h filter, int* count)
+{
+    if (count == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    *count = 0;
+    const auto counting = [](media_bookmark_h, void* user_data) {
+        ++*static_cast<int*>(user_data);
+        return true;
+    };
+    return media_info_foreach_bookmark_from_db(media_id, filter, counting, count);
+}
+
+int media_bookmark_get_bookmark_id(media_bookmark_h bookmark, int* id)
+{
+    if (bookmark == nullptr || id == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    *id = bookmark->row.id;
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_bookmark_get_marked_time(media_bookmark_h bookmark, unsigned int* time)
+{
+    if (bookmark == nullptr || time == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    *time = bookmark->row.markedTime;
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_bookmark_get_name(media_bookmark_h bookmark, char** name)
+{
+    return bookmark != nullptr ? giveText(bookmark->row.name, name) : MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+}
+}

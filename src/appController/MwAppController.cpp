@@ -1,0 +1,366 @@
+#include "MwAppController.h"
+
+#include <Ecore.h>
+#include <app.h>
+#include <message_port.h>
+#include <notification.h>
+#include <panekit/WPopupController.h>
+#include <panekit/WWindowController.h>
+
+#include "MwAsyncCmdControl.h"
+#include "MwAvrcp.h"
+#include "MwLog.h"
+#include "MwModel.h"
+#include "MwSoundSession.h"
+#include "MwSystemMgr.h"
+#include "MwText.h"
+
+namespace {
+
+constexpr auto INDICATOR_APP_ID = "com.tovanic.indicator";
+constexpr auto INDICATOR_PORT = "mewlo_indicator_port";
+constexpr auto INDICATOR_KEY = "mewlo_indicator_data";
+
+struct PipeMessage {
+    void (*closure)(void* data);
+    void* data;
+};
+
+// What the indicator is to show; nothing while the window itself can be seen.
+const char* indicatorValue(const MwModel& model)
+{
+    if (model.getAppState() != MwModel::APP_STATE_PAUSED)
+        return "mewlo_none";
+    if (model.getRecorderState() == MwRecorder::REC_STATE_RECORDING)
+        return "bg_recording_start";
+    if (model.getRecorderState() == MwRecorder::REC_STATE_PAUSED)
+        return "bg_recording_pause";
+    if (model.getPlayerState() == MwPlayer::PLAY_STATE_PLAYING)
+        return "bg_playing_start";
+    if (model.getPlayerState() == MwPlayer::PLAY_STATE_PAUSED)
+        return "bg_playing_pause";
+    return "mewlo_none";
+}
+
+bool sendToIndicator(const char* value)
+{
+    bundle* message = bundle_create();
+    if (message == nullptr) {
+        MW_LOGE("bundle_create failed!!!");
+        return false;
+    }
+    if (const int result = bundle_add_str(message, INDICATOR_KEY, value); result != 0) {
+        MW_LOGE("bundle_add_str failed : [%d]!!!", result);
+    } else if (message_port_check_remote_port(INDICATOR_APP_ID, INDICATOR_PORT) == 0) {
+        const int sent = message_port_send_message(INDICATOR_APP_ID, INDICATOR_PORT, message);
+        if (sent != 0 && sent != MESSAGE_PORT_ERROR_PORT_NOT_FOUND)
+            MW_LOGE("messageport_send_message failed : [%d]!!!", sent);
+    }
+    if (const int result = bundle_free(message); result != 0) {
+        MW_LOGE("bundle_free failed : [%d]!!!", result);
+        return false;
+    }
+    return true;
+}
+
+template <typename Signal>
+void dropListener(Signal& signal, unsigned int& id)
+{
+    if (id != 0)
+        signal.removeListener(std::exchange(id, 0));
+}
+
+}
+
+MwAppController::MwAppController() = default;
+
+MwAppController::~MwAppController()
+{
+    panekit::WTimer::destroy(_rewindTimer);
+    panekit::WTimer::destroy(_fastForwardTimer);
+}
+
+bool MwAppController::initialize(MwModel* model, panekit::WWindowController* windowController)
+{
+    MW_LOGW("BEGIN");
+    if (model == nullptr) {
+        MW_LOGE("model is nullptr");
+        return false;
+    }
+    if (windowController == nullptr) {
+        MW_LOGE("windowController is nullptr");
+        return false;
+    }
+    _model = model;
+    _windowController = windowController;
+    _lifeCycleListener = MwSignalMgr::getInstance()->getLifeCycleSignal().addListener(
+        [this](MwSignalMgr::LifeCycle lifeCycle) { _lifeCycleChanged(lifeCycle); });
+    _initAsyncCmdControl();
+    if (!_soundSession)
+        _soundSession = std::make_unique<MwSoundSession>();
+    if (!_avrcp)
+        _avrcp = std::make_unique<MwAvrcp>();
+    if (!_createRecorder()) {
+        MW_LOGE("_createRecorder failed");
+        return false;
+    }
+    if (!_createPlayer()) {
+        MW_LOGE("_createPlayer failed");
+        return false;
+    }
+    _pipe = ecore_pipe_add(_pipeCb, this);
+    MW_LOGW("END");
+    return true;
+}
+
+void MwAppController::deinitialize()
+{
+    MW_LOGW("BEGIN");
+    if (_model == nullptr)
+        return;
+    const int playerState = _model->getPlayerState();
+    const bool plays = playerState == MwPlayer::PLAY_STATE_PLAYING || playerState == MwPlayer::PLAY_STATE_PAUSED;
+    if (_player && plays && !dispatchCommand(STOP_PLAYING))
+        MW_LOGE("player stop failed");
+    {
+        // A command of the worker is waited for, so the state read here is the final one.
+        const std::lock_guard lock(_commandMutex);
+        const int recorderState = _model->getRecorderState();
+        const bool records
+            = recorderState == MwRecorder::REC_STATE_RECORDING || recorderState == MwRecorder::REC_STATE_PAUSED;
+        if (_recorder && records && !dispatchCommand(STOP_RECORDING))
+            MW_LOGE("recording stop failed");
+    }
+    if (!_destroyRecorder())
+        MW_LOGE("recorder destroy filaed");
+    if (!_destroyPlayer())
+        MW_LOGE("player destroy filaed");
+    _deinitAsyncCmdControl();
+    _soundSession.reset();
+    _avrcp.reset();
+    _releaseLock();
+    if (MwSignalMgr* signals = MwSignalMgr::existing(); signals != nullptr)
+        dropListener(signals->getLifeCycleSignal(), _lifeCycleListener);
+    _playerUpdatedSignal.removeAll();
+    _recorderUpdatedSignal.removeAll();
+    if (_pipe != nullptr) {
+        ecore_pipe_wait(_pipe, 0, 0.0); // results still on their way are freed; nobody waits for them any more
+        ecore_pipe_del(_pipe);
+    }
+    _pipe = nullptr;
+    MW_LOGW("END");
+}
+
+void MwAppController::_initAsyncCmdControl()
+{
+    if (_asyncCmdControl) {
+        MW_LOGE("aync command control already created");
+        return;
+    }
+    _asyncCmdControl = std::make_unique<AsyncCmdControl>(
+        _commandMutex, [this](std::unique_ptr<AsyncRequest> request) { _executeAsyncRequest(std::move(request)); });
+}
+
+void MwAppController::_deinitAsyncCmdControl() { _asyncCmdControl.reset(); }
+
+// On the worker, with the command mutex held.
+void MwAppController::_executeAsyncRequest(std::unique_ptr<AsyncRequest> request)
+{
+    if (dispatchCommand(request->command)) {
+        MW_LOGI("command[%d] success", static_cast<int>(request->command));
+        request->result = SUCCESS;
+    } else {
+        MW_LOGE("command[%d] failed", static_cast<int>(request->command));
+        request->result = FAIL;
+    }
+    _callSafetyMainThread(
+        [](void* data) {
+            const std::unique_ptr<AsyncRequest> done(static_cast<AsyncRequest*>(data));
+            if (done->controller->_asyncCmdControl)
+                done->callback(done->command, done->result, done->userData);
+        },
+        request.release());
+}
+
+bool MwAppController::dispatchCommandAsync(Command command, AsyncCallback callback, void* userData)
+{
+    MW_LOGI("BEGIN - request async command [%d]", static_cast<int>(command));
+    if (!_asyncCmdControl) {
+        MW_LOGE("aync command control is not working");
+        return false;
+    }
+    _asyncCmdControl->queue(
+        std::make_unique<AsyncRequest>(AsyncRequest{this, command, SUCCESS, std::move(callback), userData, false}));
+    return true;
+}
+
+void MwAppController::_callSafetyMainThread(Closure closure, void* data)
+{
+    if (_pipe == nullptr) {
+        MW_LOGE("_pipe is nullptr");
+        return;
+    }
+    if (eina_main_loop_is()) {
+        closure(data);
+        return;
+    }
+    const PipeMessage message{closure, data};
+    if (ecore_pipe_write(_pipe, &message, sizeof message) == EINA_FALSE)
+        MW_LOGE("ecore_pipe_write failed!!!");
+}
+
+void MwAppController::_pipeCb(void*, void* buffer, unsigned int)
+{
+    if (buffer == nullptr)
+        return;
+    const PipeMessage message = *static_cast<PipeMessage*>(buffer);
+    message.closure(message.data);
+}
+
+bool MwAppController::_createRecorder()
+{
+    if (_recorder) {
+        MW_LOGE("recorder is already created");
+        return false;
+    }
+    _recorder = std::make_unique<MwRecorder>();
+    _model->setRecorderState(MwRecorder::REC_STATE_READY);
+    _recorderErrorListener
+        = _recorder->errorSignal.addListener([this](MwRecorder::ErrorType type) { _recorderErrorOccurred(type); });
+    _recorderInterruptedListener
+        = _recorder->interruptedSignal.addListener([this] { _emitSignalAfterStopRecording(true); });
+    _recorderLimitListener = _recorder->limitReachedSignal.addListener(
+        [this](MwRecorder::LimitType type) { _recorderLimitReached(type); });
+    return true;
+}
+
+bool MwAppController::_destroyRecorder()
+{
+    const std::lock_guard lock(_commandMutex);
+    if (!_recorder)
+        return false;
+    dropListener(_recorder->errorSignal, _recorderErrorListener);
+    dropListener(_recorder->interruptedSignal, _recorderInterruptedListener);
+    dropListener(_recorder->limitReachedSignal, _recorderLimitListener);
+    _recorder.reset();
+    _model->setRecorderState(MwRecorder::REC_STATE_NONE);
+    return true;
+}
+
+bool MwAppController::_createPlayer()
+{
+    if (_player) {
+        MW_LOGE("player is already created");
+        return false;
+    }
+    _player = std::make_unique<MwPlayer>(_model);
+    _playerCompletedListener = _player->getCompletedSignal().addListener([this] { _playerCompleted(); });
+    _playerInterruptedListener = _player->getInterruptedSignal().addListener(
+        [this](player_interrupted_code_e code) { _playerInterrupted(code); });
+    _playerErrorListener
+        = _player->getErrorSignal().addListener([this](MwPlayer::PlayerErrorType type) { _playerErrorOccurred(type); });
+    return true;
+}
+
+bool MwAppController::_destroyPlayer()
+{
+    const std::lock_guard lock(_commandMutex);
+    if (!_player)
+        return false;
+    dropListener(_player->getCompletedSignal(), _playerCompletedListener);
+    dropListener(_player->getInterruptedSignal(), _playerInterruptedListener);
+    dropListener(_player->getErrorSignal(), _playerErrorListener);
+    _player.reset();
+    return true;
+}
+
+void MwAppController::_lifeCycleChanged(MwSignalMgr::LifeCycle lifeCycle)
+{
+    MW_LOGI("Life Cycle : [%d]", lifeCycle);
+    switch (lifeCycle) {
+    case MwSignalMgr::RESUME:
+        _sendMessagePort();
+        break;
+    case MwSignalMgr::PAUSE:
+        if (_model->isRequestMode())
+            _pauseInRequestMode();
+        else
+            _sendMessagePort();
+        break;
+    case MwSignalMgr::TERMINATE:
+        deinitialize();
+        _sendMessagePort();
+        break;
+    }
+}
+
+void MwAppController::_recorderErrorOccurred(MwRecorder::ErrorType type)
+{
+    MW_LOGE("Error signal: [%d]", type);
+    _createErrorPopup("Interal Error!");
+    _ungrabMediaKey();
+    _releaseLock();
+}
+
+void MwAppController::_createErrorPopup(const char* text)
+{
+    if (_errorPopup != nullptr)
+        _errorPopup->destroy();
+    Evas_Object* window = _windowController->getEvasObject();
+    if (window == nullptr)
+        return; // a program without a window has the log line
+    using panekit::WPopupController;
+    _errorPopup = new WPopupController;
+    _errorPopup->setTitle("Alert", WPopupController::Text::Plain);
+    _errorPopup->setContent(text, WPopupController::Text::Plain);
+    _errorPopup->addButton("IDS_MW_BUTTON_OK", [](WPopupController* popup) { popup->destroy(); });
+    _errorPopup->setOnDestroyed([this] { _errorPopup = nullptr; });
+    if (!_errorPopup->create(window) && _errorPopup != nullptr)
+        _errorPopup->destroy();
+}
+
+void MwAppController::_emitPlayerUpdatedSignal()
+{
+    _callSafetyMainThread([](void* data) { static_cast<MwAppController*>(data)->_playerUpdatedSignal.emit(); }, this);
+}
+
+void MwAppController::_emitRecorderUpdatedSignal()
+{
+    _callSafetyMainThread([](void* data) { static_cast<MwAppController*>(data)->_recorderUpdatedSignal.emit(); }, this);
+}
+
+bool MwAppController::_sendMessagePort() { return _model != nullptr && sendToIndicator(indicatorValue(*_model)); }
+
+void MwAppController::_requestLock()
+{
+    if (_model == nullptr) {
+        MW_LOGE("_model is nullptr");
+        return;
+    }
+    MwSystemMgr::getInstance()->requestLockCPU();
+    if (_model->isRequestMode())
+        MwSystemMgr::getInstance()->requestLockDisplayDim();
+}
+
+void MwAppController::_releaseLock()
+{
+    if (_model == nullptr) {
+        MW_LOGE("_model is nullptr");
+        return;
+    }
+    MwSystemMgr::getInstance()->releaseLockCPU();
+    if (_model->isRequestMode())
+        MwSystemMgr::getInstance()->releaseLockDisplayDim();
+}
+
+void MwAppController::openRecordings()
+{
+    if (_recordingsOpener)
+        _recordingsOpener();
+}
+
+std::string MwAppController::getLastSavedPath() const
+{
+    const std::lock_guard lock(_commandMutex);
+    return _lastSavedPath;
+}

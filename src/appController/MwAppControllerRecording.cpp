@@ -1,0 +1,402 @@
+#include "MwAppController.h"
+
+#include <Ecore_File.h>
+#include <app.h>
+#include <media_content.h>
+#include <notification.h>
+#include <recorder_leftover.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <memory>
+#include <unistd.h>
+
+#include "MwAvrcp.h"
+#include "MwFiles.h"
+#include "MwHandle.h"
+#include "MwLog.h"
+#include "MwLoggingMgr.h"
+#include "MwModel.h"
+#include "MwRecordingNotes.h"
+#include "MwSoundSession.h"
+#include "MwText.h"
+
+namespace {
+
+constexpr int AUDIO = 0; // kind of recording asked about
+
+void post(const char* id) { notification_status_message_post(mwTranslate(id).c_str()); }
+
+bool isRecordingOrPaused(const MwModel& model)
+{
+    const int state = model.getRecorderState();
+    return state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED;
+}
+
+bool isInBackground(const MwModel& model)
+{
+    return model.getAppState() == MwModel::APP_STATE_PAUSED || model.getAppState() == MwModel::APP_STATE_TERMINATED;
+}
+
+bool isComplete(const MwRecorder* recorder, const MwModel* model, const MwSoundSession* soundSession)
+{
+    if (recorder == nullptr)
+        MW_LOGE("recorder is nullptr");
+    else if (model == nullptr)
+        MW_LOGE("model is nullptr");
+    else if (soundSession == nullptr)
+        MW_LOGE("soundMgr is nullptr");
+    return recorder != nullptr && model != nullptr && soundSession != nullptr;
+}
+
+}
+
+bool MwAppController::_startRecording()
+{
+    if (!isComplete(_recorder.get(), _model, _soundSession.get()))
+        return false;
+    if (_model->getRecorderState() != MwRecorder::REC_STATE_READY) {
+        MW_LOGE("current state is [%d]!! can't start recording", _model->getRecorderState());
+        return false;
+    }
+    if (_recorder->isInRecording(AUDIO)) {
+        MW_LOGE("Other app is recording");
+        post("IDS_MW_TPOP_UNABLE_TO_START_NEW_RECORDING_OTHER_APP_ALREADY_RECORDING");
+        return false;
+    }
+    if (const std::string name = _model->getRenameString(); !name.empty()) {
+        MW_LOGI("Has been renamed, used rename string");
+        _model->setCurrentRecordingFileName(name);
+        _model->setRenameString("");
+    } else {
+        _model->updateNextRecordingFileName();
+    }
+    if (const int reason = _soundSession->setRecordSoundSession(); reason != MwSoundSession::SESSION_RESULT_NONE) {
+        MW_LOGE("set sound session failed : [%d]!!!", reason);
+        post(reason == MwSoundSession::SESSION_RESULT_BLOCKED_BY_CALL ? "IDS_MW_TPOP_CANT_RECORD_VOICE_DURING_CALLS"
+                                                                      : "IDS_MUSIC_TPOP_CANT_RECORD_VOICE");
+        return false;
+    }
+    if (!_setUpRecorder())
+        return false;
+    MwLoggingMgr::getInstance()->insert("RECO", "Normal Mode");
+    _model->setRecorderState(MwRecorder::REC_STATE_RECORDING);
+    _model->saveRecordingNotes();
+    _requestLock();
+    return true;
+}
+
+bool MwAppController::_setUpRecorder()
+{
+    _model->setElapsedTime(0);
+    _model->setLevel(MwModel::SILENCE);
+    if (!_recorder->createHandle(_model)) {
+        MW_LOGE("recorder create failed");
+        _soundSession->unsetRecordSoundSession();
+        return false;
+    }
+    MwRecorder::ErrorType error = MwRecorder::ERROR_UNKNOWN;
+    if (_recorder->start(error))
+        return true;
+    MW_LOGE("recorder start failed[%d]", error);
+    _postStartFailure(error);
+    _soundSession->unsetRecordSoundSession();
+    _recorder->destroyHandle();
+    return false;
+}
+
+void MwAppController::_postStartFailure(MwRecorder::ErrorType error)
+{
+    if (error == MwRecorder::ERROR_OUT_OF_STORAGE)
+        post("IDS_MW_POP_NOT_ENOUGH_MEMORY_DELETE_SOME_ITEMS");
+    else if (error == MwRecorder::ERROR_BLOCKED_BY_CALL)
+        post("IDS_MW_TPOP_CANT_RECORD_VOICE_DURING_CALLS");
+    else
+        post("IDS_MUSIC_TPOP_CANT_RECORD_VOICE");
+}
+
+bool MwAppController::_pauseRecording()
+{
+    if (!isComplete(_recorder.get(), _model, _soundSession.get()))
+        return false;
+    if (_model->getRecorderState() != MwRecorder::REC_STATE_RECORDING) {
+        MW_LOGE("current state is [%d]!! can't pause recording", _model->getRecorderState());
+        return false;
+    }
+    const bool paused = _recorder->pause();
+    if (paused)
+        _model->setRecorderState(MwRecorder::REC_STATE_PAUSED);
+    else
+        MW_LOGE("recorder pause failed");
+    _releaseLock();
+    return paused;
+}
+
+bool MwAppController::_resumeRecording()
+{
+    if (!isComplete(_recorder.get(), _model, _soundSession.get()))
+        return false;
+    if (_model->getRecorderState() != MwRecorder::REC_STATE_PAUSED) {
+        MW_LOGE("current state is [%d]!! can't resume recording", _model->getRecorderState());
+        return false;
+    }
+    if (!_recorder->resume()) {
+        MW_LOGE("recorder resume failed");
+        return false;
+    }
+    _model->setRecorderState(MwRecorder::REC_STATE_RECORDING);
+    _requestLock();
+    return true;
+}
+
+bool MwAppController::_cancelRecording(bool interrupted)
+{
+    if (!isComplete(_recorder.get(), _model, _soundSession.get()))
+        return false;
+    if (!isRecordingOrPaused(*_model)) {
+        MW_LOGE("current state is [%d]!! can't cancel recording", _model->getRecorderState());
+        return false;
+    }
+    bool cancelled = true;
+    if (interrupted) {
+        ecore_file_unlink(_model->getTemporaryFilePath().c_str());
+    } else if (!_recorder->cancel()) {
+        MW_LOGE("recorder cancel failed");
+        cancelled = false;
+    }
+    _destroyRecorderHandle();
+    if (cancelled)
+        _releaseTemporaryFile();
+    _soundSession->unsetRecordSoundSession();
+    _model->setRecorderState(MwRecorder::REC_STATE_READY);
+    _model->clearBookMark();
+    _model->windBackRecordingFileName();
+    _releaseLock();
+    return cancelled;
+}
+
+// Ends the claim on the temporary path once nothing of this recording is left there.
+void MwAppController::_releaseTemporaryFile()
+{
+    const std::string path = _model->getTemporaryFilePath();
+    MwRecordingNotes::remove(MwRecordingNotes::pathFor(path));
+    MW_CALL(recorder_release_temporary, path.c_str());
+}
+
+void MwAppController::_destroyRecorderHandle()
+{
+    _callSafetyMainThread(
+        [](void* data) {
+            auto* self = static_cast<MwAppController*>(data);
+            if (self->_recorder && !self->_recorder->destroyHandle())
+                MW_LOGE("recorder destroy handle failed");
+        },
+        this);
+}
+
+bool MwAppController::_stopRecording(bool interrupted)
+{
+    if (!isComplete(_recorder.get(), _model, _soundSession.get()))
+        return false;
+    if (!isRecordingOrPaused(*_model)) {
+        MW_LOGE("current state is [%d]!! can't stop recording", _model->getRecorderState());
+        return false;
+    }
+    bool stopped = true;
+    if (!interrupted) {
+        stopped = _recorder->stop();
+        if (!stopped)
+            MW_LOGE("recorder stop failed");
+        MwLoggingMgr::getInstance()->insert("SAVE");
+    }
+    _destroyRecorderHandle();
+    _soundSession->unsetRecordSoundSession();
+    _model->setRecorderState(MwRecorder::REC_STATE_READY);
+    if (stopped && !_saveRecordingFile()) {
+        MW_LOGE("_saveRecordingFile failed!!!");
+        stopped = false;
+    }
+    if (stopped && isInBackground(*_model)) {
+        MW_LOGI("display saved popup");
+        notification_status_message_post(
+            mwFormat("%s %s", _model->getCurrentRecordingFileName().c_str(), mwTranslate("IDS_MW_POP_SAVED").c_str())
+                .c_str());
+    }
+    _releaseLock();
+    return stopped;
+}
+
+bool MwAppController::_saveRecordingFile()
+{
+    if (_model == nullptr) {
+        MW_LOGE("_model is nullptr");
+        return false;
+    }
+    if (!_checkRecordedFileDir())
+        return false;
+    const std::string name = _model->getCurrentRecordingFileName();
+    std::string path = _model->getRecordingPath(name);
+    for (int counter = 1; !_moveTempRecordingFile(path.c_str()); ++counter) {
+        // Only a name that is taken (perhaps since a moment ago, by another instance) is worth another try.
+        if (ecore_file_exists(path.c_str()) == EINA_FALSE) {
+            MW_LOGE("move temp recording file failed!");
+            return false;
+        }
+        path = mwFormat("%s/%s_%03d%s", _model->getRecordingsDirectory().c_str(), name.c_str(), counter,
+            _model->getFileExtension());
+    }
+    _lastSavedPath = path;
+    std::string mediaId;
+    _insertRecordedFileToDB(path.c_str(), mediaId);
+    if (mediaId.empty()) {
+        // The notes wait beside the file: the next start catalogues it and gives it its bookmarks.
+        MW_LOGE("insert recorded file to DB failed!");
+        return false;
+    }
+    _insertBookmarkList(mediaId);
+    MwRecordingNotes::remove(MwRecordingNotes::pathForSaved(path));
+    return true;
+}
+
+bool MwAppController::_checkRecordedFileDir()
+{
+    if (_model == nullptr) {
+        MW_LOGE("_model is nullptr");
+        return false;
+    }
+    const std::string directory = _model->getRecordingsDirectory();
+    if (ecore_file_is_dir(directory.c_str()) != EINA_FALSE) {
+        MW_LOGI("recorded file directory exists!");
+        return true;
+    }
+    return MwFiles::makeDirectories(directory);
+}
+
+bool MwAppController::_moveTempRecordingFile(const char* destFilePath)
+{
+    if (destFilePath == nullptr) {
+        MW_LOGE("destFilePath is nullptr");
+        return false;
+    }
+    if (_model == nullptr) {
+        MW_LOGE("_model is nullptr");
+        return false;
+    }
+    const std::string temporary = _model->getTemporaryFilePath();
+    if (ecore_file_exists(destFilePath) != EINA_FALSE)
+        return false;
+    // The notes move first, as a copy: at no moment is there a recording without them.
+    const std::vector<MwBookmark> bookmarks = _model->getBookmarkList();
+    if (!bookmarks.empty())
+        MwRecordingNotes::save(
+            MwRecordingNotes::pathForSaved(destFilePath), {_model->getCurrentRecordingFileName(), bookmarks});
+    if (MwFiles::moveWithoutOverwriting(temporary, destFilePath) != MwFiles::Move::DONE) {
+        MwRecordingNotes::remove(MwRecordingNotes::pathForSaved(destFilePath));
+        return false;
+    }
+    _releaseTemporaryFile();
+    const std::unique_ptr<FILE, int (*)(FILE*)> file(std::fopen(destFilePath, "r"), &std::fclose);
+    if (!file) {
+        MW_LOGE("fopen failed : [%d]!!!", errno);
+        return false;
+    }
+    MW_LOGI("fsync start");
+    ::fsync(::fileno(file.get()));
+    MwFiles::flushDirectoryOf(destFilePath);
+    MwFiles::flushDirectoryOf(temporary);
+    MW_LOGI("fsync end");
+    return true;
+}
+
+void MwAppController::_insertRecordedFileToDB(const char* filePath, std::string& mediaId)
+{
+    if (filePath == nullptr) {
+        MW_LOGE("filePath is nullptr");
+        return;
+    }
+    MwHandle<media_info_h, media_info_destroy> media;
+    if (const int result = media_info_insert_to_db(filePath, media.out()); result != 0) {
+        MW_LOGE("media_info_insert_to_db failed! [%d]", result);
+        return;
+    }
+    char* id = nullptr;
+    if (const int result = media_info_get_media_id(media.get(), &id); result != 0)
+        MW_LOGE("media_info_get_media_id failed! [%d]", result);
+    mediaId = mwAdopt(id);
+}
+
+void MwAppController::_insertBookmarkList(const std::string& mediaId)
+{
+    if (_model == nullptr) {
+        MW_LOGE("_model is nullptr");
+        return;
+    }
+    if (!_model->saveBookMark(mediaId.c_str()))
+        MW_LOGE("_model->saveBookMark failed!");
+}
+
+void MwAppController::_recorderLimitReached(MwRecorder::LimitType type)
+{
+    if (type == MwRecorder::LIMIT_FREE_SPACE)
+        post("IDS_MW_POP_NOT_ENOUGH_MEMORY_DELETE_SOME_ITEMS");
+    _emitSignalAfterStopRecording(false);
+}
+
+void MwAppController::_emitSignalAfterStopRecording(bool interrupted)
+{
+    const auto stopped = [](Command command, Result result, void* userData) {
+        auto* self = static_cast<MwAppController*>(userData);
+        MW_LOGI("async Command[%d] result is [%d]", static_cast<int>(command), result);
+        if (result == FAIL) {
+            MW_LOGE("STOP_RECORDING failed");
+            return;
+        }
+        if (self->_model->getAppState() == MwModel::APP_STATE_RESUMED) {
+            if (command == STOP_RECORDING_INTERRUPTED && !self->_model->isRequestMode())
+                post("IDS_MW_TPOP_RECORDING_INTERRUPTED_WHAT_WAS_RECORDED_IS_SAVED");
+            self->openRecordings();
+        } else if (self->_model->getAppState() == MwModel::APP_STATE_PAUSED) {
+            MW_LOGI("recording stop success");
+        } else {
+            MW_LOGW("app state is [%d]. need to scenario check.", self->_model->getAppState());
+        }
+    };
+    dispatchCommandAsync(interrupted ? STOP_RECORDING_INTERRUPTED : STOP_RECORDING, stopped, this);
+}
+
+void MwAppController::_pauseInRequestMode()
+{
+    {
+        const std::lock_guard lock(_commandMutex);
+        if (isRecordingOrPaused(*_model)) {
+            _ungrabMediaKey();
+            if (!_stopRecording(false))
+                MW_LOGE("_stopRecording failed");
+        }
+    }
+    if (_model->getRequestHandle() != nullptr && !_replyWithRecording())
+        return;
+    ui_app_exit();
+}
+
+bool MwAppController::_replyWithRecording()
+{
+    MwHandle<app_control_h, app_control_destroy> reply;
+    if (const int result = app_control_create(reply.out()); result != 0) {
+        MW_LOGE("app_control_create failed:[%d]", result);
+        return false;
+    }
+    const std::string name = _model->getCurrentRecordingFileName();
+    if (name.empty()) {
+        MW_CALL(
+            app_control_reply_to_launch_request, reply.get(), _model->getRequestHandle(), APP_CONTROL_RESULT_FAILED);
+    } else {
+        // The name may have been taken, then the file got a counter; what was really written counts.
+        const std::string path = _lastSavedPath.empty() ? _model->getRecordingPath(name) : _lastSavedPath;
+        MW_CALL(app_control_add_extra_data, reply.get(), APP_CONTROL_DATA_SELECTED, path.c_str());
+        MW_CALL(
+            app_control_reply_to_launch_request, reply.get(), _model->getRequestHandle(), APP_CONTROL_RESULT_SUCCEEDED);
+    }
+    _model->setRequestHandle(nullptr);
+    return true;
+}

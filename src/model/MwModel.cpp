@@ -1,0 +1,155 @@
+#include "MwModel.h"
+
+#include <notification.h>
+#include <preference.h>
+#include <vconf.h>
+
+#include <algorithm>
+
+#include "MwLog.h"
+#include "MwRecordingNotes.h"
+#include "MwStorageRoots.h"
+#include "MwText.h"
+
+namespace {
+
+constexpr auto STORAGE_PREFERENCE_KEY = "preference/com.tovanic.mewlo-lite/storage";
+constexpr auto RECORDING_STATE_KEY = "MainRecordingState";
+constexpr int CARD_MOUNTED = 1;
+constexpr size_t MAX_MESSAGE_BYTES = 1024;
+
+void postTooManyBookmarks()
+{
+    const std::string format = mwTranslate("IDS_MW_TPOP_CANT_ADD_MORE_THAN_PD_BOOKMARKS");
+    std::string message = format;
+    // The text comes from a translation: only its number is replaced, it is never used as a format.
+    if (const size_t place = message.find("%d"); place != std::string::npos)
+        message.replace(place, 2, std::to_string(MwModel::MAX_BOOKMARKS));
+    message.resize(std::min(message.size(), MAX_MESSAGE_BYTES - 1));
+    notification_status_message_post(message.c_str());
+}
+
+}
+
+void MwModel::setRecorderState(int state)
+{
+    _recorderState = state;
+    if (!_requestMode)
+        MW_CALL(preference_set_int, RECORDING_STATE_KEY, state);
+}
+
+MwStorageType MwModel::getStorageType() const
+{
+    int card = 0;
+    if (vconf_get_int(VCONFKEY_SYSMAN_MMC_STATUS, &card) != 0) {
+        MW_LOGE("vconf_get_int fail");
+        return MW_STORAGE_DEVICE;
+    }
+    return card == CARD_MOUNTED ? getStorageChoice() : MW_STORAGE_DEVICE;
+}
+
+MwStorageType MwModel::getStorageChoice() const
+{
+    int type = MW_STORAGE_DEVICE;
+    if (const int result = preference_get_int(STORAGE_PREFERENCE_KEY, &type); result != 0) {
+        MW_LOGW("preference_get_int failed : [%d]!!!", result);
+        return MW_STORAGE_DEVICE;
+    }
+    return type == MW_STORAGE_DEVICE ? MW_STORAGE_DEVICE : MW_STORAGE_CARD;
+}
+
+void MwModel::setStorageType(MwStorageType type)
+{
+    if (const int result = preference_set_int(STORAGE_PREFERENCE_KEY, type); result != 0)
+        MW_LOGW("preference_set_int failed : [%d]!!!", result);
+}
+
+std::string MwModel::getStorageRoot() const
+{
+    return getStorageType() == MW_STORAGE_DEVICE ? mwDeviceRoot() : mwCardRoot();
+}
+
+std::string MwModel::getTemporaryFilePath() const
+{
+    return mwFormat("%s/%s", getStorageRoot().c_str(), TEMP_FILE_NAME);
+}
+
+std::string MwModel::getRecordingsDirectory() const
+{
+    return mwFormat("%s/%s", getStorageRoot().c_str(), RECORDINGS_DIRECTORY);
+}
+
+const char* MwModel::getFileExtension() const { return _fileFormat == FORMAT_MP4 ? ".m4a" : ".amr"; }
+
+std::string MwModel::getRecordingPath(const std::string& name) const
+{
+    return mwFormat("%s/%s/%s%s", getStorageRoot().c_str(), RECORDINGS_DIRECTORY, name.c_str(), getFileExtension());
+}
+
+bool MwModel::addBookMark(unsigned int& markedTime)
+{
+    const auto second = static_cast<unsigned int>(_elapsedTime / 1000);
+    {
+        const std::lock_guard lock(_mutex);
+        if (_bookmarks.size() >= MAX_BOOKMARKS) {
+            MW_LOGE("Max book mark count reached!!");
+            postTooManyBookmarks();
+            return false;
+        }
+        if (std::any_of(
+                _bookmarks.begin(), _bookmarks.end(), [&](const MwBookmark& b) { return b.markedTime == second; })) {
+            MW_LOGE("book mark position is already existing!!");
+            notification_status_message_post(mwTranslate("IDS_MW_TPOP_ALREADY_ADDED_TO_BOOKMARKS").c_str());
+            return false;
+        }
+        const int index = static_cast<int>(_bookmarks.size());
+        _bookmarks.push_back(
+            {index, second, mwFormat("%s%03d", mwTranslate("IDS_MW_BODY_BOOKMARK").c_str(), index + 1)});
+    }
+    saveRecordingNotes();
+    markedTime = second;
+    return true;
+}
+
+void MwModel::clearBookMark()
+{
+    const std::lock_guard lock(_mutex);
+    _bookmarks.clear();
+}
+
+bool MwModel::saveBookMark(const char* mediaId)
+{
+    const std::vector<MwBookmark> bookmarks = getBookmarkList();
+    if (bookmarks.empty()) {
+        MW_LOGI("book mark list is empty!!");
+        return true;
+    }
+    for (const MwBookmark& bookmark : bookmarks) {
+        const int result = media_bookmark_insert_to_db(mediaId, bookmark.markedTime, bookmark.name.c_str());
+        if (result != 0)
+            MW_LOGE("media_bookmark_insert_to_db failed, [0x%X]", static_cast<unsigned int>(result));
+    }
+    clearBookMark();
+    return true;
+}
+
+std::vector<MwBookmark> MwModel::getBookmarkList() const
+{
+    const std::lock_guard lock(_mutex);
+    return _bookmarks;
+}
+
+bool MwModel::saveRecordingNotes() const
+{
+    return MwRecordingNotes::save(
+        MwRecordingNotes::pathFor(getTemporaryFilePath()), {getCurrentRecordingFileName(), getBookmarkList()});
+}
+
+void MwModel::setRequestHandle(app_control_h request)
+{
+    _request.close();
+    if (request == nullptr)
+        return;
+    if (const int result = app_control_clone(_request.out(), request); result != 0)
+        MW_LOGE("app_control_clone failed:[%d]", result);
+}
