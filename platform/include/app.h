@@ -42,6 +42,11 @@ void ui_app_set_window_visible(bool visible);
 void ui_app_set_window(void* window);
 void* ui_app_get_window(void);
 
+// The same without the toolkit and without a window: for companions. They resume at once and never pause.
+int service_app_main(int argc, char** argv, const ui_app_lifecycle_s* lifecycle, void* user_data);
+
+// For companions, before anything else: the id of this program, com.tovanic.mewlo-lite when not set.
+int app_set_id(const char* id);
 // Strings are newly allocated (free). Paths end in a slash; null when there is none.
 int app_get_id(char** id);
 char* app_get_resource_path(void);

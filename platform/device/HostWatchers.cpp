@@ -1,0 +1,9 @@
+#include "device/HostWatchers.h"
+
+namespace platform {
+
+void startHostWatchers() { }
+
+void stopHostWatchers() { }
+
+}

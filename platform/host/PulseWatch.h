@@ -1,0 +1,86 @@
+#pragma once
+
+#include <chrono>
+#include <condition_variable>
+#include <functional>
+#include <map>
+#include <memory>
+#include <mutex>
+#include <string>
+
+struct pa_threaded_mainloop;
+struct pa_context;
+
+namespace host {
+
+// What the sound server tells about the world. Streams of this process are left out.
+struct PulseSnapshot {
+    bool isConnected = false;
+    bool hasCall = false; // an active stream of the role phone
+    bool hasAlarm = false;
+    bool hasNotification = false; // roles event and notification
+    bool othersRecord = false; // an application captures sound now
+    bool isHeadsetOut = false; // the default output is a wired headset or headphone
+    bool isHeadsetIn = false;
+    bool isHeadsetPlugged = false;
+    std::string defaultSink;
+
+    bool operator==(const PulseSnapshot&) const = default;
+};
+
+// Watches the sound server in a thread of its own. Connects when first asked, and again after the server went; without
+// one everything answers quickly with "nothing". Any thread, but not from inside a listener.
+class PulseWatch {
+public:
+    using Listener = std::function<void(const PulseSnapshot& before, const PulseSnapshot& now)>;
+
+    static PulseWatch& instance();
+    PulseWatch(const PulseWatch&) = delete;
+    PulseWatch& operator=(const PulseWatch&) = delete;
+
+    // The last known state, at once.
+    PulseSnapshot snapshot();
+    // Asks the server again; waits for the answer at most that long.
+    PulseSnapshot refresh(std::chrono::milliseconds limit = std::chrono::milliseconds(200));
+    // The listener runs on the watch's thread and must be quick. Connects, and reconnects by itself from now on.
+    int addListener(Listener listener);
+    // No call is running any more when this returns.
+    void removeListener(int id);
+    // Told at once and on every change whether a wired headset or headphone is plugged in; on the watch's thread.
+    void setEarjackHook(std::function<void(bool inserted)> hook);
+
+private:
+    struct Query;
+    PulseWatch();
+    ~PulseWatch();
+    void _connect(); // with the loop locked
+    void _disconnect();
+    void _query();
+    void _finish();
+    void _publish(const PulseSnapshot& now);
+    void _scheduleReconnect();
+    bool _start();
+    bool _isConnectionOld() const;
+
+    std::mutex _startMutex;
+    pa_threaded_mainloop* _loop = nullptr;
+    pa_context* _context = nullptr; // guarded by the loop's lock, as the next five
+    std::string _server;
+    bool _isReady = false;
+    std::unique_ptr<Query> _current; // the look at the server that is under way
+    bool _isDirty = false;
+    bool _isReconnectDue = false;
+    std::chrono::steady_clock::time_point _lastAttempt{};
+
+    std::mutex _stateMutex; // guards the next three
+    std::condition_variable _answered;
+    PulseSnapshot _now;
+    unsigned _answers = 0;
+    unsigned _asked = 0; // guarded by the loop's lock
+
+    std::recursive_mutex _listenerMutex; // held during calls
+    std::map<int, Listener> _listeners;
+    int _lastId = 0;
+};
+
+}

@@ -1,0 +1,64 @@
+#include "launch/Toolkit.h"
+
+#include <Efreet.h>
+#include <Elementary.h>
+
+#include <cstdlib>
+
+namespace platform {
+
+namespace {
+
+    Evas_Object*& window()
+    {
+        static Evas_Object* current = nullptr;
+        return current;
+    }
+
+    void windowGoneCb(void*, Evas*, Evas_Object*, void*) { window() = nullptr; }
+
+    void setDefault(const char* name, const char* value) { ::setenv(name, value, 0); }
+
+}
+
+void prepareToolkitEnvironment()
+{
+    setDefault("ECORE_NO_SYSTEM_MODULES", "1"); // they speak to the system bus on their own, noisily
+    if (std::getenv("DISPLAY") != nullptr)
+        setDefault("ELM_DISPLAY", "x11");
+}
+
+bool startToolkit(int argc, char** argv)
+{
+    efreet_cache_disable(); // starts a daemon for the menu index otherwise
+    return elm_init(argc, argv) > 0;
+}
+
+void stopToolkit()
+{
+    setMainWindow(nullptr);
+    elm_shutdown();
+}
+
+void setMainWindow(void* next)
+{
+    if (window() != nullptr)
+        evas_object_event_callback_del(window(), EVAS_CALLBACK_DEL, windowGoneCb);
+    window() = static_cast<Evas_Object*>(next);
+    if (window() != nullptr)
+        evas_object_event_callback_add(window(), EVAS_CALLBACK_DEL, windowGoneCb, nullptr);
+}
+
+void* mainWindow() { return window(); }
+
+void raiseMainWindow()
+{
+    if (window() == nullptr)
+        return;
+    elm_win_iconified_set(window(), EINA_FALSE);
+    evas_object_show(window());
+    elm_win_raise(window());
+    elm_win_activate(window());
+}
+
+}
