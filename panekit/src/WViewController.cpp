@@ -45,8 +45,11 @@ void WViewController::destroy()
 // The view went first, with its parent or its window: the object follows.
 void WViewController::_end()
 {
-    if (std::exchange(_destroying, true))
+    if (std::exchange(_destroying, true)) {
+        // onDestroy of a view inside another one's part may delete it itself.
+        _view = nullptr;
         return;
+    }
     onDestroy();
     _view = nullptr;
     delete this;

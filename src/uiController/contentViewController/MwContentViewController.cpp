@@ -1,0 +1,83 @@
+#include "MwContentViewController.h"
+
+#include <utility>
+
+#include <Elementary.h>
+
+#include <eext_event.h>
+
+#include "MwLog.h"
+
+namespace {
+
+// The item below the top one of a naviframe, null when there is none.
+Elm_Object_Item* secondItem(Evas_Object* naviframe)
+{
+    Eina_List* items = elm_naviframe_items_get(naviframe);
+    const unsigned int count = eina_list_count(items);
+    auto* second = count < 2 ? nullptr : static_cast<Elm_Object_Item*>(eina_list_nth(items, count - 2));
+    eina_list_free(items);
+    return second;
+}
+
+}
+
+MwContentViewController::MwContentViewController(MwModel* model, MwAppController* appController)
+    : _model(model)
+    , _appController(appController)
+{
+}
+
+MwContentViewController::~MwContentViewController() = default;
+
+const char* MwContentViewController::getClassName() const { return "MwContentViewController"; }
+
+void MwContentViewController::setBackKeyHandler(std::function<void()> handler)
+{
+    const bool wasRegistered = static_cast<bool>(_backKeyHandler);
+    _backKeyHandler = std::move(handler);
+    if (_backKeyHandler && !wasRegistered)
+        eext_object_event_callback_add(getEvasObject(), EEXT_CALLBACK_BACK, _backKeyCb, this);
+}
+
+void MwContentViewController::_backKeyCb(void* data, Evas_Object*, void*)
+{
+    const auto* self = static_cast<MwContentViewController*>(data);
+    if (!self) {
+        MW_LOGE("self is nullptr");
+        return;
+    }
+    // The handler may end the screen and itself with it.
+    if (const auto handler = self->_backKeyHandler; handler)
+        handler();
+}
+
+Evas_Object* MwContentViewController::onPushToNaviframe(Evas_Object* naviframe)
+{
+    if (!naviframe) {
+        MW_LOGE("naviFrame is nullptr");
+        return nullptr;
+    }
+    Elm_Object_Item* top = elm_naviframe_top_item_get(naviframe);
+    const char* title = getTitle().c_str();
+    Elm_Object_Item* item = top
+        ? elm_naviframe_item_insert_after(naviframe, top, title, nullptr, nullptr, getEvasObject(), nullptr)
+        : elm_naviframe_item_push(naviframe, title, nullptr, nullptr, getEvasObject(), nullptr);
+    if (!item)
+        MW_LOGE("Failed to insert naviframe item");
+    return item;
+}
+
+bool MwContentViewController::onPop()
+{
+    Evas_Object* naviframe = elm_object_item_widget_get(getNaviItem());
+    if (Elm_Object_Item* below = secondItem(naviframe); below) {
+        Evas_Object* view = elm_object_item_part_content_get(below, "elm.swallow.content");
+        if (auto* screen = static_cast<MwContentViewController*>(fromView(view)); screen)
+            screen->onTop();
+    }
+    if (elm_naviframe_bottom_item_get(naviframe) == getNaviItem())
+        return true;
+    destroy();
+    return false;
+}

@@ -1,0 +1,242 @@
+#include "MwRecorderContentViewController.h"
+
+#include <utility>
+
+#include <Elementary.h>
+
+#include <app.h>
+#include <notification.h>
+#include <panekit/WPopupController.h>
+
+#include "MwLog.h"
+#include "MwModel.h"
+#include "MwRecorder.h"
+#include "MwRenamePopupController.h"
+#include "MwResourceMgr.h"
+#include "MwSystemMgr.h"
+#include "MwText.h"
+
+using panekit::WTimer;
+
+namespace {
+
+constexpr auto LAYOUT_FILE = "edje/MwRecorderContentView.edj";
+constexpr auto LAYOUT_GROUP = "recorder_content_view";
+
+void post(const char* id) { notification_status_message_post(mwTranslate(id).c_str()); }
+
+template <typename Signal>
+void forget(Signal& signal, unsigned int& listener)
+{
+    if (const unsigned int id = std::exchange(listener, 0); id != 0)
+        signal.removeListener(id);
+}
+
+}
+
+MwRecorderContentViewController::MwRecorderContentViewController(MwModel* model, MwAppController* appController)
+    : MwContentViewController(model, appController)
+{
+}
+
+MwRecorderContentViewController::~MwRecorderContentViewController() = default;
+
+Evas_Object* MwRecorderContentViewController::onCreateView(Evas_Object* parent, void*)
+{
+    std::string path;
+    if (!MwResourceMgr::getInstance()->getEdjPath(LAYOUT_FILE, path) || path.empty()) {
+        MW_LOGE("getEdjPath fail");
+        return nullptr;
+    }
+    Evas_Object* layout = elm_layout_add(parent);
+    elm_layout_file_set(layout, path.c_str(), LAYOUT_GROUP);
+    evas_object_size_hint_weight_set(layout, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
+    evas_object_show(layout);
+    return layout;
+}
+
+bool MwRecorderContentViewController::_isComplete() const
+{
+    if (!getEvasObject()) {
+        MW_LOGE("getEvasObject() is nullptr");
+        return false;
+    }
+    if (!getModel()) {
+        MW_LOGE("getModel() is nullptr");
+        return false;
+    }
+    if (!getAppController()) {
+        MW_LOGE("getAppController() is nullptr");
+        return false;
+    }
+    return true;
+}
+
+void MwRecorderContentViewController::onCreated()
+{
+    if (!_isComplete())
+        return;
+    _listen();
+    _getEstimatedRecordingMaxTime();
+    _updateContentView();
+}
+
+void MwRecorderContentViewController::_listen()
+{
+    MwSignalMgr* signals = MwSignalMgr::getInstance();
+    _lifeCycleListener = signals->getLifeCycleSignal().addListener(
+        [this](MwSignalMgr::LifeCycle lifeCycle) { _lifeCycleChanged(lifeCycle); });
+    _systemInfoListener = signals->getSystemInfoSignal().addListener(
+        [this](MwSignalMgr::SystemInfo info) { _systemInfoChanged(info); });
+    _recorderUpdatedListener = getAppController()->getRecorderUpdatedSignal().addListener([this] {
+        MW_LOGW("recorder update signal");
+        _updateContentView();
+    });
+    setBackKeyHandler([this] { _backKeyClicked(); });
+}
+
+// On TERMINATE at the latest: afterwards the controller and the signals are gone, while the screen waits for its
+// window.
+void MwRecorderContentViewController::_stopListening()
+{
+    if (_recorderUpdatedListener != 0)
+        forget(getAppController()->getRecorderUpdatedSignal(), _recorderUpdatedListener);
+    MwSignalMgr* signals = MwSignalMgr::existing();
+    if (!signals)
+        return;
+    forget(signals->getSystemInfoSignal(), _systemInfoListener);
+    forget(signals->getLifeCycleSignal(), _lifeCycleListener);
+}
+
+void MwRecorderContentViewController::onDestroy()
+{
+    _stopListening();
+    for (const WTimer::Weak& timer : {_blinkTimer, _statusUpdateTimer, _bookMarkAddTimer, _nextNameIdler})
+        WTimer::destroy(timer);
+    _renamePopup.reset();
+    for (auto* popup : {std::exchange(_saveToPopup, nullptr), std::exchange(_discardPopup, nullptr)}) {
+        if (!popup)
+            continue;
+        popup->setOnDestroyed(nullptr);
+        popup->destroy();
+    }
+}
+
+void MwRecorderContentViewController::onPushed(Evas_Object* item)
+{
+    elm_naviframe_item_title_enabled_set(item, EINA_FALSE, EINA_FALSE);
+    setMoreButton([this] { _moreKeyClicked(); });
+}
+
+void MwRecorderContentViewController::onTop()
+{
+    if (!_isComplete())
+        return;
+    _updateContentView();
+    if (getModel()->getRecorderState() == MwRecorder::REC_STATE_RECORDING
+        && MwSystemMgr::getInstance()->isEarjackInserted())
+        post("IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
+}
+
+bool MwRecorderContentViewController::_isRecordingOrPaused() const
+{
+    const int state = getModel()->getRecorderState();
+    return state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED;
+}
+
+void MwRecorderContentViewController::_openRecordings() { getAppController()->openRecordings(); }
+
+void MwRecorderContentViewController::_lifeCycleChanged(MwSignalMgr::LifeCycle lifeCycle)
+{
+    MW_LOGW("life cycle signal: [%d]", lifeCycle);
+    switch (lifeCycle) {
+    case MwSignalMgr::RESUME:
+        return _appResume();
+    case MwSignalMgr::PAUSE:
+        return _appPause();
+    case MwSignalMgr::TERMINATE:
+        return _appTerminate();
+    }
+    MW_LOGE("Invalid life cycle signal!");
+}
+
+void MwRecorderContentViewController::_appResume()
+{
+    _createUpdateNextRecordingFileNameTimer();
+    // The first resume belongs to the start, which has just drawn everything.
+    if (std::exchange(_skipNextResume, false))
+        return;
+    if (!isTop())
+        return;
+    _getEstimatedRecordingMaxTime();
+    _updateContentView();
+}
+
+void MwRecorderContentViewController::_appPause()
+{
+    _updateRecordingEffect(false);
+    _updateBlinking(false);
+    _destroyRecordingStatusUpdateTimer();
+    WTimer::destroy(_nextNameIdler);
+}
+
+void MwRecorderContentViewController::_appTerminate()
+{
+    MW_LOGW("BEGIN");
+    _stopListening();
+    MW_LOGW("END");
+}
+
+void MwRecorderContentViewController::_systemInfoChanged(MwSignalMgr::SystemInfo info)
+{
+    MW_LOGW("system info signal: [%d]", info);
+    if (!_isComplete())
+        return;
+    switch (info) {
+    case MwSignalMgr::MMC_REMOVED:
+        return _mmcRemoved();
+    case MwSignalMgr::MEDIA_DB_UPDATED:
+        return _mediaDBUpdated();
+    case MwSignalMgr::POWER_OFF:
+    case MwSignalMgr::UPS_MODE_CHANGED:
+        return ui_app_exit();
+    case MwSignalMgr::EARJACK_INSERTED:
+        return _earjackInserted();
+    case MwSignalMgr::MINI_CONTROLLER_RECORDING_SAVED:
+        return _openRecordings();
+    case MwSignalMgr::LOCKSCREEN_CHANGED:
+    case MwSignalMgr::TIME_ZONE_CHANGED:
+    case MwSignalMgr::REGION_FORMAT_CHANGED:
+    case MwSignalMgr::EARJACK_REMOVED:
+    case MwSignalMgr::POWER_STATE_CHANGED:
+    case MwSignalMgr::THEME_CHANGED:
+    case MwSignalMgr::CALL_REJECT_CHANGED:
+        return;
+    }
+}
+
+void MwRecorderContentViewController::_mmcRemoved()
+{
+    if (getModel()->getStorageType() == MW_STORAGE_CARD
+        && getModel()->getRecorderState() == MwRecorder::REC_STATE_RECORDING
+        && !getAppController()->dispatchCommand(MwAppController::CANCEL_RECORDING))
+        MW_LOGE("recording cancel failed");
+    _destroySaveToPopup();
+}
+
+void MwRecorderContentViewController::_mediaDBUpdated()
+{
+    if (!_isRecordingOrPaused())
+        destroyAttachedPopup();
+    if (getModel()->getAppState() == MwModel::APP_STATE_RESUMED)
+        _createUpdateNextRecordingFileNameTimer();
+}
+
+void MwRecorderContentViewController::_earjackInserted()
+{
+    if (!isTop() || getModel()->getAppState() != MwModel::APP_STATE_RESUMED)
+        return;
+    post(getModel()->getRecorderState() == MwRecorder::REC_STATE_NONE
+            ? "IDS_MW_TPOP_EXTERNAL_MICROPHONE_WILL_BE_USED_TO_RECORD"
+            : "IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
+}

@@ -1,0 +1,187 @@
+// The recorder screen: its popups.
+#include "MwRecorderContentViewController.h"
+
+#include <utility>
+
+#include <Elementary.h>
+
+#include <app.h>
+#include <app_control.h>
+#include <notification.h>
+#include <panekit/WPopupController.h>
+
+#include "MwHandle.h"
+#include "MwLog.h"
+#include "MwModel.h"
+#include "MwRecorder.h"
+#include "MwRenamePopupController.h"
+#include "MwSaveToListItem.h"
+#include "MwSystemMgr.h"
+#include "MwText.h"
+
+using panekit::WPopupController;
+
+namespace {
+
+constexpr auto STORAGE_SETTINGS = "com.tovanic.setting.storage";
+
+void post(const char* id) { notification_status_message_post(mwTranslate(id).c_str()); }
+
+void closePopup(WPopupController* popup) { popup->destroy(); }
+
+}
+
+void MwRecorderContentViewController::_renameRecordingFileName()
+{
+    std::string text = getModel()->getRenameString();
+    if (text.empty())
+        text = getModel()->getDefaultRecordingFileName();
+    if (text.empty()) {
+        MW_LOGE("editString is nullptr!!!");
+        return;
+    }
+    _renamePopup = std::make_unique<MwRenamePopupController>(text.c_str());
+    _renamePopup->setResponseCb(
+        [this](void*, const char* name, int response) { _renameResponseCb(name, response); }, this);
+    if (!_renamePopup->create(getWindow(), nullptr))
+        _renamePopup.reset();
+}
+
+void MwRecorderContentViewController::_renameResponseCb(const char* text, int response)
+{
+    if (response == MwRenamePopupController::RESPONSE_RENAME && text) {
+        const std::string name = text;
+        if (getModel()->checkRecordFileNameExist(name)) {
+            post("IDS_MW_POP_RENAMEALREADYUSED");
+            return;
+        }
+        getModel()->setRenameString(name);
+        _updateFileName(name);
+    }
+    _destroyRenamePopup();
+}
+
+// Gone after the callback that is still running in it.
+void MwRecorderContentViewController::_destroyRenamePopup()
+{
+    const auto popup = std::exchange(_renamePopup, nullptr);
+    if (popup)
+        popup->destory();
+}
+
+void MwRecorderContentViewController::_createSaveToPopup()
+{
+    if (_saveToPopup)
+        return;
+    _saveToPopup = new WPopupController();
+    _saveToPopup->setTitle("IDS_MW_HEADER_SAVE_TO");
+    _saveToPopup->setStyle("theme_bg");
+    _saveToPopup->setContent([this](Evas_Object* popup) { return _createSaveToList(popup); });
+    _saveToPopup->setOnBack(closePopup);
+    _saveToPopup->setOnDestroyed([this] { _saveToPopup = nullptr; });
+    _saveToPopup->create(getWindow());
+}
+
+Evas_Object* MwRecorderContentViewController::_createSaveToList(Evas_Object* popup)
+{
+    Evas_Object* genlist = elm_genlist_add(popup);
+    elm_genlist_homogeneous_set(genlist, EINA_TRUE);
+    elm_genlist_mode_set(genlist, ELM_LIST_COMPRESS);
+    elm_scroller_content_min_limit(genlist, EINA_FALSE, EINA_TRUE);
+    evas_object_size_hint_weight_set(genlist, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
+    evas_object_size_hint_align_set(genlist, EVAS_HINT_FILL, EVAS_HINT_FILL);
+    // The group itself, hidden: the radios of the rows come and go with scrolling.
+    Evas_Object* radioMain = elm_radio_add(genlist);
+    elm_radio_state_value_set(radioMain, -1);
+    evas_object_data_set(genlist, "radio", radioMain);
+    const auto chosen = [this](int storage) { _storageChosen(storage); };
+    (new MwSaveToListItem(getModel(), MW_STORAGE_DEVICE, chosen))->append(genlist);
+    if (MwSystemMgr::getInstance()->isMMCMounted())
+        (new MwSaveToListItem(getModel(), MW_STORAGE_CARD, chosen))->append(genlist);
+    else
+        MW_LOGE("MMC not mounted");
+    evas_object_show(genlist);
+    return genlist;
+}
+
+void MwRecorderContentViewController::_storageChosen(int storage)
+{
+    if (storage == MW_STORAGE_DEVICE || storage == MW_STORAGE_CARD)
+        getModel()->setStorageType(static_cast<MwStorageType>(storage));
+    else
+        MW_LOGE("invalid index!! [%d]", storage);
+    _destroySaveToPopup();
+}
+
+void MwRecorderContentViewController::_destroySaveToPopup()
+{
+    if (auto* popup = std::exchange(_saveToPopup, nullptr); popup)
+        popup->destroy();
+}
+
+void MwRecorderContentViewController::_createDiscardPopup()
+{
+    if (_discardPopup)
+        return;
+    _discardPopup = new WPopupController();
+    _discardPopup->setTitle("IDS_MW_HEADER_DISCARD_RECORDING_ABB3");
+    _discardPopup->setContent("IDS_MW_POP_RECORDING_WILL_BE_STOPPED_AND_THE_FILE_WILL_BE_DISCARDED");
+    _discardPopup->addButton("IDS_MW_BUTTON_CANCEL", closePopup);
+    _discardPopup->addButton("IDS_MW_BUTTON_DISCARD_ABB3", [this](WPopupController*) { _discardRecording(); });
+    _discardPopup->setOnDestroyed([this] { _discardPopup = nullptr; });
+    _discardPopup->create(getWindow());
+}
+
+void MwRecorderContentViewController::_discardRecording()
+{
+    if (!_isComplete())
+        return;
+    if (!getAppController()->dispatchCommand(MwAppController::CANCEL_RECORDING))
+        MW_LOGE("Record cancel failed!");
+    getModel()->clearBookMark();
+    // Closes the popup when the recorder is ready again.
+    _updateContentView();
+    post("IDS_MW_TPOP_RECORDING_DISCARDED_M_SOUND");
+}
+
+void MwRecorderContentViewController::_createStorageFullPopup()
+{
+    auto* popup = new WPopupController();
+    popup->setTitle("IDS_IDLE_HEADER_NOT_ENOUGH_SPACE_ABB2");
+    popup->setContent(getModel()->getStorageType() == MW_STORAGE_DEVICE
+            ? "IDS_IDLE_POP_YOUR_DEVICE_STORAGE_DOESNT_HAVE_ENOUGH_SPACE_MSG"
+            : "IDS_IDLE_POP_YOUR_SD_CARD_DOESNT_HAVE_ENOUGH_SPACE_MSG");
+    popup->addButton("IDS_MW_BUTTON_CANCEL", closePopup);
+    popup->addButton("IDS_MW_OPT_SETTINGS", [](WPopupController* self) {
+        _openStorageSettings();
+        closePopup(self);
+    });
+    popup->create(getWindow());
+}
+
+void MwRecorderContentViewController::_openStorageSettings()
+{
+    MwHandle<app_control_h, app_control_destroy> request;
+    int error = app_control_create(request.out());
+    if (error != APP_CONTROL_ERROR_NONE) {
+        MW_LOGE("app_control_create failed:[%d]", error);
+        return;
+    }
+    app_control_set_app_id(request.get(), STORAGE_SETTINGS);
+    app_control_add_extra_data(request.get(), "viewtype", "storage_detail");
+    app_control_set_launch_mode(request.get(), APP_CONTROL_LAUNCH_MODE_GROUP);
+    error = app_control_send_launch_request(request.get(), nullptr, nullptr);
+    if (error != APP_CONTROL_ERROR_NONE)
+        MW_LOGE("app_control_send_launch_request failed:[%d]", error);
+}
+
+void MwRecorderContentViewController::_createRecordingFailedPopup()
+{
+    auto* popup = new WPopupController();
+    popup->setContent("IDS_MW_POP_RECORDING_FAILED_M_VOICE");
+    popup->addButton("IDS_MW_BUTTON_OK", [](WPopupController*) {
+        MW_LOGW("terminate app...");
+        ui_app_exit();
+    });
+    popup->create(getWindow());
+}
