@@ -13,64 +13,68 @@ namespace host {
 
 namespace {
 
-constexpr auto RETRY = std::chrono::seconds(3);
-constexpr auto LEAST_RETRY = std::chrono::milliseconds(500);
+    constexpr auto RETRY = std::chrono::seconds(3);
+    constexpr auto LEAST_RETRY = std::chrono::milliseconds(500);
 
-class LoopLock {
-public:
-    explicit LoopLock(pa_threaded_mainloop* loop)
-        : _loop(loop)
+    class LoopLock {
+    public:
+        explicit LoopLock(pa_threaded_mainloop* loop)
+            : _loop(loop)
+        {
+            pa_threaded_mainloop_lock(_loop);
+        }
+        ~LoopLock() { pa_threaded_mainloop_unlock(_loop); }
+        LoopLock(const LoopLock&) = delete;
+        LoopLock& operator=(const LoopLock&) = delete;
+
+    private:
+        pa_threaded_mainloop* _loop;
+    };
+
+    std::string property(const pa_proplist* properties, const char* key)
     {
-        pa_threaded_mainloop_lock(_loop);
+        const char* value = pa_proplist_gets(properties, key);
+        return value != nullptr ? value : "";
     }
-    ~LoopLock() { pa_threaded_mainloop_unlock(_loop); }
-    LoopLock(const LoopLock&) = delete;
-    LoopLock& operator=(const LoopLock&) = delete;
 
-private:
-    pa_threaded_mainloop* _loop;
-};
+    bool isOurs(const pa_proplist* properties)
+    {
+        return property(properties, PA_PROP_APPLICATION_PROCESS_ID) == std::to_string(getpid());
+    }
 
-std::string property(const pa_proplist* properties, const char* key)
-{
-    const char* value = pa_proplist_gets(properties, key);
-    return value != nullptr ? value : "";
-}
+    std::string currentServer()
+    {
+        const char* server = getenv("PULSE_SERVER");
+        return server != nullptr ? server : "";
+    }
 
-bool isOurs(const pa_proplist* properties)
-{
-    return property(properties, PA_PROP_APPLICATION_PROCESS_ID) == std::to_string(getpid());
-}
+    bool isHeadsetPort(uint32_t type)
+    {
+        return type == PA_DEVICE_PORT_TYPE_HEADPHONES || type == PA_DEVICE_PORT_TYPE_HEADSET;
+    }
 
-std::string currentServer()
-{
-    const char* server = getenv("PULSE_SERVER");
-    return server != nullptr ? server : "";
-}
+    bool isWiredHeadset(const pa_proplist* properties)
+    {
+        const std::string form = property(properties, PA_PROP_DEVICE_FORM_FACTOR);
+        return (form == "headphone" || form == "headset") && property(properties, PA_PROP_DEVICE_BUS) != "bluetooth";
+    }
 
-bool isHeadsetPort(uint32_t type) { return type == PA_DEVICE_PORT_TYPE_HEADPHONES || type == PA_DEVICE_PORT_TYPE_HEADSET; }
+    // By the port in use where the device has ports, by the device's form otherwise.
+    template <typename Info>
+    bool isHeadsetInUse(const Info& info)
+    {
+        if (info.active_port != nullptr)
+            return isHeadsetPort(info.active_port->type) && info.active_port->available != PA_PORT_AVAILABLE_NO;
+        return isWiredHeadset(info.proplist);
+    }
 
-bool isWiredHeadset(const pa_proplist* properties)
-{
-    const std::string form = property(properties, PA_PROP_DEVICE_FORM_FACTOR);
-    return (form == "headphone" || form == "headset") && property(properties, PA_PROP_DEVICE_BUS) != "bluetooth";
-}
-
-// By the port in use where the device has ports, by the device's form otherwise.
-template <typename Info> bool isHeadsetInUse(const Info& info)
-{
-    if (info.active_port != nullptr)
-        return isHeadsetPort(info.active_port->type) && info.active_port->available != PA_PORT_AVAILABLE_NO;
-    return isWiredHeadset(info.proplist);
-}
-
-bool hasPluggedHeadset(const pa_sink_info& info)
-{
-    for (uint32_t i = 0; i < info.n_ports; ++i)
-        if (isHeadsetPort(info.ports[i]->type) && info.ports[i]->available == PA_PORT_AVAILABLE_YES)
-            return true;
-    return info.n_ports == 0 && isWiredHeadset(info.proplist);
-}
+    bool hasPluggedHeadset(const pa_sink_info& info)
+    {
+        for (uint32_t i = 0; i < info.n_ports; ++i)
+            if (isHeadsetPort(info.ports[i]->type) && info.ports[i]->available == PA_PORT_AVAILABLE_YES)
+                return true;
+        return info.n_ports == 0 && isWiredHeadset(info.proplist);
+    }
 
 }
 
@@ -134,7 +138,8 @@ struct PulseWatch::Query {
             owner->_finish();
     }
 
-    template <typename Info> static void listCb(pa_context*, const Info* info, int end, void* data)
+    template <typename Info>
+    static void listCb(pa_context*, const Info* info, int end, void* data)
     {
         auto* self = static_cast<Query*>(data);
         if (end == 0 && info != nullptr)
@@ -222,7 +227,10 @@ void PulseWatch::_connect()
         },
         this);
     pa_context_set_subscribe_callback(
-        _context, [](pa_context*, pa_subscription_event_type_t, uint32_t, void* data) { static_cast<PulseWatch*>(data)->_query(); },
+        _context,
+        [](pa_context*, pa_subscription_event_type_t, uint32_t, void* data) {
+            static_cast<PulseWatch*>(data)->_query();
+        },
         this);
     if (pa_context_connect(_context, nullptr, static_cast<pa_context_flags_t>(PA_CONTEXT_NOAUTOSPAWN), nullptr) < 0)
         _publish({});

@@ -1,0 +1,78 @@
+#pragma once
+
+#include <gst/gst.h>
+
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <string>
+
+namespace media {
+
+// Hears what the pipeline captures and encodes. Called on streaming threads; must neither wait nor call the pipeline.
+class CaptureListener {
+public:
+    virtual ~CaptureListener() = default;
+    // Sound from the microphone; answers how many of the samples are to be recorded (from the front).
+    virtual size_t onCaptured(const int16_t* samples, size_t count) = 0;
+    virtual void onFrame(const void* frame, size_t size) = 0;
+    // Everything captured has been encoded.
+    virtual void onDrained() = 0;
+    virtual void onFailed(const char* reason) = 0;
+};
+
+struct RecorderFormat {
+    bool isAac = true;
+    int sampleRate = 44100;
+    int bitRate = 288000;
+    int channels = 2; // of the encoded sound; the microphone is one channel
+
+    // The encoder works ahead by that many samples.
+    [[nodiscard]] uint64_t lookAhead() const { return isAac ? 1600 : 40; }
+    [[nodiscard]] uint64_t frameSamples() const { return isAac ? 1024 : 160; }
+};
+
+// Microphone, queue and encoder. The sound is re-stamped to an unbroken time line at the queue, so a pause leaves no
+// gap; encoded frames go to the listener and nowhere else. One caller at a time; nothing here waits for the main loop.
+class RecorderPipeline {
+public:
+    // Opens the microphone's server; none when that fails. MEWLO_AUDIO_SOURCE names another source than the sound
+    // server, in the notation of gst-launch.
+    static std::unique_ptr<RecorderPipeline> create(const RecorderFormat& format);
+    ~RecorderPipeline();
+    RecorderPipeline(const RecorderPipeline&) = delete;
+    RecorderPipeline& operator=(const RecorderPipeline&) = delete;
+
+    // The listener must outlive the pipeline.
+    void setListener(CaptureListener* listener) { _listener = listener; }
+    bool play();
+    // Stops capturing and gives the microphone free for others; what is captured is still encoded.
+    bool pause();
+    // Encodes the rest, in any state; onDrained() follows. Nothing is captured afterwards.
+    void drain();
+    // Seconds of sound waiting for the encoder: a storage that does not keep up, not a silent microphone.
+    [[nodiscard]] double backlog() const;
+
+private:
+    explicit RecorderPipeline(const RecorderFormat& format);
+    bool _build();
+    void _watch();
+    void _pushSilence(GstPad* pad);
+    GstPadProbeReturn _capture(GstPadProbeInfo* info);
+
+    static GstPadProbeReturn _captureCb(GstPad* pad, GstPadProbeInfo* info, gpointer self);
+    static GstPadProbeReturn _encoderInputCb(GstPad* pad, GstPadProbeInfo* info, gpointer self);
+    static GstPadProbeReturn _encoderOutputCb(GstPad* pad, GstPadProbeInfo* info, gpointer self);
+    static GstBusSyncReply _messageCb(GstBus* bus, GstMessage* message, gpointer self);
+
+    RecorderFormat _format;
+    CaptureListener* _listener = nullptr;
+    GstElement* _pipeline = nullptr;
+    GstElement* _queue = nullptr;
+    uint64_t _samples = 0; // on the time line; streaming thread
+};
+
+// Prepares GStreamer once per process; answers false when it cannot be used. Any thread.
+bool isGStreamerReady();
+
+}

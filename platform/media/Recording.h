@@ -1,0 +1,80 @@
+#pragma once
+
+#include "media/RecorderPipeline.h"
+#include "media/RecordingFile.h"
+
+#include <recorder.h>
+
+#include <atomic>
+#include <chrono>
+#include <condition_variable>
+#include <functional>
+#include <memory>
+#include <mutex>
+
+namespace media {
+
+// Why a recording cannot go on.
+enum class Trouble { NONE, DEVICE_LOST, STORAGE_FULL, STORAGE_LOST, CALL };
+
+struct RecordingLimits {
+    uint64_t bytes = 0; // 0 for none
+    uint64_t samples = 0;
+};
+
+// One recording from start to commit or cancel: counts, measures and limits what the pipeline captures, and writes the
+// frames. The streaming threads work here; everybody else looks in through atomics or waits for a signal.
+class Recording : public CaptureListener {
+public:
+    struct Events {
+        std::function<void()> progress; // every 20 ms of sound; streaming thread
+        std::function<void(recorder_recording_limit_type_e)> limit; // once; streaming thread or keeper
+        std::function<void()> trouble; // once; any thread
+    };
+    Recording(std::unique_ptr<RecordingFile> file, const RecorderFormat& format, RecordingLimits limits, Events events);
+
+    // Holding drops what the microphone delivers. The pipeline is paused after, and played before letting go.
+    void setHeld(bool held) { _isHeld = held; }
+    // From now on no frame is written.
+    void close() { _isClosed = true; }
+    void raise(Trouble trouble);
+
+    [[nodiscard]] Trouble trouble() const { return _trouble; }
+    [[nodiscard]] unsigned long long elapsedMs() const;
+    [[nodiscard]] uint64_t samples() const { return _samples; }
+    [[nodiscard]] bool isCapturing() const { return !_isHeld && !_isFull; }
+    [[nodiscard]] RecordingFile& file() { return *_file; }
+    // Decibels below full scale; starts anew.
+    double takePeak();
+
+    // Whether the first sample came in time; false at once when trouble came instead.
+    bool waitForSound(std::chrono::milliseconds limit);
+    bool waitForDrain(std::chrono::milliseconds limit);
+    // Stops the data and reports the limit, the first time.
+    void reachLimit(recorder_recording_limit_type_e type);
+
+    size_t onCaptured(const int16_t* samples, size_t count) override;
+    void onFrame(const void* frame, size_t size) override;
+    void onDrained() override;
+    void onFailed(const char* reason) override;
+
+private:
+    void _measure(const int16_t* samples, size_t count);
+    void _notify();
+
+    const std::unique_ptr<RecordingFile> _file;
+    const RecorderFormat _format;
+    const RecordingLimits _limits;
+    const Events _events;
+    std::atomic<uint64_t> _samples{0};
+    std::atomic<int> _peak{0};
+    std::atomic<bool> _isHeld{false};
+    std::atomic<bool> _isFull{false};
+    std::atomic<bool> _isClosed{false};
+    std::atomic<bool> _isDrained{false};
+    std::atomic<Trouble> _trouble{Trouble::NONE};
+    std::mutex _mutex; // only for waiting
+    std::condition_variable _changed;
+};
+
+}

@@ -1,0 +1,49 @@
+#pragma once
+
+#include "media/FileDescriptor.h"
+#include "media/RecordingJournal.h"
+
+#include <atomic>
+#include <memory>
+#include <string>
+
+namespace media {
+
+// The file of one running recording with its journal. append() belongs to one thread at a time, flush() and
+// freeSpaceError() may run beside it. Every frame is in the system's hands when append() returns.
+class RecordingFile {
+public:
+    // Creates both files; the path must be claimed. None on failure, error is the system's number.
+    static std::unique_ptr<RecordingFile> create(const std::string& path, const JournalHeader& header, int& error);
+
+    // Answers 0 or the system's error number; then the file ends with the last whole frame.
+    int append(const void* frame, size_t size);
+    // Of the finished file, with one more frame of that many bytes.
+    [[nodiscard]] uint64_t sizeWith(size_t frameBytes) const;
+    [[nodiscard]] uint64_t size() const;
+    [[nodiscard]] uint64_t frames() const { return _frames; }
+
+    // To the storage: the recording first, so that the journal never promises more than there is.
+    void flush();
+    // Room for the index is kept back for the case that the storage fills up; grows with the recording.
+    void growReserve();
+    // ENOSPC when the storage has no more room than finishing needs, else 0.
+    [[nodiscard]] int freeSpaceError() const;
+
+    // Makes it an ordinary file and flushes; answers 0 or the system's error number.
+    int finish();
+
+private:
+    RecordingFile(std::string path, JournalHeader header);
+
+    std::string _path;
+    JournalHeader _header;
+    FileDescriptor _file;
+    FileDescriptor _journal;
+    FileDescriptor _reserve;
+    uint64_t _reserved = 0;
+    std::atomic<uint64_t> _frames{0};
+    std::atomic<uint64_t> _bytes{0}; // of the frames
+};
+
+}

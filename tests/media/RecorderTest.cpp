@@ -1,0 +1,256 @@
+#include "RecorderFixture.h"
+
+#include <chrono>
+#include <cmath>
+#include <csignal>
+#include <thread>
+
+using support::runFor;
+using support::runUntil;
+
+namespace {
+
+constexpr size_t WINDOW = 2048;
+
+double correlation(const short* a, const short* b)
+{
+    double ab = 0, aa = 0, bb = 0;
+    for (size_t i = 0; i < WINDOW; ++i) {
+        ab += a[i] * static_cast<double>(b[i]);
+        aa += a[i] * static_cast<double>(a[i]);
+        bb += b[i] * static_cast<double>(b[i]);
+    }
+    return aa > 0 && bb > 0 ? ab / std::sqrt(aa * bb) : 0;
+}
+
+// Where in the played noise a window of the recording comes from; -1 when nowhere near.
+long placeOf(const std::vector<short>& recorded, size_t at, const std::vector<short>& played, long from, long to)
+{
+    double best = 0.5;
+    long place = -1;
+    for (long i = std::max(0L, from); i <= to && i + static_cast<long>(WINDOW) <= static_cast<long>(played.size()); ++i)
+        if (const double likeness = correlation(&recorded[at], &played[static_cast<size_t>(i)]); likeness > best) {
+            best = likeness;
+            place = i;
+        }
+    return place;
+}
+
+}
+
+TEST_F(RecorderTest, KeepsItsTimeLineToTheSampleOverManyPauses)
+{
+    support::writeNoise(directory.file("noise.wav"), 30);
+    const auto voice = server.speak(directory.file("noise.wav"));
+    RecorderHandle recorder(temporary);
+    ASSERT_EQ(0, recorder.prepareAndStart());
+    for (unsigned i = 1; i <= 20; ++i) {
+        ASSERT_TRUE(recorder.recordUntil(i * 60));
+        ASSERT_EQ(0, recorder_pause(recorder.handle));
+        EXPECT_EQ(RECORDER_STATE_PAUSED, recorder.state());
+        runFor(0.03);
+        ASSERT_EQ(0, recorder_start(recorder.handle));
+    }
+    ASSERT_TRUE(recorder.recordUntil(1500));
+    ASSERT_EQ(0, recorder_commit(recorder.handle));
+    const auto elapsed = static_cast<double>(recorder.told.elapsed.back());
+    const double duration = probedDuration(temporary);
+    EXPECT_GE(duration, elapsed);
+    EXPECT_LE(duration, elapsed + 100); // what the encoder works ahead, and the last status
+    EXPECT_TRUE(decodesCleanly(temporary));
+    EXPECT_EQ(0u, recorder.told.elapsed.front());
+}
+
+TEST_F(RecorderTest, JoinsAPauseWithoutGapOrRepetition)
+{
+    support::writeNoise(directory.file("noise.wav"), 10);
+    const auto voice = server.speak(directory.file("noise.wav"));
+    RecorderHandle recorder(temporary);
+    ASSERT_EQ(0, recorder.prepareAndStart());
+    ASSERT_TRUE(recorder.recordUntil(1000));
+    ASSERT_EQ(0, recorder_pause(recorder.handle));
+    const auto joint = recorder.told.elapsed.back();
+    runFor(0.7);
+    ASSERT_EQ(0, recorder_start(recorder.handle));
+    ASSERT_TRUE(recorder.recordUntil(2000));
+    ASSERT_EQ(0, recorder_commit(recorder.handle));
+
+    const auto played = support::decode(directory.file("noise.wav"));
+    const auto recorded = support::decode(temporary);
+    ASSERT_GT(recorded.size(), 80000u);
+    const long before = placeOf(recorded, 30000, played, 0, 120000) - 30000;
+    const long after = placeOf(recorded, 70000, played, 70000, 160000) - 70000;
+    // One jump of the length of the pause, both halves on their own line.
+    EXPECT_NEAR(0.7 * 44100, after - before, 0.15 * 44100);
+    EXPECT_EQ(before, placeOf(recorded, 38000, played, 38000 + before - 50, 38000 + before + 50) - 38000);
+    const size_t beyond = joint * 441 / 10 + 6000;
+    EXPECT_EQ(after,
+        placeOf(
+            recorded, beyond, played, static_cast<long>(beyond) + after - 50, static_cast<long>(beyond) + after + 50)
+            - static_cast<long>(beyond));
+}
+
+TEST_F(RecorderTest, CommittedFileHasEverythingUpToTheStop)
+{
+    support::writeNoise(directory.file("noise.wav"), 10);
+    const auto voice = server.speak(directory.file("noise.wav"));
+    RecorderHandle recorder(temporary);
+    ASSERT_EQ(0, recorder.prepareAndStart());
+    ASSERT_TRUE(recorder.recordUntil(1500));
+    ASSERT_EQ(0, recorder_pause(recorder.handle));
+    runFor(0.05);
+    const auto elapsed = recorder.told.elapsed.back();
+    ASSERT_EQ(0, recorder_commit(recorder.handle)); // while paused
+    EXPECT_EQ(RECORDER_STATE_READY, recorder.state());
+
+    const auto played = support::decode(directory.file("noise.wav"));
+    const auto recorded = support::decode(temporary);
+    // The decoder delivers the sound behind what the encoder worked ahead; its very last part is there.
+    const size_t last = elapsed * 441 / 10 + 1600 - WINDOW;
+    ASSERT_GE(recorded.size(), last + WINDOW);
+    const long line = placeOf(recorded, 30000, played, 0, 120000) - 30000;
+    EXPECT_EQ(line,
+        placeOf(recorded, last, played, static_cast<long>(last) + line - 50, static_cast<long>(last) + line + 50)
+            - static_cast<long>(last));
+}
+
+TEST_F(RecorderTest, MeasuresTheInputLevel)
+{
+    support::writeTone(directory.file("tone.wav"), 10, 0.1);
+    const auto voice = server.speak(directory.file("tone.wav"));
+    RecorderHandle recorder(temporary);
+    ASSERT_EQ(0, recorder.prepareAndStart());
+    ASSERT_TRUE(recorder.recordUntil(1000));
+    double level = 0;
+    ASSERT_EQ(0, recorder_get_audio_level(recorder.handle, &level));
+    EXPECT_NEAR(-20, level, 1);
+    // Callbacks come every 20 ms.
+    EXPECT_GE(recorder.told.elapsed.size(), 20u);
+    EXPECT_EQ(0, recorder_cancel(recorder.handle));
+    EXPECT_EQ(std::vector<std::string>{"tone.wav"}, filesIn(directory.path()));
+    EXPECT_EQ(RECORDER_STATE_READY, recorder.state());
+    EXPECT_EQ(0, recorder_unprepare(recorder.handle));
+    EXPECT_EQ(RECORDER_STATE_CREATED, recorder.state());
+}
+
+TEST_F(RecorderTest, PausedRecorderLeavesTheMicrophoneToOthers)
+{
+    bool inRecording = true;
+    RecorderHandle recorder(temporary);
+    ASSERT_EQ(0, recorder.prepareAndStart());
+    EXPECT_EQ(0, recorder_is_in_recording(0, &inRecording));
+    EXPECT_FALSE(inRecording) << "our own recording does not count";
+    ASSERT_EQ(0, recorder_pause(recorder.handle));
+    EXPECT_TRUE(
+        runUntil([&] { return server.control("list source-outputs").find("Corked: yes") != std::string::npos; }));
+    {
+        const auto other = server.recordElsewhere();
+        EXPECT_TRUE(runUntil([&] { return recorder_is_in_recording(0, &inRecording) == 0 && inRecording; }));
+        EXPECT_EQ(0, recorder_is_in_recording(1, &inRecording));
+        EXPECT_FALSE(inRecording);
+    }
+    EXPECT_TRUE(runUntil([&] { return recorder_is_in_recording(0, &inRecording) == 0 && !inRecording; }));
+    EXPECT_EQ(0, recorder_commit(recorder.handle));
+}
+
+TEST_F(RecorderTest, OperationsWorkOnAThreadWhileTheMainLoopWaits)
+{
+    RecorderHandle recorder(temporary);
+    int error = -1;
+    std::thread([&] {
+        error = recorder.prepareAndStart();
+        std::this_thread::sleep_for(std::chrono::milliseconds(300));
+        error = error != 0 ? error : recorder_pause(recorder.handle);
+        error = error != 0 ? error : recorder_start(recorder.handle);
+        error = error != 0 ? error : recorder_commit(recorder.handle);
+    }).join();
+    EXPECT_EQ(0, error);
+    EXPECT_TRUE(recorder.told.elapsed.empty()) << "callbacks belong to the main loop";
+    EXPECT_TRUE(runUntil([&] { return recorder.told.states.size() == 5; }));
+    EXPECT_EQ(0u, recorder.told.elapsed.front());
+    recorder.destroy();
+    const size_t count = recorder.told.elapsed.size();
+    runFor(0.1);
+    EXPECT_EQ(count, recorder.told.elapsed.size());
+}
+
+TEST_F(RecorderTest, RefusesDuringCallsAndAlarms)
+{
+    support::writeTone(directory.file("ring.wav"), 20, 0.2);
+    for (const auto& [role, error] : {std::pair<std::string, int>{"phone", RECORDER_ERROR_SOUND_POLICY_BY_CALL},
+             {"alarm", RECORDER_ERROR_SOUND_POLICY_BY_ALARM}}) {
+        SCOPED_TRACE(role);
+        RecorderHandle recorder(temporary);
+        {
+            const auto ring = server.playAs(role, directory.file("ring.wav"));
+            EXPECT_TRUE(runUntil([&] {
+                const int answer = recorder_prepare(recorder.handle);
+                if (answer == 0)
+                    recorder_unprepare(recorder.handle);
+                return answer == error;
+            }));
+            EXPECT_EQ(RECORDER_STATE_CREATED, recorder.state());
+        }
+        EXPECT_TRUE(runUntil([&] { return recorder_prepare(recorder.handle) == 0; }));
+    }
+}
+
+TEST_F(RecorderTest, CompletesTheFileBeforeItReportsAnInterruption)
+{
+    support::writeTone(directory.file("ring.wav"), 20, 0.2);
+    support::ChildProcess ring;
+    struct Case {
+        const char* name;
+        std::function<void()> happen;
+        recorder_policy_e policy;
+    };
+    for (const auto& [name, happen, policy] :
+        {Case{"call", [&] { ring = server.playAs("phone", directory.file("ring.wav")); }, RECORDER_POLICY_SOUND},
+            Case{"suspended", [&] { (void)server.control("suspend-source micsrc 1"); }, RECORDER_POLICY_DEVICE_LOST},
+            Case{"server killed", [&] { server.kill(); }, RECORDER_POLICY_DEVICE_LOST}}) {
+        SCOPED_TRACE(name);
+        RecorderHandle recorder(temporary);
+        ASSERT_EQ(0, recorder.prepareAndStart());
+        ASSERT_TRUE(recorder.recordUntil(800));
+        happen();
+        ASSERT_TRUE(runUntil([&] { return !recorder.told.interruptions.empty(); }, 10));
+        EXPECT_EQ(std::vector{policy}, recorder.told.interruptions);
+        EXPECT_EQ(RECORDER_STATE_READY, recorder.told.stateWhenInterrupted);
+        EXPECT_EQ(std::to_string(support::readFile(temporary).size()), recorder.told.fileWhenEnded);
+        EXPECT_GE(probedDuration(temporary), 800);
+        EXPECT_TRUE(decodesCleanly(temporary));
+        EXPECT_EQ(0, recorder_commit(recorder.handle)) << "a stop that crosses the interruption finds the file";
+        EXPECT_EQ(0, recorder_unprepare(recorder.handle));
+        ring = {};
+        (void)server.control("suspend-source micsrc 0");
+        EXPECT_TRUE(runUntil([] {
+            bool ignored = false;
+            return recorder_is_in_recording(0, &ignored) == 0;
+        }));
+    }
+}
+
+TEST_F(RecorderTest, FailsToStartWithoutAWorkingMicrophone)
+{
+    setenv("PULSE_SOURCE", "no-such-source", 1);
+    {
+        RecorderHandle recorder(temporary);
+        const auto begin = std::chrono::steady_clock::now();
+        EXPECT_EQ(RECORDER_ERROR_DEVICE, recorder.prepareAndStart());
+        EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(5));
+        EXPECT_EQ(RECORDER_STATE_READY, recorder.state());
+        EXPECT_TRUE(filesIn(directory.path()).empty());
+    }
+    unsetenv("PULSE_SOURCE");
+    (void)server.control("suspend-source micsrc 1");
+    RecorderHandle recorder(temporary);
+    EXPECT_EQ(RECORDER_ERROR_DEVICE, recorder.prepareAndStart());
+    EXPECT_TRUE(filesIn(directory.path()).empty());
+    (void)server.control("suspend-source micsrc 0");
+    EXPECT_EQ(0, recorder_start(recorder.handle)) << "the next attempt is a new one";
+    server.kill();
+    RecorderHandle other(temporary);
+    const auto begin = std::chrono::steady_clock::now();
+    EXPECT_NE(0, recorder_prepare(other.handle));
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(1));
+}
