@@ -58,8 +58,7 @@ int AppProcess::run(int argc, char** argv)
     const auto line = parseCommandLine(argc, argv, status);
     if (!line)
         return status;
-    if (_toolkit == Toolkit::ELEMENTARY)
-        prepareToolkitEnvironment();
+    prepareToolkitEnvironment();
     if (ecore_init() == 0)
         return EXIT_FAILURE;
     ::signal(SIGPIPE, SIG_IGN);
