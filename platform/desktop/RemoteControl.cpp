@@ -1,0 +1,137 @@
+#include "desktop/RemoteControl.h"
+
+#include "app.h"
+#include "launch/Toolkit.h"
+#include "state/Keys.h"
+#include "state/MainLoop.h"
+#include "state/Trees.h"
+
+#include <utility>
+
+namespace platform {
+
+namespace {
+
+    struct Named {
+        const char* name;
+        media_key_e key;
+    };
+
+    constexpr Named METHODS[] = {{"Play", MEDIA_KEY_PLAY}, {"Pause", MEDIA_KEY_PAUSE},
+        {"PlayPause", MEDIA_KEY_PLAYPAUSE}, {"Stop", MEDIA_KEY_STOP}, {"Next", MEDIA_KEY_NEXT},
+        {"Previous", MEDIA_KEY_PREVIOUS}, {"SeekForward", MEDIA_KEY_FASTFORWARD}, {"SeekBack", MEDIA_KEY_REWIND}};
+
+    // Keyboards have one key for play and pause; it bears the name of play.
+    constexpr Named KEYBOARD[] = {{"Play", MEDIA_KEY_PLAYPAUSE}, {"Pause", MEDIA_KEY_PAUSE}, {"Stop", MEDIA_KEY_STOP},
+        {"Next", MEDIA_KEY_NEXT}, {"Prev", MEDIA_KEY_PREVIOUS}, {"Forward", MEDIA_KEY_FASTFORWARD},
+        {"Rewind", MEDIA_KEY_REWIND}, {"Media", MEDIA_KEY_MEDIA}};
+
+    template <size_t Count>
+    std::optional<media_key_e> keyNamed(const Named (&table)[Count], const std::string& name)
+    {
+        for (const Named& entry : table)
+            if (name == entry.name)
+                return entry.key;
+        return std::nullopt;
+    }
+
+    enum RecorderState : int { RECORDING = 2, RECORDING_PAUSED = 3 };
+
+}
+
+RemoteControl& RemoteControl::instance()
+{
+    static auto* control = new RemoteControl;
+    return *control;
+}
+
+void RemoteControl::reserve(media_key_event_cb callback, void* userData)
+{
+    _callback = callback;
+    _userData = userData;
+    if (_keys != nullptr)
+        return;
+    _keys = std::make_unique<host::X11Keys>([this](const std::string& name, bool down) {
+        if (const auto key = keyNamed(KEYBOARD, name))
+            _send(*key, down ? MEDIA_KEY_STATUS_PRESSED : MEDIA_KEY_STATUS_RELEASED);
+    });
+    if (host::BusInLoop* bus = host::sessionBus())
+        _mpris = std::make_unique<host::Mpris>(*bus, [this](const std::string& method) { _called(method); });
+    _recorderWatch = stateTree().watch(KEY_RECORDER_STATE, [this](const std::string&) { _update(); });
+    _titleWatch = stateTree().watch(KEY_TITLE, [this](const std::string&) { _update(); });
+    _update();
+}
+
+void RemoteControl::release()
+{
+    _callback = nullptr;
+    if (_keys == nullptr)
+        return;
+    stateTree().unwatch(std::exchange(_recorderWatch, 0));
+    stateTree().unwatch(std::exchange(_titleWatch, 0));
+    _mpris.reset();
+    _keys.reset();
+}
+
+void RemoteControl::setPlayerState(bt_avrcp_player_state_e state)
+{
+    _player = state;
+    _update();
+}
+
+// After the bus call or the key event has been dealt with: a receiver may release the keys at once.
+void RemoteControl::_called(const std::string& method)
+{
+    if (method == "Raise")
+        return raiseMainWindow();
+    if (method == "Quit")
+        return later([] { ui_app_close(); });
+    if (const auto key = keyNamed(METHODS, method))
+        later([this, key = *key] { _press(key); });
+}
+
+void RemoteControl::_press(media_key_e key)
+{
+    _send(key, MEDIA_KEY_STATUS_PRESSED);
+    _send(key, MEDIA_KEY_STATUS_RELEASED);
+}
+
+void RemoteControl::_send(media_key_e key, media_key_event_e status)
+{
+    if (_callback != nullptr)
+        _callback(key, status, _userData);
+}
+
+void RemoteControl::_update()
+{
+    if (_mpris == nullptr)
+        return;
+    constexpr const char* STATUS[] = {"Stopped", "Playing", "Paused"};
+    const int recorder = stateInt(KEY_RECORDER_STATE).value_or(0);
+    const bool records = recorder == RECORDING || recorder == RECORDING_PAUSED;
+    host::Mpris::State state;
+    state.status = records ? (recorder == RECORDING ? "Playing" : "Paused") : STATUS[_player];
+    state.title = stateTree().read(KEY_TITLE).value_or("");
+    state.canSkip = !records;
+    _mpris->setState(state);
+}
+
+}
+
+using platform::RemoteControl;
+
+// The command worker reserves keys, too; it must not wait for the main loop.
+int media_key_reserve(media_key_event_cb callback, void* user_data)
+{
+    constexpr int INVALID_PARAMETER = -22;
+    if (callback == nullptr)
+        return INVALID_PARAMETER;
+    platform::onMainLoop([=] { RemoteControl::instance().reserve(callback, user_data); });
+    return 0;
+}
+
+int media_key_release(void)
+{
+    platform::onMainLoop([] { RemoteControl::instance().release(); });
+    return 0;
+}
