@@ -1,9 +1,117 @@
 #include "device/HostWatchers.h"
 
+#include "host/BatteryWatch.h"
+#include "host/CallWatch.h"
+#include "host/DisplayWatch.h"
+#include "host/LocaleWatch.h"
+#include "host/LogindWatch.h"
+#include "host/MountWatch.h"
+#include "host/PortalWatch.h"
+#include "host/PulseWatch.h"
+#include "host/ScreenSaverWatch.h"
+#include "host/TimeWatch.h"
+#include "state/Keys.h"
+#include "state/Log.h"
+#include "state/Trees.h"
+#include "vconf.h"
+
+#include <cstdlib>
+#include <memory>
+
 namespace platform {
 
-void startHostWatchers() { }
+namespace {
 
-void stopHostWatchers() { }
+    // A value that another process wrote before is no news.
+    void sink(const std::string& key, const std::string& value) { stateTree().writeIfDifferent(key, value); }
+
+    bool rejectsCalls() { return parseBool(stateTree().read(VCONFKEY_CALL_RECORDING_REJECT)).value_or(false); }
+
+    bool isWanted(const std::string& name)
+    {
+        const char* chosen = std::getenv("MEWLO_HOST");
+        const std::string list = chosen != nullptr && *chosen != '\0' ? chosen : "all";
+        return list == "all" || ("," + list + ",").find("," + name + ",") != std::string::npos;
+    }
+
+    class HostWatchers {
+    public:
+        HostWatchers()
+        {
+            startIfWanted("lock", _logind);
+            startIfWanted("lock", _screenSaver);
+            startIfWanted("battery", _battery);
+            startIfWanted("mounts", _mounts);
+            startIfWanted("portal", _portal);
+            startIfWanted("time", _time);
+            startIfWanted("calls", _calls);
+            startIfWanted("locale", _locale);
+            startIfWanted("display", _display);
+            _recorderWatch = stateTree().watch(KEY_RECORDER_STATE, [this](const std::string&) { _updateBusy(); });
+            _lockWatch = stateTree().watch(VCONFKEY_IDLE_LOCK_STATE, [this](const std::string&) { _lockChanged(); });
+        }
+        ~HostWatchers()
+        {
+            stateTree().unwatch(_recorderWatch);
+            stateTree().unwatch(_lockWatch);
+        }
+        HostWatchers(const HostWatchers&) = delete;
+        HostWatchers& operator=(const HostWatchers&) = delete;
+
+    private:
+        template <typename Watch>
+        static void startIfWanted(const char* name, Watch& watch)
+        {
+            if (isWanted(name))
+                watch.start();
+        }
+
+        void _updateBusy()
+        {
+            constexpr int RECORDING = 2; // and paused is 3
+            if (isWanted("lock"))
+                _logind.setBusy(stateInt(KEY_RECORDER_STATE).value_or(0) >= RECORDING);
+        }
+
+        // Somebody else than logind wrote "unlocked", such as a button of ours: ask the session to follow.
+        void _lockChanged()
+        {
+            const bool locked = stateInt(VCONFKEY_IDLE_LOCK_STATE).value_or(0) != 0;
+            if (!locked && _sessionIsLocked && isWanted("lock"))
+                _logind.unlock();
+        }
+
+        void _lockSink(const std::string& key, const std::string& value)
+        {
+            if (key == VCONFKEY_IDLE_LOCK_STATE)
+                _sessionIsLocked = value != "0";
+            sink(key, value);
+        }
+
+        bool _sessionIsLocked = false;
+        host::LogindWatch _logind{[this](const std::string& key, const std::string& value) { _lockSink(key, value); }};
+        host::ScreenSaverWatch _screenSaver{sink};
+        host::BatteryWatch _battery{sink};
+        host::MountWatch _mounts{sink};
+        host::PortalWatch _portal{sink};
+        host::TimeWatch _time{sink};
+        host::CallWatch _calls{sink, rejectsCalls};
+        host::LocaleWatch _locale{sink};
+        host::DisplayWatch _display{sink};
+        KeyTree::WatchId _recorderWatch = 0;
+        KeyTree::WatchId _lockWatch = 0;
+    };
+
+    std::unique_ptr<HostWatchers>& watchers()
+    {
+        static auto* all = new std::unique_ptr<HostWatchers>;
+        return *all;
+    }
+
+}
+
+void startHostWatchers() { watchers() = std::make_unique<HostWatchers>(); }
+
+void stopHostWatchers() { watchers().reset(); }
 
 }
