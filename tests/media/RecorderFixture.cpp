@@ -100,8 +100,25 @@ std::vector<Leftover> rescue(const std::string& temporaryPath)
 
 double probedDuration(const std::string& path)
 {
+    // The prober guesses at AMR, whose frames of ours are all of one size.
+    if (const std::string content = support::readFile(path); content.starts_with("#!AMR"))
+        return static_cast<double>(content.size() - 6) / 32 * 20;
     const std::string seconds = outputOf("ffprobe -v error -show_entries format=duration -of csv=p=0 '" + path + "'");
     return seconds.empty() ? -1 : std::atof(seconds.c_str()) * 1000;
+}
+
+void makeRecording(const std::string& path, int seconds, bool isAmr)
+{
+    setenv("MEWLO_AUDIO_SOURCE", "audiotestsrc is-live=false volume=0.2 samplesperbuffer=441", 1);
+    RecorderHandle recorder(path);
+    if (isAmr)
+        recorder.useAmr();
+    recorder_attr_set_time_limit(recorder.handle, seconds);
+    EXPECT_EQ(0, recorder.prepareAndStart());
+    EXPECT_TRUE(support::runUntil([&] { return !recorder.told.limits.empty(); }, 60));
+    EXPECT_EQ(0, recorder_commit(recorder.handle));
+    recorder_release_temporary(path.c_str());
+    unsetenv("MEWLO_AUDIO_SOURCE");
 }
 
 bool decodesCleanly(const std::string& path)

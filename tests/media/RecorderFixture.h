@@ -53,6 +53,9 @@ struct Leftover {
 };
 std::vector<Leftover> rescue(const std::string& temporaryPath);
 
+// A recording of that many seconds (a tone), made faster than it plays.
+void makeRecording(const std::string& path, int seconds, bool isAmr);
+
 // Milliseconds by an independent program, -1 when it does not read the file.
 double probedDuration(const std::string& path);
 // Whether an independent program decodes all of it without complaint.
