@@ -34,6 +34,13 @@ namespace {
         return list == "all" || ("," + list + ",").find("," + name + ",") != std::string::npos;
     }
 
+    // On the thread of the sound watch; keys may be written from any.
+    void reportEarjack(const host::PulseSnapshot& before, const host::PulseSnapshot& now)
+    {
+        if (before.isHeadsetPlugged != now.isHeadsetPlugged)
+            sink(VCONFKEY_SYSMAN_EARJACK, now.isHeadsetPlugged ? "1" : "0");
+    }
+
     class HostWatchers {
     public:
         HostWatchers()
@@ -47,6 +54,8 @@ namespace {
             startIfWanted("calls", _calls);
             startIfWanted("locale", _locale);
             startIfWanted("display", _display);
+            if (isWanted("earjack"))
+                _earjackListener = host::PulseWatch::instance().addListener(reportEarjack);
             _recorderWatch = stateTree().watch(KEY_RECORDER_STATE, [this](const std::string&) { _updateBusy(); });
             _lockWatch = stateTree().watch(VCONFKEY_IDLE_LOCK_STATE, [this](const std::string&) { _lockChanged(); });
         }
@@ -54,6 +63,8 @@ namespace {
         {
             stateTree().unwatch(_recorderWatch);
             stateTree().unwatch(_lockWatch);
+            if (_earjackListener != 0)
+                host::PulseWatch::instance().removeListener(_earjackListener);
         }
         HostWatchers(const HostWatchers&) = delete;
         HostWatchers& operator=(const HostWatchers&) = delete;
@@ -98,6 +109,7 @@ namespace {
         host::CallWatch _calls{sink, rejectsCalls};
         host::LocaleWatch _locale{sink};
         host::DisplayWatch _display{sink};
+        int _earjackListener = 0;
         KeyTree::WatchId _recorderWatch = 0;
         KeyTree::WatchId _lockWatch = 0;
     };
