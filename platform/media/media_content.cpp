@@ -4,6 +4,7 @@
 #include <dlog.h>
 #include <storage.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
@@ -406,9 +407,10 @@ int media_info_get_audio(media_info_h media, audio_meta_h* audio)
 {
     if (media == nullptr || audio == nullptr)
         return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
-    if (media->row.duration < 0)
+    // A file that does not tell its duration may tell it now; one that is gone must not keep others from being listed.
+    if (media->row.duration < 0 && ::access(media->row.path.c_str(), R_OK) == 0)
         return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
-    *audio = new audio_meta_s{media->row.duration};
+    *audio = new audio_meta_s{std::max(media->row.duration, 0)};
     return MEDIA_CONTENT_ERROR_NONE;
 }
 

@@ -1,0 +1,180 @@
+#include <gtest/gtest.h>
+#include <media_content.h>
+
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include "support/Recordings.h"
+#include "support/RunUntil.h"
+
+namespace {
+
+using support::addRecording;
+
+class MediaDatabaseTest : public ::testing::Test {
+protected:
+    void SetUp() override
+    {
+        ::setenv("MEWLO_MEDIA_DB", _directory.file("media.db").c_str(), 1);
+        std::filesystem::remove_all(support::deviceRoot() + "/Sounds");
+        ASSERT_EQ(0, media_content_connect());
+    }
+    void TearDown() override
+    {
+        media_content_disconnect();
+        ::unsetenv("MEWLO_MEDIA_DB");
+    }
+    void reconnect()
+    {
+        media_content_disconnect();
+        ASSERT_EQ(0, media_content_connect());
+    }
+    static std::vector<std::string> names(const char* condition = "1")
+    {
+        filter_h filter = nullptr;
+        media_filter_create(&filter);
+        media_filter_set_condition(filter, condition, MEDIA_CONTENT_COLLATE_NOCASE);
+        media_filter_set_order(filter, MEDIA_CONTENT_ORDER_ASC, "MEDIA_DISPLAY_NAME", MEDIA_CONTENT_COLLATE_DEFAULT);
+        std::vector<std::string> found;
+        const auto collect = [](media_info_h media, void* data) {
+            char* name = nullptr;
+            media_info_get_display_name(media, &name);
+            static_cast<std::vector<std::string>*>(data)->push_back(mwAdopt(name));
+            return true;
+        };
+        EXPECT_EQ(0, media_info_foreach_media_from_db(filter, collect, &found));
+        media_filter_destroy(filter);
+        return found;
+    }
+    const support::TempDir _directory;
+};
+
+using Names = std::vector<std::string>;
+
+TEST_F(MediaDatabaseTest, KeepsOneRowAFileWithKindAndMode)
+{
+    const std::string first = addRecording("a.M4A");
+    EXPECT_EQ(first, addRecording("a.M4A", "longer content")) << "refreshed, not doubled";
+    addRecording("b.amr");
+    support::writeFile(support::deviceRoot() + "/elsewhere.m4a", "x");
+    media_info_h media = nullptr;
+    ASSERT_EQ(0, media_info_insert_to_db((support::deviceRoot() + "/elsewhere.m4a").c_str(), &media));
+    media_info_destroy(media);
+    EXPECT_EQ((Names{"a.M4A", "b.amr"}),
+        names("MEDIA_MIME_TYPE=\"audio/AMR\" OR (MEDIA_MIME_TYPE=\"audio/mp4\" AND MEDIA_MODE=10)"));
+    EXPECT_EQ(Names{"b.amr"}, names("MEDIA_MIME_TYPE=\"AUDIO/amr\""));
+    EXPECT_NE(0, media_info_insert_to_db("/no/such.m4a", &media));
+    EXPECT_EQ(nullptr, media);
+    reconnect();
+    EXPECT_EQ(3u, names().size());
+}
+
+TEST_F(MediaDatabaseTest, BookmarksGoWithTheirRecording)
+{
+    const std::string id = addRecording("a.m4a");
+    EXPECT_EQ(0, media_bookmark_insert_to_db(id.c_str(), 9, "late"));
+    EXPECT_EQ(0, media_bookmark_insert_to_db(id.c_str(), 3, "early"));
+    EXPECT_NE(0, media_bookmark_insert_to_db("no such id", 3, "x"));
+    std::string order;
+    const auto collect = [](media_bookmark_h bookmark, void* data) {
+        char* name = nullptr;
+        media_bookmark_get_name(bookmark, &name);
+        *static_cast<std::string*>(data) += mwAdopt(name) + " ";
+        return true;
+    };
+    media_info_foreach_bookmark_from_db(id.c_str(), nullptr, collect, &order);
+    EXPECT_EQ("early late ", order);
+    EXPECT_EQ(0, media_info_delete_from_db(id.c_str()));
+    int count = -1;
+    media_info_get_bookmark_count_from_db(id.c_str(), nullptr, &count);
+    EXPECT_EQ(0, count);
+}
+
+TEST_F(MediaDatabaseTest, ADamagedDatabaseIsSetAsideAndRebuiltFromTheFiles)
+{
+    addRecording("a.m4a");
+    media_content_disconnect();
+    support::writeFile(_directory.file("media.db"), std::string(8192, 'x'));
+    ASSERT_EQ(0, media_content_connect());
+    EXPECT_EQ(Names{"a.m4a"}, names());
+    int aside = 0;
+    for (const auto& entry : std::filesystem::directory_iterator(_directory.path()))
+        aside += entry.path().filename().string().find("media.db.damaged-") == 0 ? 1 : 0;
+    EXPECT_EQ(1, aside);
+}
+
+TEST_F(MediaDatabaseTest, DamageFoundInTheMiddleIsRepairedToo)
+{
+    for (int i = 0; i < 200; ++i)
+        support::writeFile(support::recordingPath("r" + std::to_string(1000 + i) + ".m4a"), "x");
+    media_content_scan_folder(support::recordingsDirectory().c_str(), nullptr, nullptr);
+    media_content_disconnect(); // also writes the log back into the file
+    std::string content = support::readFile(_directory.file("media.db"));
+    ASSERT_LT(20000u, content.size());
+    std::fill(content.begin() + 4096, content.end(), 'x'); // all but the first page
+    support::writeFile(_directory.file("media.db"), content);
+    ASSERT_EQ(0, media_content_connect());
+    EXPECT_NE("", addRecording("new.m4a"));
+    EXPECT_EQ(201u, names().size());
+}
+
+// Run by the test below in a process of its own.
+TEST(MediaDatabaseWriter, DISABLED_InsertsOneFile)
+{
+    ASSERT_EQ(0, media_content_connect());
+    media_info_h media = nullptr;
+    EXPECT_EQ(0, media_info_insert_to_db(std::getenv("MEWLO_TEST_FOREIGN_FILE"), &media));
+    media_info_destroy(media);
+    media_content_disconnect();
+}
+
+TEST_F(MediaDatabaseTest, OtherProcessesAreToldOfCommits)
+{
+    struct Heard {
+        int pid = 0;
+        int count = 0;
+    } heard;
+    const auto callback = [](media_content_error_e, int pid, media_content_db_update_item_type_e,
+                              media_content_db_update_type_e, media_content_type_e, char*, char*, char*, void* data) {
+        static_cast<Heard*>(data)->pid = pid;
+        ++static_cast<Heard*>(data)->count;
+    };
+    ASSERT_EQ(0, media_content_set_db_updated_cb(callback, &heard));
+    support::writeFile(support::recordingPath("foreign.m4a"), "x");
+    // The writer is a fresh process: a database connection must not cross a fork.
+    ::setenv("MEWLO_TEST_FOREIGN_FILE", support::recordingPath("foreign.m4a").c_str(), 1);
+    const pid_t child = ::fork();
+    if (child == 0) {
+        ::execl("/proc/self/exe", "writer", "--gtest_filter=MediaDatabaseWriter.*", "--gtest_also_run_disabled_tests",
+            static_cast<char*>(nullptr));
+        ::_exit(1);
+    }
+    int status = -1;
+    ::waitpid(child, &status, 0);
+    ASSERT_EQ(0, status);
+    EXPECT_TRUE(support::runUntil([&] { return heard.count > 0; }));
+    EXPECT_EQ(child, heard.pid);
+    EXPECT_EQ(Names{"foreign.m4a"}, names());
+    media_content_unset_db_updated_cb();
+}
+
+TEST_F(MediaDatabaseTest, ScanningKeepsRowsOfAFolderThatIsAway)
+{
+    addRecording("a.m4a");
+    const std::string away = support::recordingsDirectory() + "-away";
+    std::filesystem::rename(support::recordingsDirectory(), away);
+    int removed = -1;
+    EXPECT_EQ(0, media_content_scan_folder(support::recordingsDirectory().c_str(), nullptr, &removed));
+    EXPECT_EQ(Names{"a.m4a"}, names());
+    std::filesystem::rename(away, support::recordingsDirectory());
+    support::writeFile(support::recordingPath(".hidden.m4a"), "x");
+    support::writeFile(support::recordingPath("notes.txt"), "x");
+    support::writeFile(support::recordingPath("\xff\xfe.m4a"), "no UTF-8");
+    int added = 0;
+    media_content_scan_folder(support::recordingsDirectory().c_str(), &added, &removed);
+    EXPECT_EQ(1, added);
+    EXPECT_EQ(0, removed);
+    EXPECT_EQ(2u, names().size());
+}
+
+}
