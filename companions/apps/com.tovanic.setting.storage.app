@@ -1,0 +1,4 @@
+[Application]
+Name=Storage
+Exec=xdg-open %d
+Reply=none
