@@ -30,6 +30,7 @@ int recordUntilKilled(const char* path, const char* format, int commitAfterMs)
 
 int main(int argc, char** argv)
 {
+    ecore_app_no_system_modules();
     ecore_init();
     if (argc == 5 && std::strcmp(argv[1], "--record") == 0)
         return recordUntilKilled(argv[2], argv[3], std::atoi(argv[4]));
