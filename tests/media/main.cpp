@@ -1,6 +1,6 @@
-#include "support/RunUntil.h"
-
 #include <recorder.h>
+
+#include <Ecore.h>
 
 #include <gtest/gtest.h>
 
@@ -20,9 +20,15 @@ int recordUntilKilled(const char* path, const char* format, int commitAfterMs)
     recorder_set_filename(recorder, path);
     if (recorder_prepare(recorder) != 0 || recorder_start(recorder) != 0)
         return 1;
-    support::runFor(commitAfterMs > 0 ? commitAfterMs / 1000.0 : 3600);
-    recorder_commit(recorder);
-    support::runFor(3600);
+    if (commitAfterMs > 0)
+        ecore_timer_add(
+            commitAfterMs / 1000.0,
+            [](void* data) -> Eina_Bool {
+                recorder_commit(static_cast<recorder_h>(data));
+                return ECORE_CALLBACK_CANCEL;
+            },
+            recorder);
+    ecore_main_loop_begin();
     return 0;
 }
 
