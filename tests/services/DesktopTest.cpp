@@ -1,0 +1,303 @@
+#include "app.h"
+#include "bluetooth.h"
+#include "desktop/Toast.h"
+#include "host/BusInLoop.h"
+#include "host/Notifier.h"
+#include "launch/Toolkit.h"
+#include "media_key.h"
+#include "notification.h"
+#include "tovanic_log_manager.h"
+#include "vconf.h"
+
+#include "support/DbusMock.h"
+#include "support/PrivateBus.h"
+#include "support/RunUntil.h"
+
+#include <gtest/gtest.h>
+
+#include <Elementary.h>
+
+#include <thread>
+
+namespace {
+
+using support::BusKind;
+using support::DbusMock;
+using support::PrivateBus;
+using support::Program;
+using support::runUntil;
+
+constexpr auto PLAYER = "org.mpris.MediaPlayer2.mewlo_lite";
+constexpr auto RECORDER_STATE = "memory/mewlo/recorder_state";
+
+class MprisTest : public testing::Test {
+protected:
+    MprisTest()
+    {
+        vconf_set_int(RECORDER_STATE, 1);
+        vconf_set_str("memory/mewlo/title", "Memo 007");
+        bt_initialize();
+        bt_avrcp_target_initialize([](bool, const char*, void*) {}, nullptr);
+    }
+    ~MprisTest() override
+    {
+        media_key_release();
+        bt_avrcp_target_notify_player_state(BT_AVRCP_PLAYER_STATE_STOPPED);
+        bt_avrcp_target_deinitialize();
+        bt_deinitialize();
+        host::closeBuses();
+    }
+    void reserve()
+    {
+        ASSERT_EQ(0,
+            media_key_reserve(
+                [](media_key_e key, media_key_event_e status, void* data) {
+                    *static_cast<std::string*>(data)
+                        += std::to_string(key) + (status == MEDIA_KEY_STATUS_PRESSED ? "+" : "- ");
+                },
+                &_events));
+    }
+    // What a remote control prints; the loop runs meanwhile.
+    std::string playerctl(const std::vector<std::string>& words)
+    {
+        const std::string output = _directory.file("output");
+        std::filesystem::remove(output);
+        std::vector<std::string> command = {"playerctl"};
+        command.insert(command.end(), words.begin(), words.end());
+        Program program(command, output);
+        EXPECT_TRUE(runUntil([&] { return !program.isRunning(); }, 30));
+        std::string text = support::readFile(output);
+        while (!text.empty() && text.back() == '\n')
+            text.pop_back();
+        return text;
+    }
+
+    support::TempDir _directory;
+    PrivateBus _bus;
+    std::string _events;
+};
+
+TEST_F(MprisTest, RemoteControlsPressKeysWhileTheyAreReserved)
+{
+    EXPECT_EQ("", playerctl({"--list-all"}));
+    reserve();
+    EXPECT_EQ("mewlo_lite", playerctl({"--list-all"}));
+    const struct {
+        std::vector<std::string> words;
+        const char* events;
+    } cases[] = {{{"play-pause"}, "7+7- "}, {{"play"}, "0+0- "}, {{"pause"}, "2+2- "}, {{"next"}, "4+4- "},
+        {{"previous"}, "3+3- "}, {{"stop"}, "1+1- "}};
+    for (const auto& entry : cases) {
+        SCOPED_TRACE(entry.words.front());
+        _events.clear();
+        playerctl(entry.words);
+        EXPECT_TRUE(runUntil([&] { return _events == entry.events; })) << _events;
+    }
+    media_key_release();
+    EXPECT_TRUE(runUntil([&] { return playerctl({"--list-all"}).empty(); }));
+}
+
+TEST_F(MprisTest, ShowsThePlayerAndTheRecorder)
+{
+    bt_avrcp_target_notify_player_state(BT_AVRCP_PLAYER_STATE_PAUSED); // before there is anybody to tell
+    reserve();
+    EXPECT_EQ("Paused", playerctl({"status"}));
+    std::thread worker([] { bt_avrcp_target_notify_player_state(BT_AVRCP_PLAYER_STATE_PLAYING); });
+    EXPECT_TRUE(runUntil([&] { return playerctl({"status"}) == "Playing"; }));
+    worker.join();
+    EXPECT_EQ("Memo 007", playerctl({"metadata", "title"}));
+
+    const struct {
+        int recorder;
+        const char* status;
+    } cases[] = {{2, "Playing"}, {3, "Paused"}, {1, "Stopped"}};
+    bt_avrcp_target_notify_player_state(BT_AVRCP_PLAYER_STATE_STOPPED);
+    for (const auto& entry : cases) {
+        vconf_set_int(RECORDER_STATE, entry.recorder);
+        EXPECT_TRUE(runUntil([&] { return playerctl({"status"}) == entry.status; })) << entry.recorder;
+    }
+    vconf_set_int(RECORDER_STATE, 2); // nothing to skip to while recording
+    support::runFor(0.05);
+    _events.clear();
+    playerctl({"next"});
+    support::runFor(0.05);
+    EXPECT_EQ("", _events);
+}
+
+TEST_F(MprisTest, AReceiverMayReleaseTheKeysInItsCallback)
+{
+    static int calls = 0;
+    ASSERT_EQ(0,
+        media_key_reserve(
+            [](media_key_e, media_key_event_e, void*) {
+                ++calls;
+                media_key_release();
+            },
+            nullptr));
+    playerctl({"stop"});
+    EXPECT_TRUE(runUntil([] { return calls == 1; }));
+    support::runFor(0.05);
+    EXPECT_EQ(1, calls);
+    EXPECT_NE(0, media_key_reserve(nullptr, nullptr));
+}
+
+TEST_F(MprisTest, LosesItsBusWithoutHarm)
+{
+    reserve();
+    _bus.stop();
+    support::runFor(0.1);
+    bt_avrcp_target_notify_player_state(BT_AVRCP_PLAYER_STATE_PLAYING);
+    vconf_set_int(RECORDER_STATE, 2);
+    support::runFor(0.1);
+    EXPECT_EQ(0, media_key_release());
+    EXPECT_EQ(nullptr, host::sessionBus());
+}
+
+TEST(BluetoothTest, RefusesCallsOutOfOrder)
+{
+    EXPECT_EQ(BT_ERROR_NOT_INITIALIZED, bt_avrcp_target_notify_player_state(BT_AVRCP_PLAYER_STATE_PLAYING));
+    EXPECT_EQ(BT_ERROR_NOT_INITIALIZED, bt_avrcp_target_initialize([](bool, const char*, void*) {}, nullptr));
+    EXPECT_EQ(BT_ERROR_NOT_INITIALIZED, bt_deinitialize());
+    EXPECT_EQ(0, bt_initialize());
+    EXPECT_EQ(BT_ERROR_INVALID_PARAMETER, bt_avrcp_target_initialize(nullptr, nullptr));
+    EXPECT_EQ(0, bt_avrcp_target_initialize([](bool, const char*, void*) {}, nullptr));
+    EXPECT_EQ(BT_ERROR_INVALID_PARAMETER, bt_avrcp_target_notify_player_state(static_cast<bt_avrcp_player_state_e>(3)));
+    EXPECT_EQ(0, bt_avrcp_target_notify_player_state(BT_AVRCP_PLAYER_STATE_STOPPED));
+    EXPECT_EQ(0, bt_avrcp_target_deinitialize());
+    EXPECT_EQ(0, bt_deinitialize());
+}
+
+TEST(NotifierTest, ReplacesItsNotification)
+{
+    if (!DbusMock::isInstalled())
+        GTEST_SKIP() << "python3-dbusmock is missing";
+    const PrivateBus bus;
+    constexpr auto SERVICE = "org.freedesktop.Notifications";
+    constexpr auto PATH = "/org/freedesktop/Notifications";
+    DbusMock daemon(bus, BusKind::SESSION, SERVICE, {SERVICE, PATH, SERVICE});
+    // The second one must name the first one's number.
+    daemon.control(PATH, "AddMethod", "sssss", SERVICE, "Notify", "susssasa{sv}i", "u",
+        "if args[4] == 'second' and args[1] != 42: raise Exception('not replaced')\n"
+        "if args[6].get('transient') != True: raise Exception('stays')\n"
+        "ret = dbus.UInt32(42)");
+    host::Notifier notifier;
+    std::string failed;
+    const auto fail = [&](const std::string& text) { failed += text; };
+    EXPECT_TRUE(notifier.show("first", fail));
+    ASSERT_TRUE(runUntil([&] { return daemon.callsOf(PATH, "Notify") == 1; }, 20));
+    support::runFor(0.1);
+    EXPECT_TRUE(notifier.show("second", fail));
+    ASSERT_TRUE(runUntil([&] { return daemon.callsOf(PATH, "Notify") == 2; }, 20));
+    support::runFor(0.1);
+    EXPECT_EQ("", failed);
+    host::closeBuses();
+}
+
+TEST(NotifierTest, ReportsWhenNobodyShowsIt)
+{
+    host::Notifier notifier;
+    std::string failed;
+    const auto fail = [&](const std::string& text) { failed += text; };
+    host::closeBuses();
+    EXPECT_FALSE(notifier.show("no bus", fail));
+    const PrivateBus bus;
+    host::closeBuses();
+    EXPECT_TRUE(notifier.show("no daemon", fail));
+    EXPECT_TRUE(runUntil([&] { return failed == "no daemon"; }));
+    host::closeBuses();
+}
+
+TEST(StatusMessageTest, IsRememberedFromAnyThread)
+{
+    EXPECT_NE(0, notification_status_message_post(nullptr));
+    std::thread([] { notification_status_message_post("from a worker"); }).join();
+    EXPECT_STREQ("from a worker", notification_status_message_last());
+    EXPECT_EQ(0, notification_status_message_post(""));
+    EXPECT_STREQ("", notification_status_message_last());
+}
+
+TEST(ToastTest, LivesInTheWindow)
+{
+    ::setenv("ELM_ENGINE", "buffer", 1);
+    ASSERT_TRUE(platform::startToolkit(0, nullptr));
+    EXPECT_FALSE(platform::showToast("no window yet"));
+    Evas_Object* window = elm_win_util_standard_add("toast", "toast");
+    evas_object_resize(window, 360, 640);
+    evas_object_show(window);
+    ui_app_set_window(window);
+    EXPECT_TRUE(platform::showToast("<b>not markup</b> & more"));
+    EXPECT_TRUE(platform::showToast("the next one replaces it"));
+    support::runFor(0.1);
+    platform::raiseMainWindow();
+    evas_object_del(window);
+    EXPECT_EQ(nullptr, ui_app_get_window());
+    EXPECT_FALSE(platform::showToast("window gone"));
+    platform::raiseMainWindow();
+    platform::stopToolkit();
+}
+
+class UsageLogTest : public testing::Test {
+protected:
+    UsageLogTest()
+    {
+        ::setenv("XDG_STATE_HOME", _directory.path().c_str(), 1);
+        tovanic_log_manager_create(&_manager);
+    }
+    ~UsageLogTest() override { tovanic_log_manager_destroy(_manager); }
+    int insert(const std::string& feature, const std::string& extra)
+    {
+        bundle* record = bundle_create();
+        bundle_add_str(record, "app_id", "com.tovanic.mewlo-lite");
+        bundle_add_str(record, "feature", feature.c_str());
+        bundle_add_str(record, "extra", extra.c_str());
+        const int result
+            = tovanic_log_manager_insert(_manager, TOVANIC_LOG_MANAGER_URI, record, nullptr, nullptr, nullptr);
+        bundle_free(record);
+        return result;
+    }
+    [[nodiscard]] std::string log() const { return support::readFile(_directory.file("mewlo-lite/usage.jsonl")); }
+
+    support::TempDir _directory;
+    tovanic_log_manager_h _manager = nullptr;
+};
+
+TEST_F(UsageLogTest, WritesOneJsonLineForARecord)
+{
+    EXPECT_EQ(0, insert("RECO", "Normal Mode"));
+    EXPECT_EQ(0, insert("Rena", "quote \" back\\slash\nline \xc3\xa4"));
+    const std::string text = log();
+    EXPECT_NE(
+        std::string::npos, text.find(R"("app_id":"com.tovanic.mewlo-lite","feature":"RECO","extra":"Normal Mode"})"));
+    EXPECT_NE(std::string::npos, text.find("\"extra\":\"quote \\\" back\\\\slash\\u000aline \xc3\xa4\"}\n"));
+    EXPECT_EQ(2, std::count(text.begin(), text.end(), '\n'));
+    EXPECT_TRUE(text.starts_with("{\"time\":\"20"));
+    bundle* record = bundle_create();
+    EXPECT_NE(0, tovanic_log_manager_insert(_manager, "content://elsewhere", record, nullptr, nullptr, nullptr));
+    bundle_free(record);
+}
+
+TEST_F(UsageLogTest, TurnsAtOneMegabyteAndLosesNoLine)
+{
+    support::writeFile(_directory.file("mewlo-lite/usage.jsonl"), std::string(1024 * 1024 - 150, 'x') + "\n");
+    std::vector<std::thread> writers;
+    for (int i = 0; i < 4; ++i)
+        writers.emplace_back([this] {
+            for (int n = 0; n < 50; ++n)
+                EXPECT_EQ(0, insert("SAVE", "x"));
+        });
+    for (auto& writer : writers)
+        writer.join();
+    const std::string old = support::readFile(_directory.file("mewlo-lite/usage.jsonl.1"));
+    const std::string now = log();
+    EXPECT_GE(old.size(), 1024U * 1024U);
+    EXPECT_LT(now.size(), 100U * 1024U);
+    EXPECT_EQ(201, std::count(old.begin(), old.end(), '\n') + std::count(now.begin(), now.end(), '\n'));
+}
+
+TEST_F(UsageLogTest, AnUnwritablePlaceIsAnError)
+{
+    support::writeFile(_directory.file("mewlo-lite"), "a file where the directory should be");
+    EXPECT_NE(0, insert("RECO", ""));
+}
+
+}
