@@ -2,6 +2,8 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <filesystem>
+#include <memory>
 #include <utility>
 
 #include <Ecore_X.h>
@@ -23,6 +25,15 @@ namespace {
     WWindowController* instance = nullptr;
 
     int scaled(int units) { return static_cast<int>(units * elm_config_scale_get() / elm_app_base_scale_get()); }
+
+    // The look that replaces the toolkit's own, from the application's resources when they have one.
+    void applyTheme()
+    {
+        const std::unique_ptr<char, decltype(&std::free)> resources(app_get_resource_path(), &std::free);
+        const std::string theme = std::string(resources ? resources.get() : "") + "edje/MwTheme.edj";
+        if (std::filesystem::exists(theme))
+            elm_theme_overlay_add(nullptr, theme.c_str());
+    }
 
     void applyDesktopScale()
     {
@@ -87,6 +98,7 @@ bool WWindowController::create()
     if (_window)
         return true;
     applyDesktopScale();
+    applyTheme();
     _window = elm_win_util_standard_add(_name.c_str(), (_title.empty() ? _name : _title).c_str());
     if (!_window)
         return false;

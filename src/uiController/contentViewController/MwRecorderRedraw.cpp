@@ -40,7 +40,8 @@ void MwRecorderContentViewController::_updateContentView()
     _destroyAllButtons();
     const int state = getModel()->getRecorderState();
     MW_LOGW("recorder state: [%d]", state);
-    elm_layout_signal_emit(getEvasObject(), getModel()->isRequestMode() ? "hide_more_button" : "show_more_button", "");
+    elm_layout_signal_emit(
+        getEvasObject(), getModel()->isRequestMode() ? "enter_request_mode" : "leave_request_mode", "");
     switch (state) {
     case MwRecorder::REC_STATE_NONE:
     case MwRecorder::REC_STATE_READY:
