@@ -26,6 +26,7 @@ RecorderScreen::RecorderScreen(bool requestMode, int sizeLimit, int format, int 
     model.setCurrentRecordingFileName("Voice 001");
     model.setAppState(MwModel::APP_STATE_RESUMED);
     model.setRecorderState(MwRecorder::REC_STATE_READY);
+    MwSystemMgr::getInstance()->initialize(&model);
     _controller = std::make_unique<MwAppController>();
     _build(width, height);
 }
@@ -49,6 +50,7 @@ RecorderScreen::~RecorderScreen()
     MwSignalMgr::getInstance()->getLifeCycleSignal().emit(MwSignalMgr::TERMINATE);
     evas_object_del(window);
     support::runFor(0.01);
+    MwSystemMgr::getInstance()->deinitialize();
     MwSignalMgr::destroyInstance();
     MwSystemMgr::destroyInstance();
 }

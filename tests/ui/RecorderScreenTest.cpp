@@ -275,7 +275,7 @@ TEST(RecorderScreenTest, BookmarksAreTakenOncePerSecondAndShown)
     screen.press("bookmark_button");
     ASSERT_EQ(2U, screen.model.getBookmarkList().size());
     EXPECT_EQ(66U, screen.model.getBookmarkList()[1].markedTime);
-    EXPECT_EQ(2U, fakes::calls.count("tovanic_log_manager_insert"));
+    EXPECT_EQ(2U, fakes::calls.count("usage app_id=com.tovanic.mewlo-lite feature=BMRK"));
 }
 
 TEST(RecorderScreenTest, TheMenuFollowsStateCallRejectionAndCard)
