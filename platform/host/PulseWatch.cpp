@@ -212,7 +212,9 @@ void PulseWatch::_connect()
             switch (pa_context_get_state(context)) {
             case PA_CONTEXT_READY:
                 self->_isReady = true;
-                pa_operation_unref(pa_context_subscribe(context, PA_SUBSCRIPTION_MASK_ALL, nullptr, nullptr));
+                if (auto* wish = pa_context_subscribe(context, PA_SUBSCRIPTION_MASK_ALL, nullptr, nullptr);
+                    wish != nullptr)
+                    pa_operation_unref(wish);
                 self->_query();
                 break;
             case PA_CONTEXT_FAILED:

@@ -185,7 +185,7 @@ int Recorder::_startNew()
     int error = 0;
     const auto recording = _createRecording(error);
     if (!recording) {
-        _discard();
+        (void)releaseTemporary(_settings.path);
         return errorFor(error);
     }
     return _startOn(recording);

@@ -14,6 +14,7 @@
 #include <filesystem>
 #include <map>
 #include <mutex>
+#include <set>
 
 namespace fs = std::filesystem;
 
@@ -27,6 +28,7 @@ namespace {
     struct Claims {
         std::mutex mutex;
         std::map<std::string, FileDescriptor> held; // by the resolved path
+        std::set<std::string> written;
     };
 
     Claims& claims()
@@ -197,6 +199,8 @@ int claimTemporary(const std::string& givenPath)
 {
     const std::string path = resolved(givenPath);
     const std::scoped_lock lock(claims().mutex);
+    if (claims().written.contains(path))
+        return EWOULDBLOCK;
     for (int attempt = 0; attempt < ATTEMPTS; ++attempt) {
         int error = 0;
         FileDescriptor journal = takeOrLock(path, error);
@@ -204,6 +208,7 @@ int claimTemporary(const std::string& givenPath)
             return error;
         if (isReadyForUse(path, journal.get(), error)) {
             claims().held[path] = std::move(journal);
+            claims().written.insert(path);
             return 0;
         }
         if (error != 0)
@@ -216,6 +221,18 @@ bool isClaimedHere(const std::string& path)
 {
     const std::scoped_lock lock(claims().mutex);
     return claims().held.contains(resolved(path));
+}
+
+bool isBeingWritten(const std::string& path)
+{
+    const std::scoped_lock lock(claims().mutex);
+    return claims().written.contains(resolved(path));
+}
+
+void endWriting(const std::string& path)
+{
+    const std::scoped_lock lock(claims().mutex);
+    claims().written.erase(resolved(path));
 }
 
 FileDescriptor claimedJournal(const std::string& path)
@@ -236,6 +253,7 @@ bool releaseTemporary(const std::string& givenPath)
     if (isSameFile(found->second.get(), path + JOURNAL_SUFFIX))
         (void)unlink((path + JOURNAL_SUFFIX).c_str());
     claims().held.erase(found);
+    claims().written.erase(path);
     return true;
 }
 

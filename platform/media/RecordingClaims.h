@@ -20,9 +20,12 @@ constexpr auto DAMAGED_PREFIX = ".mw_damaged_";
 int openLocked(const std::string& journalPath);
 
 // Takes the path for a new recording and keeps it until releaseTemporary or the end of the process. What an earlier run
-// left there is moved aside first. Answers 0 or an error number (EWOULDBLOCK: another process records there).
+// left there is moved aside first. Answers 0 or an error number (EWOULDBLOCK: somebody records there).
 int claimTemporary(const std::string& path);
 bool isClaimedHere(const std::string& path);
+// Whether a recorder of this process writes there at the moment; the end of writing leaves the claim.
+bool isBeingWritten(const std::string& path);
+void endWriting(const std::string& path);
 // Another handle of the claimed journal; empty when the path is not claimed here.
 FileDescriptor claimedJournal(const std::string& path);
 // Removes the journal and ends the claim; answers whether there was one.

@@ -41,7 +41,10 @@ std::unique_ptr<RecordingFile> RecordingFile::create(const std::string& path, co
     std::unique_ptr<RecordingFile> self(new RecordingFile(path, header));
     self->_journal = claimedJournal(path);
     self->_file = FileDescriptor(open(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, FILE_MODE));
-    error = self->_file && self->_journal ? 0 : errno;
+    error = self->_file ? 0 : errno;
+    if (error == 0 && !self->_journal)
+        error = EBADF;
+    const bool isOurs = bool(self->_file);
     const std::string head = isAac(header) ? mp4FileHead(MP4_UNFINISHED) : AMR_MAGIC;
     if (error == 0)
         error = writeAt(self->_file.get(), head.data(), head.size(), 0);
@@ -49,8 +52,11 @@ std::unique_ptr<RecordingFile> RecordingFile::create(const std::string& path, co
         error = writeJournalHeader(self->_journal.get(), header);
     if (error == 0)
         error = self->freeSpaceError();
-    if (error != 0)
+    if (error != 0) {
+        if (isOurs)
+            (void)unlink(path.c_str());
         return nullptr;
+    }
     self->growReserve();
     return self;
 }
@@ -83,8 +89,14 @@ uint64_t RecordingFile::size() const { return sizeWith(0); }
 
 void RecordingFile::flush()
 {
+    const uint64_t frames = _frames;
+    if (frames == _flushedFrames)
+        return;
     (void)fdatasync(_file.get());
     (void)fdatasync(_journal.get());
+    // The names of both files, once.
+    if (std::exchange(_flushedFrames, frames) == 0)
+        flushDirectory(directoryOf(_path));
 }
 
 void RecordingFile::growReserve()
@@ -116,8 +128,10 @@ int RecordingFile::freeSpaceError() const
 int RecordingFile::finish()
 {
     _reserve.close();
-    return isAac(_header) ? finishMp4(_file.get(), _journal.get(), _header, {_frames, _bytes})
-                          : finishAmr(_file.get(), _journal.get(), _header);
+    const int error = isAac(_header) ? finishMp4(_file.get(), _journal.get(), _header, {_frames, _bytes})
+                                     : finishAmr(_file.get(), _journal.get(), _header);
+    endWriting(_path);
+    return error;
 }
 
 }

@@ -42,6 +42,7 @@ private:
     FileDescriptor _journal;
     FileDescriptor _reserve;
     uint64_t _reserved = 0;
+    uint64_t _flushedFrames = 0; // by the flushing thread
     std::atomic<uint64_t> _frames{0};
     std::atomic<uint64_t> _bytes{0}; // of the frames
 };

@@ -140,5 +140,7 @@ int recorder_release_temporary(const char* temporary_path)
 {
     if (temporary_path == nullptr)
         return RECORDER_ERROR_INVALID_PARAMETER;
+    if (isBeingWritten(temporary_path))
+        return RECORDER_ERROR_INVALID_STATE;
     return releaseTemporary(temporary_path) ? RECORDER_ERROR_NONE : RECORDER_ERROR_INVALID_STATE;
 }

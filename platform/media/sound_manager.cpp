@@ -49,7 +49,14 @@ private:
 };
 
 std::mutex notifierMutex;
-std::unique_ptr<RouteNotifier> notifier; // guarded by notifierMutex
+
+// Guarded by notifierMutex. Made after the watch, so that it goes before it at the end of the process.
+std::unique_ptr<RouteNotifier>& notifier()
+{
+    (void)host::PulseWatch::instance();
+    static std::unique_ptr<RouteNotifier> current;
+    return current;
+}
 
 int arbitrate()
 {
@@ -122,14 +129,14 @@ int sound_manager_set_active_device_changed_cb(sound_manager_active_device_chang
     if (callback == nullptr)
         return SOUND_MANAGER_ERROR_INVALID_PARAMETER;
     const std::scoped_lock lock(notifierMutex);
-    notifier.reset();
-    notifier = std::make_unique<RouteNotifier>(callback, user_data);
+    notifier().reset();
+    notifier() = std::make_unique<RouteNotifier>(callback, user_data);
     return SOUND_MANAGER_ERROR_NONE;
 }
 
 int sound_manager_unset_active_device_changed_cb(void)
 {
     const std::scoped_lock lock(notifierMutex);
-    notifier.reset();
+    notifier().reset();
     return SOUND_MANAGER_ERROR_NONE;
 }

@@ -1,8 +1,10 @@
 #include "RecorderFixture.h"
 
+#include <algorithm>
 #include <chrono>
 #include <cmath>
-#include <csignal>
+#include <cstdlib>
+#include <functional>
 #include <thread>
 
 using support::runFor;
@@ -12,10 +14,10 @@ namespace {
 
 constexpr size_t WINDOW = 2048;
 
-double correlation(const short* a, const short* b)
+double correlation(const short* a, const short* b, size_t count)
 {
     double ab = 0, aa = 0, bb = 0;
-    for (size_t i = 0; i < WINDOW; ++i) {
+    for (size_t i = 0; i < count; ++i) {
         ab += a[i] * static_cast<double>(b[i]);
         aa += a[i] * static_cast<double>(a[i]);
         bb += b[i] * static_cast<double>(b[i]);
@@ -24,12 +26,13 @@ double correlation(const short* a, const short* b)
 }
 
 // Where in the played noise a window of the recording comes from; -1 when nowhere near.
-long placeOf(const std::vector<short>& recorded, size_t at, const std::vector<short>& played, long from, long to)
+long placeOf(const short* window, size_t count, const std::vector<short>& played, long from, long to)
 {
     double best = 0.5;
     long place = -1;
-    for (long i = std::max(0L, from); i <= to && i + static_cast<long>(WINDOW) <= static_cast<long>(played.size()); ++i)
-        if (const double likeness = correlation(&recorded[at], &played[static_cast<size_t>(i)]); likeness > best) {
+    const long end = std::min(to, static_cast<long>(played.size() - count));
+    for (long i = std::max(0L, from); i <= end; ++i)
+        if (const double likeness = correlation(window, &played[static_cast<size_t>(i)], count); likeness > best) {
             best = likeness;
             place = i;
         }
@@ -61,57 +64,79 @@ TEST_F(RecorderTest, KeepsItsTimeLineToTheSampleOverManyPauses)
     EXPECT_EQ(0u, recorder.told.elapsed.front());
 }
 
-TEST_F(RecorderTest, JoinsAPauseWithoutGapOrRepetition)
-{
-    support::writeNoise(directory.file("noise.wav"), 10);
-    const auto voice = server.speak(directory.file("noise.wav"));
-    RecorderHandle recorder(temporary);
-    ASSERT_EQ(0, recorder.prepareAndStart());
-    ASSERT_TRUE(recorder.recordUntil(1000));
-    ASSERT_EQ(0, recorder_pause(recorder.handle));
-    const auto joint = recorder.told.elapsed.back();
-    runFor(0.7);
-    ASSERT_EQ(0, recorder_start(recorder.handle));
-    ASSERT_TRUE(recorder.recordUntil(2000));
-    ASSERT_EQ(0, recorder_commit(recorder.handle));
+// Compares recordings with the noise that was played while they ran. A loaded machine may tear the played noise itself,
+// so that a comparison has three attempts; a recorder that loses sound fails them all.
+class NoiseTest : public RecorderTest {
+protected:
+    static constexpr int ATTEMPTS = 3;
 
-    const auto played = support::decode(directory.file("noise.wav"));
-    const auto recorded = support::decode(temporary);
-    ASSERT_GT(recorded.size(), 80000u);
-    const long before = placeOf(recorded, 30000, played, 0, 120000) - 30000;
-    const long after = placeOf(recorded, 70000, played, 70000, 160000) - 70000;
-    // One jump of the length of the pause, both halves on their own line.
-    EXPECT_NEAR(0.7 * 44100, after - before, 0.15 * 44100);
-    EXPECT_EQ(before, placeOf(recorded, 38000, played, 38000 + before - 50, 38000 + before + 50) - 38000);
-    const size_t beyond = joint * 441 / 10 + 6000;
-    EXPECT_EQ(after,
-        placeOf(
-            recorded, beyond, played, static_cast<long>(beyond) + after - 50, static_cast<long>(beyond) + after + 50)
-            - static_cast<long>(beyond));
+    void record(const std::function<void(RecorderHandle&)>& session)
+    {
+        support::writeNoise(directory.file("noise.wav"), 8);
+        const auto voice = server.speak(directory.file("noise.wav"));
+        RecorderHandle recorder(temporary);
+        ASSERT_EQ(0, recorder.prepareAndStart());
+        ASSERT_TRUE(recorder.recordUntil(1000));
+        session(recorder);
+        ASSERT_EQ(0, recorder_commit(recorder.handle));
+        EXPECT_EQ(RECORDER_STATE_READY, recorder.state());
+        _played = support::decode(directory.file("noise.wav"));
+        _recorded = support::decode(temporary);
+    }
+    // How far the played noise is ahead of the recording there.
+    long lineAt(size_t at) const
+    {
+        return at + WINDOW <= _recorded.size()
+            ? placeOf(&_recorded[at], WINDOW / 8, _played, 0, 150000) - static_cast<long>(at)
+            : -1;
+    }
+    bool isOnLine(size_t at, long line) const
+    {
+        const long expected = static_cast<long>(at) + line;
+        return at + WINDOW <= _recorded.size()
+            && placeOf(&_recorded[at], WINDOW, _played, expected - 50, expected + 50) == expected;
+    }
+
+private:
+    std::vector<short> _played;
+    std::vector<short> _recorded;
+};
+
+TEST_F(NoiseTest, JoinsAPauseWithoutGapOrRepetition)
+{
+    bool isExact = false;
+    for (int attempt = 0; attempt < ATTEMPTS && !isExact; ++attempt) {
+        size_t joint = 0;
+        ASSERT_NO_FATAL_FAILURE(record([&](RecorderHandle& recorder) {
+            ASSERT_EQ(0, recorder_pause(recorder.handle));
+            joint = recorder.told.elapsed.back() * 441 / 10;
+            runFor(0.7);
+            ASSERT_EQ(0, recorder_start(recorder.handle));
+            ASSERT_TRUE(recorder.recordUntil(2000));
+        }));
+        const long before = lineAt(30000);
+        const long after = lineAt(70000);
+        // One jump of the length of the pause; both halves on their own line, close up to the joint.
+        isExact = std::abs(static_cast<double>(after - before) - 0.7 * 44100) < 0.15 * 44100
+            && isOnLine(joint - WINDOW, before) && isOnLine(joint + 6000, after);
+    }
+    EXPECT_TRUE(isExact);
 }
 
-TEST_F(RecorderTest, CommittedFileHasEverythingUpToTheStop)
+TEST_F(NoiseTest, CommittedFileHasEverythingUpToTheStop)
 {
-    support::writeNoise(directory.file("noise.wav"), 10);
-    const auto voice = server.speak(directory.file("noise.wav"));
-    RecorderHandle recorder(temporary);
-    ASSERT_EQ(0, recorder.prepareAndStart());
-    ASSERT_TRUE(recorder.recordUntil(1500));
-    ASSERT_EQ(0, recorder_pause(recorder.handle));
-    runFor(0.05);
-    const auto elapsed = recorder.told.elapsed.back();
-    ASSERT_EQ(0, recorder_commit(recorder.handle)); // while paused
-    EXPECT_EQ(RECORDER_STATE_READY, recorder.state());
-
-    const auto played = support::decode(directory.file("noise.wav"));
-    const auto recorded = support::decode(temporary);
-    // The decoder delivers the sound behind what the encoder worked ahead; its very last part is there.
-    const size_t last = elapsed * 441 / 10 + 1600 - WINDOW;
-    ASSERT_GE(recorded.size(), last + WINDOW);
-    const long line = placeOf(recorded, 30000, played, 0, 120000) - 30000;
-    EXPECT_EQ(line,
-        placeOf(recorded, last, played, static_cast<long>(last) + line - 50, static_cast<long>(last) + line + 50)
-            - static_cast<long>(last));
+    bool isExact = false;
+    for (int attempt = 0; attempt < ATTEMPTS && !isExact; ++attempt) {
+        size_t end = 0;
+        ASSERT_NO_FATAL_FAILURE(record([&](RecorderHandle& recorder) {
+            ASSERT_EQ(0, recorder_pause(recorder.handle)); // the commit comes while paused
+            runFor(0.05);
+            end = recorder.told.elapsed.back() * 441 / 10;
+        }));
+        // The decoder delivers the sound behind what the encoder worked ahead; its very last part is there.
+        isExact = isOnLine(end + 1600 - WINDOW, lineAt(20000));
+    }
+    EXPECT_TRUE(isExact);
 }
 
 TEST_F(RecorderTest, MeasuresTheInputLevel)

@@ -139,6 +139,24 @@ TEST_F(RescueTest, StartMovesALeftoverAside)
     EXPECT_EQ(2u, rescue(temporary).size());
 }
 
+TEST_F(RescueTest, TwoRecordersOfOneProcessDoNotShareAFile)
+{
+    RecorderHandle first(temporary);
+    RecorderHandle second(temporary);
+    ASSERT_EQ(0, first.prepareAndStart());
+    EXPECT_EQ(RECORDER_ERROR_INVALID_OPERATION, second.prepareAndStart());
+    EXPECT_EQ(RECORDER_ERROR_INVALID_STATE, recorder_release_temporary(temporary.c_str()));
+    ASSERT_TRUE(first.recordUntil(300));
+    ASSERT_EQ(0, recorder_commit(first.handle));
+    EXPECT_GE(probedDuration(temporary), 300);
+    // Saved or not, the first recording stays what it is.
+    ASSERT_EQ(0, recorder_start(second.handle));
+    EXPECT_EQ(0, recorder_cancel(second.handle));
+    const auto found = rescue(temporary);
+    ASSERT_EQ(1u, found.size());
+    EXPECT_GE(probedDuration(found[0].path), 300);
+}
+
 TEST_F(RescueTest, ReleasedRecordingLeavesNoTrace)
 {
     RecorderHandle recorder(temporary);

@@ -174,7 +174,7 @@ void PulseServer::kill() { _daemon.end(SIGKILL); }
 
 ChildProcess PulseServer::speak(const std::string& wav) const
 {
-    return ChildProcess({"paplay", "--latency-msec=20", "--device=mic", wav});
+    return ChildProcess({"paplay", "--latency-msec=150", "--device=mic", wav});
 }
 
 ChildProcess PulseServer::playAs(const std::string& role, const std::string& wav) const
