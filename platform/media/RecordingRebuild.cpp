@@ -63,24 +63,24 @@ namespace {
 
     JournalFrames withoutLast(JournalFrames frames, uint16_t size) { return {frames.count - 1, frames.bytes - size}; }
 
-JournalFrames dropBlankTail(int file, int journal, JournalFrames frames)
-{
-    constexpr off_t TORN_END = 8;
-    uint16_t size = 0;
-    for (bool isTorn = false; frames.count > 0 && readAt(journal, &size, 2, journalSize(frames.count - 1));) {
-        const off_t end = static_cast<off_t>(MP4_DATA_START + frames.bytes);
-        if (isBlank(file, end - size, end))
-            isTorn = true;
-        else if (isTorn && size > TORN_END && isBlank(file, end - TORN_END, end))
-            return withoutLast(frames, size); // the blank stretch begins in it
-        else
-            break;
-        frames = withoutLast(frames, size);
+    JournalFrames dropBlankTail(int file, int journal, JournalFrames frames)
+    {
+        constexpr off_t TORN_END = 8;
+        uint16_t size = 0;
+        for (bool isTorn = false; frames.count > 0 && readAt(journal, &size, 2, journalSize(frames.count - 1));) {
+            const off_t end = static_cast<off_t>(MP4_DATA_START + frames.bytes);
+            if (isBlank(file, end - size, end))
+                isTorn = true;
+            else if (isTorn && size > TORN_END && isBlank(file, end - TORN_END, end))
+                return withoutLast(frames, size); // the blank stretch begins in it
+            else
+                break;
+            frames = withoutLast(frames, size);
+        }
+        return frames;
     }
-    return frames;
-}
 
-RebuildResult resultOf(int error, recorder_file_format_e format)
+    RebuildResult resultOf(int error, recorder_file_format_e format)
     {
         return {error == 0 ? Rebuild::COMPLETE : Rebuild::FAILED, format, error};
     }
