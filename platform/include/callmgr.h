@@ -2,7 +2,7 @@
 #pragma once
 
 typedef struct cm_client_s* cm_client_h;
-enum cm_call_status_e { CM_CALL_STATUS_IDLE = 0 };
+enum cm_call_status_e : int { CM_CALL_STATUS_IDLE = 0 };
 
 extern "C" {
 int cm_init(cm_client_h* client);

@@ -152,7 +152,7 @@ TEST_F(HostTest, PowerLocksAreInhibitorsOfLogindAndScreenSaver)
 
     EXPECT_EQ(0, device_power_request_lock(POWER_LOCK_CPU, 50)); // for a while
     EXPECT_TRUE(runUntil([] { return heldLocks().empty(); }));
-    EXPECT_NE(0, device_power_request_lock(static_cast<power_lock_e>(9), 0));
+    EXPECT_NE(0, device_power_request_lock(static_cast<power_lock_e>(3), 0));
     EXPECT_NE(0, device_power_request_lock(POWER_LOCK_CPU, -1));
 
     host::LogindWatch watch(sink());
