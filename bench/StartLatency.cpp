@@ -10,7 +10,7 @@
 
 namespace {
 
-constexpr int ROUNDS = 9;
+constexpr int ROUNDS = 25;
 
 GstPadProbeReturn firstSampleCb(GstPad*, GstPadProbeInfo*, gpointer arrived)
 {

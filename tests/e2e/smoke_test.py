@@ -1,0 +1,138 @@
+#!/usr/bin/env python3
+"""smoke_test.py ROOT BIN CASE: drives the real recorder in a real window on a virtual display, as its user would."""
+import glob
+import os
+import signal
+import subprocess
+import sys
+import time
+
+ROOT, BIN, CASE = sys.argv[1:4]
+sys.path.insert(0, os.path.join(ROOT, "tools"))
+from virtual_place import Place  # noqa: E402
+
+
+def check(condition, what):
+    if not condition:
+        raise AssertionError(what)
+
+
+def start_recorder(place):
+    recorder = place.start(os.path.join(BIN, "mewlo-lite"))
+    place.wait_for("the window", place.window, 30)
+    place.wait_for("the ready recorder", lambda: place.recorder_state() == "1")
+    time.sleep(0.5)  # the first frame; before it the window takes no clicks
+    return recorder
+
+
+def start_recording(place):
+    place.big_button()
+    place.wait_for("the recording", lambda: place.recorder_state() == "2")
+
+
+def recordings(place):
+    """(path, milliseconds, bookmarks) of each, newest first."""
+    rows = [line.split("\t") for line in place.tool("list").splitlines()]
+    return [(path, int(duration), int(bookmarks)) for path, duration, bookmarks in rows]
+
+
+def decoded_ms(path):
+    raw = subprocess.run(["ffmpeg", "-v", "error", "-i", path, "-f", "s16le", "-ac", "1", "-ar", "8000", "-"],
+                         stdin=subprocess.DEVNULL, capture_output=True, check=True).stdout
+    check(max(abs(b - 128) for b in raw[1::2]) > 0 and raw.strip(b"\0"), f"{path} is silent")
+    return len(raw) // 16
+
+
+def record_pause_bookmark_stop(place):
+    start_recorder(place)
+    place.make_noise(20)
+    start_recording(place)
+    began = time.time()
+    time.sleep(1.2)
+    place.click(250, 883)  # bookmark
+    time.sleep(0.6)
+    place.call("xdotool", "key", "space")  # pause
+    place.wait_for("the pause", lambda: place.recorder_state() == "3")
+    recorded = time.time() - began
+    time.sleep(1.5)
+    place.click(750, 883)  # resume
+    place.wait_for("the resumed recording", lambda: place.recorder_state() == "2")
+    began = time.time()
+    time.sleep(1)
+    place.call("xdotool", "key", "Return")  # stop
+    place.wait_for("the end", lambda: place.recorder_state() == "1")
+    recorded += time.time() - began
+    place.wait_for("the row", lambda: len(recordings(place)) == 1)
+    path, duration, bookmarks = recordings(place)[0]
+    check(bookmarks == 1, "one bookmark")
+    check(os.path.basename(path) == "Voice 001.m4a", path)
+    check(abs(decoded_ms(path) - recorded * 1000) < 900, f"{decoded_ms(path)} ms of {recorded * 1000:.0f}")
+    check(abs(decoded_ms(path) - duration) < 100, "the row tells the length of the file")
+    check(not glob.glob(place.env["MEWLO_DEVICE_ROOT"] + "/.mw_*"), "nothing is left beside it")
+
+
+def killed_recorder_loses_nothing(place):
+    recorder = start_recorder(place)
+    place.make_noise(20)
+    start_recording(place)
+    began = time.time()
+    time.sleep(1.5)
+    place.click(250, 883)
+    time.sleep(1.5)
+    recorder.send_signal(signal.SIGKILL)
+    recorder.wait()
+    recorded = (time.time() - began) * 1000
+    place.start(os.path.join(BIN, "mewlo-lite"))
+    place.wait_for("the rescued recording", lambda: len(recordings(place)) == 1, 20)
+    path, _, bookmarks = recordings(place)[0]
+    check(bookmarks == 1, "its bookmark")
+    check(recorded - decoded_ms(path) < 1000, f"{decoded_ms(path)} ms of {recorded:.0f}")
+
+
+def minimised_goes_on_and_close_saves(place):
+    recorder = start_recorder(place)
+    place.make_noise(20)
+    start_recording(place)
+    window = place.window()
+    place.call("xdotool", "windowminimize", window)
+    time.sleep(1.5)
+    check(place.recorder_state() == "2", "a minimised recorder goes on")
+    recorder.send_signal(signal.SIGTERM)
+    check(recorder.wait(15) == 0, "ended in order")
+    place.wait_for("the saved recording", lambda: len(recordings(place)) == 1)
+    check(decoded_ms(recordings(place)[0][0]) > 1300, "all of it")
+
+
+def request_returns_a_path(place):
+    request = place.start(os.path.join(BIN, "mewlo-tool"), "request", "--mime", "audio/AMR", "--max-kb", "100",
+                          stdout=subprocess.PIPE, text=True)
+    place.wait_for("the window", place.window, 30)
+    time.sleep(1)
+    place.make_noise(20)
+    place.big_button()
+    temporary = place.env["MEWLO_DEVICE_ROOT"] + "/.mw_temp"
+    place.wait_for("the recording", lambda: os.path.exists(temporary))
+    time.sleep(1.5)
+    place.call("xdotool", "windowminimize", place.window())
+    path = request.communicate(timeout=20)[0].strip()
+    check(request.returncode == 0, "status 0")
+    check(path.endswith(".amr") and decoded_ms(path) > 1000, path)
+    small = subprocess.run([os.path.join(BIN, "mewlo-tool"), "request", "--max-kb", "2"], env=place.env, capture_output=True,
+                           text=True, timeout=30)
+    check(small.returncode == 1 and "min_size_error" in small.stderr, small.stderr)
+
+
+def main():
+    place = Place(BIN)
+    try:
+        globals()[CASE](place)
+    except (AssertionError, TimeoutError) as error:
+        print(f"{CASE}: {error}", file=sys.stderr)
+        if place.window():
+            place.call("import", "-window", "root", f"/tmp/{CASE}.png")
+        sys.exit(1)
+    finally:
+        place.end()
+
+
+main()
