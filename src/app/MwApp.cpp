@@ -2,6 +2,7 @@
 
 #include <Elementary.h>
 #include <media_content.h>
+#include <notification.h>
 #include <panekit/WLanguage.h>
 #include <panekit/WNaviframeController.h>
 #include <panekit/WPopupController.h>
@@ -15,6 +16,7 @@
 #include <string>
 
 #include "MwAppController.h"
+#include "MwHandle.h"
 #include "MwLog.h"
 #include "MwModel.h"
 #include "MwRecorder.h"
@@ -30,6 +32,7 @@ namespace {
 
 constexpr auto TEXT_DOMAIN = "mewlo-lite";
 constexpr auto WINDOW_NAME = "com.tovanic.mewlo-lite";
+constexpr auto FILE_MANAGER_APP_ID = "com.tovanic.setting.storage";
 constexpr int WINDOW_TYPE = 1;
 constexpr double BASE_SCALE = 2.6;
 constexpr int INDICATOR_SHOWN = 2, INDICATOR_TRANSPARENT = 3;
@@ -38,6 +41,17 @@ constexpr auto STOP_PREFERENCE = "MainRecordingStopRequest";
 constexpr int SMALLEST_REFUSED_LIMIT = 2; // kilobytes
 constexpr int LOWEST_ALLOWED_BATTERY = 2;
 constexpr std::array<const char*, 2> THEME_EXTENSIONS = {"edje/MwGenlist.edj", "edje/MwButton.edj"};
+
+void showFolder(const std::string& directory)
+{
+    MwHandle<app_control_h, app_control_destroy> request;
+    if (!MW_CALL(app_control_create, request.out()))
+        return;
+    MW_CALL(app_control_set_app_id, request.get(), FILE_MANAGER_APP_ID);
+    MW_CALL(app_control_set_uri, request.get(), ("file://" + directory).c_str());
+    MW_CALL(app_control_set_launch_mode, request.get(), APP_CONTROL_LAUNCH_MODE_GROUP);
+    MW_CALL(app_control_send_launch_request, request.get(), nullptr, nullptr);
+}
 
 template <typename Apply>
 void forEachThemeExtension(Apply apply)
@@ -119,6 +133,7 @@ bool MwApp::_createWindow()
         return false;
     }
     Evas_Object* window = getWindow()->getEvasObject();
+    elm_win_title_set(window, mwTranslate("IDS_MW_APP_NAME").c_str());
     elm_win_wm_rotation_preferred_rotation_set(window, 0);
     elm_win_indicator_mode_set(window, static_cast<Elm_Win_Indicator_Mode>(INDICATOR_SHOWN));
     elm_win_indicator_opacity_set(window, static_cast<Elm_Win_Indicator_Opacity_Mode>(INDICATOR_TRANSPARENT));
@@ -228,11 +243,21 @@ void MwApp::_launchFirst()
     _watchesStopRequests = MW_CALL(preference_set_changed_cb, STOP_PREFERENCE, _recordingStopRequestCb, this);
 }
 
-// The one place that says what opens after a stop. Every recording is saved; the recorder is ready for the next one.
+// The one place that says what opens after a stop and for the recordings button. After a stop the recorder is ready for
+// the next recording and says what it saved; the button shows the recordings in the desktop's file manager.
 void MwApp::_openRecordings()
 {
-    if (_appController)
+    const std::string saved = _appController->getLastSavedPath();
+    if (saved != _shownPath) {
+        _shownPath = saved;
+        const std::string name = saved.substr(saved.rfind('/') + 1);
+        notification_status_message_post(
+            mwFormat("%s %s", name.substr(0, name.rfind('.')).c_str(), mwTranslate("IDS_MW_POP_SAVED").c_str())
+                .c_str());
         _appController->getRecorderUpdatedSignal().emit();
+        return;
+    }
+    showFolder(_model->getRecordingsDirectory());
 }
 
 bool MwApp::_lastItemPopped()

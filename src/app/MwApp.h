@@ -5,6 +5,7 @@
 #include <uxt_theme.h>
 
 #include <memory>
+#include <string>
 
 class MwAppController;
 class MwModel;
@@ -59,4 +60,5 @@ private:
     panekit::WPopupController* _mainAppRecordingPopup = nullptr;
     std::unique_ptr<MwRecordingRescue> _rescue;
     bool _watchesStopRequests = false;
+    std::string _shownPath; // the recording last told of as saved
 };

@@ -242,8 +242,7 @@ bool MwAppController::_saveRecordingFile()
             MW_LOGE("move temp recording file failed!");
             return false;
         }
-        path = mwFormat("%s/%s_%03d%s", _model->getRecordingsDirectory().c_str(), name.c_str(), counter,
-            _model->getFileExtension());
+        path = _model->getRecordingPath(name, counter);
     }
     _lastSavedPath = path;
     std::string mediaId;

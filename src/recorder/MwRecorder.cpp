@@ -104,7 +104,8 @@ bool MwRecorder::start(ErrorType& error)
         MW_LOGE("model is nullptr");
         return false;
     }
-    if (!_isInState(RECORDER_STATE_CREATED, RECORDER_STATE_CREATED, "start") || !_setAttributes())
+    if (!_isInState(RECORDER_STATE_CREATED, RECORDER_STATE_CREATED, "can't start in current fw state")
+        || !_setAttributes())
         return false;
     if (const int result = recorder_prepare(_handle);
         !mwSucceeded(result, "recorder_prepare", __FILE_NAME__, __func__, __LINE__)) {
@@ -141,7 +142,7 @@ bool MwRecorder::_setAttributes()
 }
 
 // Whether the service recorder is in one of two states; logs the refusal of the action otherwise.
-bool MwRecorder::_isInState(recorder_state_e first, recorder_state_e second, const char* action) const
+bool MwRecorder::_isInState(recorder_state_e first, recorder_state_e second, const char* refusal) const
 {
     if (_handle == nullptr) {
         MW_LOGE("_handle is nullptr");
@@ -151,27 +152,29 @@ bool MwRecorder::_isInState(recorder_state_e first, recorder_state_e second, con
     if (!_getState(state))
         return false;
     if (state != first && state != second)
-        MW_LOGE("can't %s in current fw state[%d]", action, state);
+        MW_LOGE("%s[%d]", refusal, state);
     return state == first || state == second;
 }
 
 bool MwRecorder::pause()
 {
     MW_LOGW("BEGIN");
-    return _isInState(RECORDER_STATE_RECORDING, RECORDER_STATE_RECORDING, "pause") && MW_CALL(recorder_pause, _handle);
+    return _isInState(RECORDER_STATE_RECORDING, RECORDER_STATE_RECORDING, "can't pause in current fw state")
+        && MW_CALL(recorder_pause, _handle);
 }
 
 bool MwRecorder::resume()
 {
     MW_LOGW("BEGIN");
-    return _isInState(RECORDER_STATE_PAUSED, RECORDER_STATE_PAUSED, "resume") && MW_CALL(recorder_start, _handle);
+    return _isInState(RECORDER_STATE_PAUSED, RECORDER_STATE_PAUSED, "can't resume in current fw state")
+        && MW_CALL(recorder_start, _handle);
 }
 
 bool MwRecorder::cancel()
 {
     MW_LOGW("BEGIN");
-    return _isInState(RECORDER_STATE_RECORDING, RECORDER_STATE_PAUSED, "cancel") && MW_CALL(recorder_cancel, _handle)
-        && MW_CALL(recorder_unprepare, _handle);
+    return _isInState(RECORDER_STATE_RECORDING, RECORDER_STATE_PAUSED, "can't cancel in current fw state")
+        && MW_CALL(recorder_cancel, _handle) && MW_CALL(recorder_unprepare, _handle);
 }
 
 bool MwRecorder::stop()

@@ -51,7 +51,7 @@ private:
     bool _setCallbacks();
     bool _unsetCallbacks();
     bool _setAttributes();
-    bool _isInState(recorder_state_e first, recorder_state_e second, const char* action) const;
+    bool _isInState(recorder_state_e first, recorder_state_e second, const char* refusal) const;
     bool _getState(recorder_state_e& state) const;
     double _getAudioLevel() const;
 
