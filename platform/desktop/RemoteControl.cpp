@@ -6,6 +6,7 @@
 #include "state/MainLoop.h"
 #include "state/Trees.h"
 
+#include <atomic>
 #include <utility>
 
 namespace platform {
@@ -120,18 +121,29 @@ void RemoteControl::_update()
 
 using platform::RemoteControl;
 
-// The command worker reserves keys, too; it must not wait for the main loop.
+// The command worker reserves keys, too, and must not wait for the main loop. A release that overtakes a reservation
+// on its way cancels it: its receiver may be gone.
+namespace {
+
+std::atomic<uint64_t> lastOrder{0};
+
+}
+
 int media_key_reserve(media_key_event_cb callback, void* user_data)
 {
     constexpr int INVALID_PARAMETER = -22;
     if (callback == nullptr)
         return INVALID_PARAMETER;
-    platform::onMainLoop([=] { RemoteControl::instance().reserve(callback, user_data); });
+    platform::onMainLoop([callback, user_data, order = ++lastOrder] {
+        if (order == lastOrder)
+            RemoteControl::instance().reserve(callback, user_data);
+    });
     return 0;
 }
 
 int media_key_release(void)
 {
+    ++lastOrder;
     platform::onMainLoop([] { RemoteControl::instance().release(); });
     return 0;
 }

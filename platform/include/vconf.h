@@ -9,6 +9,10 @@
 #define VCONFKEY_SYSMAN_EARJACK "memory/sysman/earjack"
 #define VCONFKEY_CALL_RECORDING_REJECT "memory/call/recording_reject"
 #define VCONFKEY_SYSMAN_BATTERY_STATUS_LOW "memory/sysman/battery_status_low"
+// Written by the application: what it records (recorder states 0 none, 1 ready, 2 recording, 3 paused) and the name of
+// what is recorded or played. Remote controls show them, and the shut-down waits for a recording.
+#define VCONFKEY_MEWLO_RECORDER_STATE "memory/mewlo/recorder_state"
+#define VCONFKEY_MEWLO_TITLE "memory/mewlo/title"
 
 typedef struct keynode_s keynode_t;
 typedef void (*vconf_callback_fn)(keynode_t* node, void* user_data);

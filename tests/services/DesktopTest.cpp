@@ -141,6 +141,16 @@ TEST_F(MprisTest, AReceiverMayReleaseTheKeysInItsCallback)
     EXPECT_NE(0, media_key_reserve(nullptr, nullptr));
 }
 
+TEST_F(MprisTest, AReleaseCancelsAReservationOnItsWay)
+{
+    std::thread([this] { media_key_reserve([](media_key_e, media_key_event_e, void*) {}, &_events); }).join();
+    media_key_release();
+    support::runFor(0.05);
+    EXPECT_EQ("", playerctl({"--list-all"}));
+    std::thread([this] { media_key_reserve([](media_key_e, media_key_event_e, void*) {}, &_events); }).join();
+    EXPECT_TRUE(runUntil([&] { return playerctl({"--list-all"}) == "mewlo_lite"; }));
+}
+
 TEST_F(MprisTest, LosesItsBusWithoutHarm)
 {
     reserve();
