@@ -95,16 +95,14 @@ std::string mp4FileHead(uint64_t dataBytes)
     return type + box("free", "") + u32(dataBytes + 8) + "mdat";
 }
 
-std::string mp4IndexHead(const Mp4Track& track, uint64_t frames, uint64_t dataBytes)
+std::string mp4IndexHead(const Mp4Track& track, uint64_t frames)
 {
     const uint64_t tail = 4 * frames;
     const uint64_t duration = frames * AAC_FRAME_SAMPLES;
-    const bool isFar = MP4_DATA_START + dataBytes > 0xFFFFFFFFu;
     const std::string tables = sampleDescription(track)
         + box("stts", u32(0) + u32(1) + u32(frames) + u32(AAC_FRAME_SAMPLES))
         + box("stsc", u32(0) + u32(1) + u32(1) + u32(frames) + u32(1))
-        + box(isFar ? "co64" : "stco", u32(0) + u32(1) + (isFar ? u64(MP4_DATA_START) : u32(MP4_DATA_START)))
-        + box("stsz", u32(0) + u32(0) + u32(frames), tail);
+        + box("stco", u32(0) + u32(1) + u32(MP4_DATA_START)) + box("stsz", u32(0) + u32(0) + u32(frames), tail);
     const std::string self = box("url ", u32(1));
     const std::string information
         = box("smhd", zeros(8)) + box("dinf", box("dref", u32(0) + u32(1) + self)) + box("stbl", tables, tail);

@@ -23,8 +23,9 @@ constexpr uint64_t MP4_UNFINISHED = ~uint64_t{0};
 std::string aacDecoderConfig(uint32_t sampleRate, uint16_t channels);
 // The first MP4_DATA_START bytes. Takes the 64-bit form above 4 GiB; MP4_UNFINISHED while the size is unknown.
 std::string mp4FileHead(uint64_t dataBytes);
-// The "moov" box up to its last table, whose `frames` 32-bit big-endian frame sizes have to follow.
-std::string mp4IndexHead(const Mp4Track& track, uint64_t frames, uint64_t dataBytes);
+// The "moov" box up to its last table, whose `frames` 32-bit big-endian frame sizes have to follow. All
+// frames are one chunk at the beginning of the data, so that its place never needs more than 32 bits.
+std::string mp4IndexHead(const Mp4Track& track, uint64_t frames);
 // An upper bound of head, frames and index together.
 uint64_t mp4FileSize(uint64_t frames, uint64_t dataBytes);
 

@@ -146,7 +146,7 @@ namespace {
 int finishMp4(int file, int journal, JournalHeader header, const JournalFrames& frames)
 {
     const off_t end = static_cast<off_t>(MP4_DATA_START + frames.bytes);
-    const std::string index = mp4IndexHead(header.track(), frames.count, frames.bytes);
+    const std::string index = mp4IndexHead(header.track(), frames.count);
     const std::string head = mp4FileHead(frames.bytes);
     if (ftruncate(file, end) != 0)
         return errno;

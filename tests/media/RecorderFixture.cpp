@@ -101,8 +101,10 @@ std::vector<Leftover> rescue(const std::string& temporaryPath)
 double probedDuration(const std::string& path)
 {
     // The prober guesses at AMR, whose frames of ours are all of one size.
-    if (const std::string content = support::readFile(path); content.starts_with("#!AMR"))
-        return static_cast<double>(content.size() - 6) / 32 * 20;
+    char magic[6] = {};
+    std::ifstream(path, std::ios::binary).read(magic, sizeof magic);
+    if (std::string(magic, 5) == "#!AMR")
+        return static_cast<double>(std::filesystem::file_size(path) - 6) / 32 * 20;
     const std::string seconds = outputOf("ffprobe -v error -show_entries format=duration -of csv=p=0 '" + path + "'");
     return seconds.empty() ? -1 : std::atof(seconds.c_str()) * 1000;
 }

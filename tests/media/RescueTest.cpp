@@ -282,6 +282,51 @@ TEST_F(RescueTest, FinishesAMoveThatWasCutOff)
     }
 }
 
+TEST_F(RescueTest, IsDoneOnceWhenTwoAreAtIt)
+{
+    recordAndKill("aac", 20000);
+    static std::string path;
+    path = temporary;
+    static int others;
+    others = -1;
+    const int count = recorder_rescue_leftovers(
+        temporary.c_str(),
+        [](recorder_leftover_e, const char*, recorder_file_format_e, int, const char*, void*) {
+            // As another process would, while this one moves the file to its place.
+            others = recorder_rescue_leftovers(path.c_str(), nullptr, nullptr);
+        },
+        nullptr);
+    EXPECT_EQ(1, count);
+    EXPECT_EQ(0, others);
+    EXPECT_EQ(1u, rescue(temporary).size());
+}
+
+TEST_F(RescueTest, RebuildsBeyondFourGigabytes)
+{
+    // Most of the file is a hole; a real last frame keeps the end from being taken for unwritten.
+    constexpr uint64_t FRAMES = 3600000;
+    constexpr uint64_t FRAME_BYTES = 1400;
+    recordAndKill("aac", 20000);
+    const std::string journal = readFile(temporary + ".idx");
+    std::string sizes;
+    for (uint64_t i = 0; i < FRAMES; ++i)
+        sizes += std::string("\x78\x05", 2);
+    writeFile(temporary + ".idx", journal.substr(0, 56) + sizes);
+    std::filesystem::resize_file(temporary, 48);
+    std::filesystem::resize_file(temporary, 48 + FRAMES * FRAME_BYTES);
+    std::fstream(temporary, std::ios::in | std::ios::out | std::ios::binary).seekp(-1, std::ios::end) << '\xE0';
+
+    const auto found = rescue(temporary);
+    ASSERT_EQ(1u, found.size());
+    EXPECT_EQ(RECORDER_LEFTOVER_REBUILT, found[0].outcome);
+    EXPECT_EQ(static_cast<int>(FRAMES * 1024 * 1000 / 44100), found[0].duration);
+    EXPECT_NEAR(found[0].duration, probedDuration(found[0].path), 10);
+    const std::string places = support::outputOf(
+        "ffprobe -v error -show_entries packet=pos -of csv=p=0 -read_intervals 83580% '" + found[0].path + "'");
+    const std::string last = std::to_string(48 + (FRAMES - 1) * FRAME_BYTES);
+    EXPECT_NE(std::string::npos, places.find(last)) << "the last frame is where it was written";
+}
+
 TEST_F(RescueTest, RescuesAmrWithoutItsJournal)
 {
     recordAndKill("amr", 3200);
