@@ -17,8 +17,9 @@ namespace {
     constexpr auto FILE_SOURCE = "filesrc name=file ! ";
     constexpr auto SPEAKER = " ! audioconvert ! audioresample ! "
                              "pulsesink name=speaker client-name=Mewlo stream-properties=props,media.role=music";
+    constexpr auto AAC_CHAIN = "qtdemux ! aacparse ! avdec_aac";
     constexpr auto ANY_DECODER = "decodebin";
-    constexpr GstClockTime PREROLL = 5 * GST_SECOND;
+    constexpr GstClockTime PREROLL = 3 * GST_SECOND;
 
     // The explicit chain steps over a damaged stretch and is there in a fraction of the time.
     std::vector<std::string> chainsFor(const std::string& path)
@@ -26,7 +27,11 @@ namespace {
         const FileDescriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC));
         switch (file ? kindOf(file.get()) : FileKind::UNKNOWN) {
         case FileKind::MP4:
-            return {"qtdemux ! aacparse ! avdec_aac", ANY_DECODER};
+            // Other codecs in a sound file may still play; the decoder's choice takes seconds to give up on a damaged
+            // one.
+            if (!durationOf(file.get()))
+                return {AAC_CHAIN};
+            return {AAC_CHAIN, ANY_DECODER};
         case FileKind::AMR:
             return {"amrparse ! amrnbdec"};
         case FileKind::UNKNOWN:

@@ -38,6 +38,7 @@ class MetadataTest : public SourceTest {
 protected:
     int durationOfContent(const std::string& content)
     {
+        std::filesystem::remove(directory.file("file")); // writing over it would wait for the disk
         support::writeFile(directory.file("file"), content);
         return durationOf(directory.file("file"));
     }
