@@ -134,8 +134,8 @@ TEST_F(MprisTest, AReceiverMayReleaseTheKeysInItsCallback)
                 media_key_release();
             },
             nullptr));
-    playerctl({"stop"});
-    EXPECT_TRUE(runUntil([] { return calls == 1; }));
+    const std::string answer = playerctl({"stop"});
+    EXPECT_TRUE(runUntil([] { return calls == 1; })) << calls << " calls, " << answer;
     support::runFor(0.05);
     EXPECT_EQ(1, calls);
     EXPECT_NE(0, media_key_reserve(nullptr, nullptr));

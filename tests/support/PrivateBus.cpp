@@ -4,7 +4,6 @@
 
 #include <chrono>
 #include <csignal>
-#include <filesystem>
 #include <functional>
 #include <memory>
 #include <thread>
@@ -114,7 +113,8 @@ PrivateBus::PrivateBus(BusKind kind)
     _daemon = std::make_unique<Program>(
         std::vector<std::string>{"dbus-daemon", "--nofork", "--config-file=" + _directory.file("bus.conf")});
     _address = "unix:path=" + socket;
-    waitFor([&] { return std::filesystem::exists(socket); }, 20.0);
+    // The socket appears before anybody listens on it.
+    waitFor([&] { return isOwned(_address, "org.freedesktop.DBus"); }, 20.0);
     const char* before = ::getenv(_variable);
     _before = before != nullptr ? before : "";
     ::setenv(_variable, _address.c_str(), 1);
