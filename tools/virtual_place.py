@@ -43,8 +43,13 @@ class Place:
         read, write = os.pipe()
         self.start("Xvfb", "-displayfd", str(write), "-screen", "0", "1000x900x24", "-nolisten", "tcp", pass_fds=(write,))
         self.env["DISPLAY"] = ":" + os.read(read, 16).decode().strip()
-        self.start("openbox")
-        self.wait_for("the window manager", lambda: "window id" in self.call("xprop", "-root", "_NET_SUPPORTING_WM_CHECK"))
+        manager = [self.start("openbox")]
+
+        def managed():
+            if manager[0].poll() is not None:  # lost a race for the new display
+                manager[0] = self.start("openbox")
+            return "window id" in self.call("xprop", "-root", "_NET_SUPPORTING_WM_CHECK")
+        self.wait_for("the window manager", managed, 30)
 
     def _sound(self):
         runtime = self.env["XDG_RUNTIME_DIR"]

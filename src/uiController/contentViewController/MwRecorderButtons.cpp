@@ -50,6 +50,8 @@ void MwRecorderContentViewController::_createButton(const ButtonLook& look, Evas
     if (look.label)
         elm_object_domain_translatable_part_text_set(button, LABEL_PART, textdomain(nullptr), look.label);
     panekit::setAccessibleName(button, look.accessibleName);
+    // A click or touch leaves the keyboard with the big button, so that Space and Return go on meaning what they do.
+    elm_object_focus_move_policy_set(button, ELM_FOCUS_MOVE_POLICY_KEY_ONLY);
     evas_object_smart_callback_add(button, "clicked", clicked, this);
     evas_object_show(button);
 }
