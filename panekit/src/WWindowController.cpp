@@ -10,6 +10,7 @@
 #include <Elementary.h>
 
 #include <app.h>
+#include <dlog.h>
 #include <eext_event.h>
 #include <panekit/WNaviframeController.h>
 
@@ -33,6 +34,13 @@ namespace {
         const std::string theme = std::string(resources ? resources.get() : "") + "edje/MwTheme.edj";
         if (std::filesystem::exists(theme))
             elm_theme_overlay_add(nullptr, theme.c_str());
+    }
+
+    // A line for whoever measures the start.
+    void firstFrameCb(void*, Evas* canvas, void*)
+    {
+        evas_event_callback_del(canvas, EVAS_CALLBACK_RENDER_POST, firstFrameCb);
+        __dlog_print(LOG_ID_MAIN, DLOG_INFO, "PANEKIT", "first frame");
     }
 
     void applyDesktopScale()
@@ -109,6 +117,7 @@ bool WWindowController::create()
     _applySize();
     _watchVisibility();
     ui_app_set_window(_window);
+    evas_event_callback_add(evas_object_evas_get(_window), EVAS_CALLBACK_RENDER_POST, firstFrameCb, nullptr);
     evas_object_show(_window);
     return true;
 }

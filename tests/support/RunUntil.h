@@ -14,7 +14,7 @@ inline bool runUntil(const std::function<bool()>& condition, double limit = 5.0)
     const double end = ecore_time_get() + limit;
     bool met = condition();
     while (!met && ecore_time_get() < end) {
-        ecore_main_loop_iterate();
+        ecore_main_loop_iterate_may_block(EINA_TRUE);
         met = condition();
     }
     ecore_timer_del(tick);
