@@ -40,7 +40,7 @@ set(MEWLO_LAYOUT_IMAGES
   look/back.png back 56
   look/bookmark.png bookmark 44
   look/call_rejected.png call_rejected 52
-  look/circle_hairline.png circle_hairline 600
+  look/circle_hairline.png circle_hairline 400
   look/circle_outline.png circle_outline 200
   look/close.png close 56
   look/disc.png disc 200

@@ -22,7 +22,14 @@ namespace {
 
 }
 
-WContentViewController::~WContentViewController() = default;
+// A popup that outlives the screen for a moment, while their window goes, must not report to it any more.
+WContentViewController::~WContentViewController()
+{
+    if (_popup)
+        _popup->_setOnDetached(nullptr);
+    if (_menu)
+        _menu->_setOnDetached(nullptr);
+}
 
 const char* WContentViewController::getClassName() const { return "WContentViewController"; }
 

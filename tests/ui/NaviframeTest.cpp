@@ -163,7 +163,9 @@ TEST_F(NaviframeTest, TheWindowTakesItsScreensWithIt)
     Events first;
     Events second;
     push(first);
-    push(second);
+    auto* menu = new WMenuPopupController;
+    menu->create(_window, _naviframe->getEvasObject());
+    push(second)->attachPopup(menu); // ends after its screen
     evas_object_del(std::exchange(_window, nullptr));
     ASSERT_TRUE(support::runUntil([&] { return first.destroyed == 1 && second.destroyed == 1; }));
 }

@@ -88,10 +88,12 @@ void MwRecorderContentViewController::_listen()
         [this](MwSignalMgr::LifeCycle lifeCycle) { _lifeCycleChanged(lifeCycle); });
     _systemInfoListener = signals->getSystemInfoSignal().addListener(
         [this](MwSignalMgr::SystemInfo info) { _systemInfoChanged(info); });
-    _recorderUpdatedListener = getAppController()->getRecorderUpdatedSignal().addListener([this] {
+    // Goes with the view, or with the controller when that ends first.
+    const auto updated = [this] {
         MW_LOGW("recorder update signal");
         _updateContentView();
-    });
+    };
+    getAppController()->getRecorderUpdatedSignal().addListener(updated, getEvasObject());
     setBackKeyHandler([this] { _backKeyClicked(); });
 }
 
@@ -99,8 +101,6 @@ void MwRecorderContentViewController::_listen()
 // window.
 void MwRecorderContentViewController::_stopListening()
 {
-    if (_recorderUpdatedListener != 0)
-        forget(getAppController()->getRecorderUpdatedSignal(), _recorderUpdatedListener);
     MwSignalMgr* signals = MwSignalMgr::existing();
     if (!signals)
         return;

@@ -146,5 +146,4 @@ private:
     panekit::WPopupController* _discardPopup = nullptr; // deletes itself
     unsigned int _lifeCycleListener = 0;
     unsigned int _systemInfoListener = 0;
-    unsigned int _recorderUpdatedListener = 0;
 };
