@@ -32,7 +32,8 @@ typedef void (*media_content_db_updated_cb)(media_content_error_e error, int pid
     char* uuid, char* path, char* mime, void* user_data);
 
 extern "C" {
-// Connections are counted. A damaged database is set aside under another name and rebuilt from the files.
+// Connections are counted. The database is opened in the background; a database that cannot be opened fails the calls
+// that need it. A damaged database is set aside under another name and rebuilt from the files.
 int media_content_connect(void);
 int media_content_disconnect(void);
 int media_content_set_db_updated_cb(media_content_db_updated_cb callback, void* user_data);

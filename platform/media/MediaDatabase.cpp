@@ -150,7 +150,6 @@ void Database::_close()
 {
     sqlite3_close_v2(_db);
     _db = nullptr;
-    _dataVersion = -1;
 }
 
 void Database::_setAside()
@@ -167,18 +166,6 @@ bool Database::takeReplaced()
 {
     const std::lock_guard lock(_mutex);
     return std::exchange(_replaced, false);
-}
-
-bool Database::takeForeignCommit()
-{
-    const std::lock_guard lock(_mutex);
-    if (_db == nullptr)
-        return false;
-    Statement statement(_db, "PRAGMA data_version");
-    if (!statement.step())
-        return false;
-    const long long before = std::exchange(_dataVersion, statement.number(0));
-    return before != -1 && before != _dataVersion;
 }
 
 // Runs the work under the lock; a database found damaged is replaced and the work tried once more.

@@ -53,8 +53,6 @@ public:
     [[nodiscard]] const std::string& path() const { return _path; }
     // Whether a damaged file was replaced since the last call.
     bool takeReplaced();
-    // Whether another connection committed since the last call.
-    bool takeForeignCommit();
 
     int select(const Query& query, std::vector<MediaRow>& rows);
     // Inserts the row, or refreshes the one of the same path and takes over its identifier.
@@ -82,7 +80,6 @@ private:
     std::string _path;
     sqlite3* _db = nullptr;
     bool _replaced = false;
-    long long _dataVersion = -1;
     std::recursive_mutex _mutex;
 };
 

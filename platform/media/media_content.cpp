@@ -13,6 +13,7 @@
 #include <string>
 #include <sys/stat.h>
 #include <system_error>
+#include <thread>
 #include <unistd.h>
 
 #include "media/MediaDatabase.h"
@@ -112,6 +113,17 @@ void committed(int pid)
 
 void refill(Connection& held);
 
+// Reads; when that found the database damaged and replaced it, once more from the refilled one.
+template <typename Work>
+int read(Connection& held, const Work& work)
+{
+    const int result = work(held.database);
+    if (!held.database.takeReplaced())
+        return result;
+    refill(held);
+    return work(held.database);
+}
+
 // Common to all writes: run, then tell everybody; after a damaged database was replaced, fill the new one first.
 template <typename Work>
 int write(const Work& work)
@@ -199,11 +211,19 @@ int scan(Connection& held, const std::string& directory, int* added, int* remove
     return toError(code);
 }
 
+// After a damaged database was set aside: the new one gets what the files tell.
 void refill(Connection& held)
 {
     for (const std::string& root : {std::string(storage_device_root()), std::string(storage_card_root())})
         scan(held, root + RECORDINGS_DIRECTORY, nullptr, nullptr);
     scan(held, storage_private_root(), nullptr, nullptr);
+}
+
+void openNow(const std::shared_ptr<Connection>& held)
+{
+    held->database.open();
+    if (held->database.takeReplaced())
+        refill(*held);
 }
 
 }
@@ -216,11 +236,9 @@ int media_content_connect(void)
     if (connectionCount++ > 0)
         return MEDIA_CONTENT_ERROR_NONE;
     connection = std::make_shared<Connection>(databasePath());
-    const int result = connection->database.open();
-    if (connection->database.takeReplaced())
-        refill(*connection);
-    connection->database.takeForeignCommit();
-    return toError(result);
+    // Opened beside the start of the program; whoever needs it first waits for it or opens it himself.
+    std::thread(openNow, connection).detach();
+    return MEDIA_CONTENT_ERROR_NONE;
 }
 
 int media_content_disconnect(void)
@@ -324,9 +342,9 @@ int media_info_foreach_media_from_db(filter_h filter, media_info_cb callback, vo
     if (callback == nullptr)
         return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
     std::vector<media::MediaRow> rows;
-    const int result = held->database.select(filter != nullptr ? filter->query : media::Query(), rows);
-    if (held->database.takeReplaced())
-        refill(*held);
+    const int result = read(*held, [&](media::Database& database) {
+        return database.select(filter != nullptr ? filter->query : media::Query(), rows);
+    });
     // The rows are copied first, so the callback may change the database.
     for (auto& row : rows) {
         media_info_s media{std::move(row)};
