@@ -284,11 +284,9 @@ bool MwAppController::_moveTempRecordingFile(const char* destFilePath)
     const std::string temporary = _model->getTemporaryFilePath();
     if (ecore_file_exists(destFilePath) != EINA_FALSE)
         return false;
-    // The notes move first, as a copy: at no moment is there a recording without them.
-    const std::vector<MwBookmark> bookmarks = _model->getBookmarkList();
-    if (!bookmarks.empty())
-        MwRecordingNotes::save(
-            MwRecordingNotes::pathForSaved(destFilePath), {_model->getCurrentRecordingFileName(), bookmarks});
+    // The notes go first, under a second name: at no moment is there a recording without them.
+    if (!_model->getBookmarkList().empty())
+        MwRecordingNotes::keepFor(MwRecordingNotes::pathFor(temporary), destFilePath);
     if (MwFiles::moveWithoutOverwriting(temporary, destFilePath) != MwFiles::Move::DONE) {
         MwRecordingNotes::remove(MwRecordingNotes::pathForSaved(destFilePath));
         return false;

@@ -75,6 +75,16 @@ bool save(const std::string& notesPath, const Content& content)
     return false;
 }
 
+bool keepFor(const std::string& notesPath, const std::string& recordingPath)
+{
+    const std::string kept = pathForSaved(recordingPath);
+    remove(kept);
+    if (::link(notesPath.c_str(), kept.c_str()) == 0)
+        return true;
+    const auto content = load(notesPath);
+    return content && save(kept, *content);
+}
+
 std::optional<Content> load(const std::string& notesPath)
 {
     const KeyFile file(g_key_file_new());

@@ -21,6 +21,8 @@ std::string pathFor(const std::string& temporaryPath);
 std::string pathForSaved(const std::string& recordingPath);
 // Replaces the notes atomically.
 bool save(const std::string& notesPath, const Content& content);
+// Gives the notes of a running recording a second name; needs no room on the disk where the file system can.
+bool keepFor(const std::string& notesPath, const std::string& recordingPath);
 // Nothing when there are none or they cannot be read.
 std::optional<Content> load(const std::string& notesPath);
 void remove(const std::string& notesPath);
