@@ -5,6 +5,7 @@
 namespace {
 
 constexpr int SINGLE_LINE_FIELD = 2;
+constexpr auto FIELD_TEXT = "DEFAULT='font=Sans font_size=13'";
 constexpr auto FIELD_PART = "elm.swallow.content";
 
 }
@@ -29,6 +30,7 @@ Evas_Object* uxt_edit_field_layout_add(Evas_Object* parent, int type, Evas_Objec
         elm_layout_theme_set(layout, "layout", "application", "default");
     *entry = elm_entry_add(layout);
     elm_entry_single_line_set(*entry, type == SINGLE_LINE_FIELD);
+    elm_entry_text_style_user_push(*entry, FIELD_TEXT);
     elm_entry_cnp_mode_set(*entry, ELM_CNP_MODE_PLAINTEXT);
     evas_object_size_hint_weight_set(*entry, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
     evas_object_size_hint_align_set(*entry, EVAS_HINT_FILL, EVAS_HINT_FILL);

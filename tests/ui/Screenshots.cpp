@@ -9,6 +9,7 @@
 #include <storage.h>
 #include <vconf.h>
 
+#include "MwRenamePopupController.h"
 #include "MwSignalMgr.h"
 #include "RecorderScreen.h"
 #include "UiEnvironment.h"
@@ -105,6 +106,18 @@ void take(const std::string& directory, const Shot& shot, const std::string& suf
     vconf_set_int("memory/sysman/mmc", 0);
 }
 
+// The rename popup has a window of its own.
+void takeRename(const std::string& directory, const std::string& suffix)
+{
+    ui::RecorderScreen screen;
+    MwRenamePopupController popup("Voice 001");
+    popup.create(screen.window, nullptr);
+    support::runFor(0.6);
+    support::settle(popup.getWindow());
+    const std::string file = directory + "/rename" + suffix + ".png";
+    std::printf("%s %s\n", support::savePng(popup.getWindow(), file) ? "wrote" : "failed", file.c_str());
+}
+
 }
 
 int main(int argc, char** argv)
@@ -124,6 +137,7 @@ int main(int argc, char** argv)
                 continue;
             take(directory, shot, dark ? "-dark" : "-light", width, height);
         }
+        takeRename(directory, dark ? "-dark" : "-light");
         if (argc == 2)
             take(directory, shots()[2], dark ? "-wide-dark" : "-wide-light", width * 3, height);
     }

@@ -22,7 +22,7 @@ namespace {
 constexpr auto WINDOW_NAME = "mewlo_rename_popup_win";
 constexpr auto INVALID_CHARACTERS = "\\:/*?\"<>|";
 constexpr int WINDOW_WIDTH = 680; // design units
-constexpr int WINDOW_HEIGHT = 360;
+constexpr int WINDOW_HEIGHT = 330;
 
 int scaled(int units) { return static_cast<int>(units * elm_config_scale_get() / elm_app_base_scale_get()); }
 
@@ -63,6 +63,7 @@ bool MwRenamePopupController::create(Evas_Object* parentWindow, void*)
     if (!layout)
         return false;
     _popup = elm_popup_add(layout);
+    elm_object_style_set(_popup, "transparent");
     elm_popup_align_set(_popup, ELM_NOTIFY_ALIGN_FILL, 1.0);
     evas_object_size_hint_weight_set(_popup, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
     const char* domain = textdomain(nullptr);
