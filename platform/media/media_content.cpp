@@ -43,10 +43,21 @@ struct Connection {
         , notice(path + ".changed")
     {
     }
+    ~Connection()
+    {
+        if (opener.joinable())
+            opener.join();
+    }
+    Connection(const Connection&) = delete;
+    Connection& operator=(const Connection&) = delete;
+
+    // Held from finding a database damaged until it is filled again, so that nobody reads it empty in between.
+    std::recursive_mutex mutex;
     media::Database database;
     media::Notice notice;
     media_content_db_updated_cb callback = nullptr;
     void* userData = nullptr;
+    std::thread opener;
 };
 
 std::mutex connectionMutex; // guards the pointer and the count
@@ -117,6 +128,7 @@ void refill(Connection& held);
 template <typename Work>
 int read(Connection& held, const Work& work)
 {
+    const std::lock_guard lock(held.mutex);
     const int result = work(held.database);
     if (!held.database.takeReplaced())
         return result;
@@ -131,6 +143,7 @@ int write(const Work& work)
     const auto held = current();
     if (!held)
         return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    const std::lock_guard lock(held->mutex);
     const int result = work(held->database);
     if (held->database.takeReplaced())
         refill(*held);
@@ -219,11 +232,12 @@ void refill(Connection& held)
     scan(held, storage_private_root(), nullptr, nullptr);
 }
 
-void openNow(const std::shared_ptr<Connection>& held)
+void openNow(Connection& held)
 {
-    held->database.open();
-    if (held->database.takeReplaced())
-        refill(*held);
+    const std::lock_guard lock(held.mutex);
+    held.database.open();
+    if (held.database.takeReplaced())
+        refill(held);
 }
 
 }
@@ -237,17 +251,18 @@ int media_content_connect(void)
         return MEDIA_CONTENT_ERROR_NONE;
     connection = std::make_shared<Connection>(databasePath());
     // Opened beside the start of the program; whoever needs it first waits for it or opens it himself.
-    std::thread(openNow, connection).detach();
+    connection->opener = std::thread([held = connection.get()] { openNow(*held); });
     return MEDIA_CONTENT_ERROR_NONE;
 }
 
 int media_content_disconnect(void)
 {
+    std::shared_ptr<Connection> last; // declared first, destroyed after the lock: it waits for its opener
     const std::lock_guard lock(connectionMutex);
     if (connectionCount == 0)
         return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
     if (--connectionCount == 0)
-        connection.reset();
+        last = std::exchange(connection, nullptr);
     return MEDIA_CONTENT_ERROR_NONE;
 }
 
