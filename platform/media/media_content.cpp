@@ -15,6 +15,7 @@
 #include <system_error>
 #include <thread>
 #include <unistd.h>
+#include <utility>
 
 #include "media/MediaDatabase.h"
 #include "media/MediaFile.h"
