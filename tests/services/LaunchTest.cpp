@@ -83,7 +83,7 @@ protected:
     {
         host::closeBuses();
         vconf_set_int(VCONFKEY_IDLE_LOCK_STATE, 0);
-        for (const char* name : {"PEER_PORT", "PEER_TOOLKIT", "PEER_REFUSES", "PEER_ID"})
+        for (const char* name : {"PEER_PORT", "PEER_TOOLKIT", "PEER_REFUSES", "PEER_ID", "PEER_CALLS"})
             ::unsetenv(name);
     }
     void writeEntry(const std::string& id, const std::string& lines)
@@ -191,23 +191,13 @@ TEST_P(SpawnTest, RequestsFromAWorkerReplyOnTheMainLoop)
 
 TEST_P(SpawnTest, ADeadCallerEndsTheTargetAsIfItsWindowWereClosed)
 {
-    writeEntry("org.example.caller", std::string("Exec=") + PEER_PROGRAM);
-    // The caller is a process of its own: it starts the peer, waits for it and is killed.
-    const pid_t caller = ::fork();
-    if (caller == 0) {
-        ::execlp("python3", "python3", "-c",
-            "import socket,subprocess,os,time,signal,sys\n"
-            "a,b=socket.socketpair()\n"
-            "p=subprocess.Popen([sys.argv[1],'--app-control-fd=%d'%b.fileno()],pass_fds=[b.fileno()])\n"
-            "b.close()\n"
-            "while 'create' not in (open(sys.argv[2]).read() if os.path.exists(sys.argv[2]) else ''): "
-            "time.sleep(0.01)\n"
-            "os.kill(os.getpid(),signal.SIGKILL)\n",
-            PEER_PROGRAM, log().c_str(), nullptr);
-        ::_exit(1);
-    }
+    ::setenv("PEER_CALLS", "keep", 1);
+    ::setenv("PEER_ID", "org.example.caller", 1);
+    Program caller({PEER_PROGRAM});
+    ASSERT_TRUE(waitForNote("first keep\nresume"));
+    caller.signal(SIGKILL);
     ASSERT_TRUE(waitForNote("end"));
-    EXPECT_EQ("create\nterminate\nend\n", notes()); // no request came, so nothing was resumed
+    EXPECT_TRUE(notes().ends_with("first keep\nresume\npause\nterminate\nend\n")) << notes();
 }
 
 TEST_F(LaunchTest, ExitStatusAndPlainProgramsAnswerAsTheirEntriesSay)

@@ -43,11 +43,25 @@ void reply(app_control_h request, app_control_result_e result)
     app_control_destroy(answer);
 }
 
+// Starts the same program as another application would.
+void callAnother(const char* task)
+{
+    app_control_h request = nullptr;
+    app_control_create(&request);
+    app_control_set_app_id(request, "org.example.peer-one");
+    app_control_set_launch_mode(request, APP_CONTROL_LAUNCH_MODE_GROUP);
+    app_control_add_extra_data(request, "do", task);
+    note("call " + std::to_string(app_control_send_launch_request(request, nullptr, nullptr)));
+    app_control_destroy(request);
+}
+
 void control(app_control_h request, bool first, void*)
 {
     const std::string task = extra(request, "do");
     note((first ? "first " : "again ") + task);
-    if (task == "reply" || task == "fail") {
+    if (task.empty() && std::getenv("PEER_CALLS") != nullptr) {
+        callAnother(std::getenv("PEER_CALLS"));
+    } else if (task == "reply" || task == "fail") {
         reply(request, task == "reply" ? APP_CONTROL_RESULT_SUCCEEDED : APP_CONTROL_RESULT_FAILED);
         ui_app_exit();
     } else if (task == "stay") {
