@@ -66,7 +66,7 @@ bool MwAppController::_startRecording()
     }
     if (const std::string name = _model->getRenameString(); !name.empty()) {
         MW_LOGI("Has been renamed, used rename string");
-        _model->setCurrentRecordingFileName(name);
+        _model->chooseCurrentRecordingFileName(name);
         _model->setRenameString("");
     } else {
         _model->updateNextRecordingFileName();

@@ -113,6 +113,8 @@ public:
     void setEstimatedRecordingMaxTime(int seconds) { _maxTime = seconds; }
     [[nodiscard]] std::string getCurrentRecordingFileName() const { return _text(_currentName); }
     void setCurrentRecordingFileName(const std::string& name) { _setText(_currentName, name); }
+    // A name of the user's, which stays with the recording until it ends.
+    void chooseCurrentRecordingFileName(const std::string& name);
     // The user's name for the next recording, empty for the default one.
     [[nodiscard]] std::string getRenameString() const { return _text(_renameString); }
     void setRenameString(const std::string& name) { _setText(_renameString, name); }
@@ -170,6 +172,7 @@ private:
     std::atomic<int> _bitRate = 288000;
     std::atomic<int> _maxTime = 0;
     std::string _currentName;
+    bool _nameIsChosen = false;
     std::string _renameString;
     FileNumbers _numbers;
     std::atomic<unsigned long long> _elapsedTime = 0;

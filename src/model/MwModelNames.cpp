@@ -6,6 +6,7 @@
 #include <string_view>
 
 #include "MwLog.h"
+#include "MwRecorder.h"
 #include "MwText.h"
 
 namespace {
@@ -134,9 +135,22 @@ std::string MwModel::_advanceToFreeName(FileNumbers& numbers) const
     return candidate;
 }
 
+void MwModel::chooseCurrentRecordingFileName(const std::string& name)
+{
+    const std::lock_guard lock(_mutex);
+    _currentName = name;
+    _nameIsChosen = true;
+}
+
 bool MwModel::updateNextRecordingFileName()
 {
     const std::lock_guard lock(_mutex);
+    // The screen asks again whenever it comes back; a running recording keeps the name its user gave it.
+    const bool runs
+        = _recorderState == MwRecorder::REC_STATE_RECORDING || _recorderState == MwRecorder::REC_STATE_PAUSED;
+    if (runs && _nameIsChosen)
+        return true;
+    _nameIsChosen = false;
     _currentName = _advanceToFreeName(_numbers);
     return true;
 }
