@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <utility>
 #include <vector>
 
 struct keynode_s {
@@ -45,7 +46,28 @@ int store(const char* key, const std::string& value)
     return key != nullptr && stateTree().write(key, value) ? SUCCESS : FAILURE;
 }
 
-std::optional<std::string> load(const char* key) { return key != nullptr ? stateTree().read(key) : std::nullopt; }
+// What holds while nothing has reported otherwise: no card, unlocked, staying on, no headset, a full battery.
+constexpr std::pair<const char*, const char*> DEFAULTS[] = {
+    {VCONFKEY_SYSMAN_MMC_STATUS, "0"},
+    {VCONFKEY_IDLE_LOCK_STATE, "0"},
+    {VCONFKEY_SYSMAN_POWER_OFF_STATUS, "0"},
+    {VCONFKEY_SETAPPL_PSMODE, "0"},
+    {VCONFKEY_SYSMAN_EARJACK, "0"},
+    {VCONFKEY_CALL_RECORDING_REJECT, "0"},
+    {VCONFKEY_SYSMAN_BATTERY_STATUS_LOW, "3"},
+};
+
+std::optional<std::string> load(const char* key)
+{
+    if (key == nullptr)
+        return std::nullopt;
+    auto value = stateTree().read(key);
+    for (const auto& [known, standard] : DEFAULTS) {
+        if (!value && std::strcmp(key, known) == 0)
+            value = standard;
+    }
+    return value;
+}
 
 }
 

@@ -34,6 +34,9 @@ void postTooManyBookmarks()
 void MwModel::setRecorderState(int state)
 {
     _recorderState = state;
+    // For the desktop: what its remote controls show, and whether a shutdown waits for the recording to be saved.
+    vconf_set_int(VCONFKEY_MEWLO_RECORDER_STATE, state);
+    vconf_set_str(VCONFKEY_MEWLO_TITLE, getCurrentRecordingFileName().c_str());
     if (!_requestMode)
         MW_CALL(preference_set_int, RECORDING_STATE_KEY, state);
 }
