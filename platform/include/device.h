@@ -5,7 +5,7 @@
 enum power_lock_e { POWER_LOCK_CPU = 0, POWER_LOCK_DISPLAY = 1, POWER_LOCK_DISPLAY_DIM = 2 };
 enum display_state_e { DISPLAY_STATE_NORMAL = 0, DISPLAY_STATE_SCREEN_DIM = 1, DISPLAY_STATE_SCREEN_OFF = 2 };
 enum device_callback_e { DEVICE_CALLBACK_DISPLAY_STATE = 3 };
-// For the display state the value is a display_state_e.
+// For the display state the value is a display_state_e, cast to a pointer.
 typedef void (*device_changed_cb)(device_callback_e type, void* value, void* user_data);
 
 extern "C" {
