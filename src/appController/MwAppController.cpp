@@ -1,6 +1,5 @@
 #include "MwAppController.h"
 
-#include <Ecore.h>
 #include <app.h>
 #include <message_port.h>
 #include <notification.h>
@@ -20,11 +19,6 @@ namespace {
 constexpr auto INDICATOR_APP_ID = "com.tovanic.indicator";
 constexpr auto INDICATOR_PORT = "mewlo_indicator_port";
 constexpr auto INDICATOR_KEY = "mewlo_indicator_data";
-
-struct PipeMessage {
-    void (*closure)(void* data);
-    void* data;
-};
 
 // What the indicator is to show; nothing while the window itself can be seen.
 const char* indicatorValue(const MwModel& model)
@@ -108,7 +102,7 @@ bool MwAppController::initialize(MwModel* model, panekit::WWindowController* win
         MW_LOGE("_createPlayer failed");
         return false;
     }
-    _pipe = ecore_pipe_add(_pipeCb, this);
+    _mainLoopPipe.open();
     MW_LOGW("END");
     return true;
 }
@@ -143,11 +137,7 @@ void MwAppController::deinitialize()
         dropListener(signals->getLifeCycleSignal(), _lifeCycleListener);
     _playerUpdatedSignal.removeAll();
     _recorderUpdatedSignal.removeAll();
-    if (_pipe != nullptr) {
-        ecore_pipe_wait(_pipe, 0, 0.0); // results still on their way are freed; nobody waits for them any more
-        ecore_pipe_del(_pipe);
-    }
-    _pipe = nullptr;
+    _mainLoopPipe.close(); // results still on their way are freed; nobody waits for them any more
     MW_LOGW("END");
 }
 
@@ -194,28 +184,7 @@ bool MwAppController::dispatchCommandAsync(Command command, AsyncCallback callba
     return true;
 }
 
-void MwAppController::_callSafetyMainThread(Closure closure, void* data)
-{
-    if (_pipe == nullptr) {
-        MW_LOGE("_pipe is nullptr");
-        return;
-    }
-    if (eina_main_loop_is()) {
-        closure(data);
-        return;
-    }
-    const PipeMessage message{closure, data};
-    if (ecore_pipe_write(_pipe, &message, sizeof message) == EINA_FALSE)
-        MW_LOGE("ecore_pipe_write failed!!!");
-}
-
-void MwAppController::_pipeCb(void*, void* buffer, unsigned int)
-{
-    if (buffer == nullptr)
-        return;
-    const PipeMessage message = *static_cast<PipeMessage*>(buffer);
-    message.closure(message.data);
-}
+void MwAppController::_callSafetyMainThread(Closure closure, void* data) { _mainLoopPipe.call(closure, data); }
 
 bool MwAppController::_createRecorder()
 {

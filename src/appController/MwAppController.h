@@ -9,12 +9,12 @@
 #include <mutex>
 #include <string>
 
+#include "MwMainLoopPipe.h"
 #include "MwPlayer.h"
 #include "MwRecorder.h"
 #include "MwSignalMgr.h"
 #include "WSignal.h"
 
-struct _Ecore_Pipe;
 class MwAvrcp;
 class MwModel;
 class MwSoundSession;
@@ -77,13 +77,12 @@ public:
 private:
     class AsyncCmdControl;
     struct AsyncRequest;
-    using Closure = void (*)(void* data);
+    using Closure = MwMainLoopPipe::Closure;
 
     void _initAsyncCmdControl();
     void _deinitAsyncCmdControl();
     void _executeAsyncRequest(std::unique_ptr<AsyncRequest> request);
     void _callSafetyMainThread(Closure closure, void* data);
-    static void _pipeCb(void* data, void* buffer, unsigned int size);
 
     bool _createRecorder();
     bool _destroyRecorder();
@@ -181,7 +180,7 @@ private:
     panekit::WTimer::Weak _fastForwardTimer;
     panekit::WPopupController* _errorPopup = nullptr;
     unsigned int _seekStep = 0; // milliseconds
-    _Ecore_Pipe* _pipe = nullptr;
+    MwMainLoopPipe _mainLoopPipe;
     std::function<void()> _recordingsOpener;
     // Held for the whole execution of a command, by whichever thread executes it.
     mutable std::recursive_mutex _commandMutex;

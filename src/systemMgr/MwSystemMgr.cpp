@@ -1,6 +1,5 @@
 #include "MwSystemMgr.h"
 
-#include <Ecore.h>
 #include <notification.h>
 #include <storage.h>
 #include <system_info.h>
@@ -40,12 +39,6 @@ std::mutex& instanceMutex()
     return mutex;
 }
 
-// One message of the main-loop pipe.
-struct PipeMessage {
-    MwSystemMgr::Closure closure;
-    void* data;
-};
-
 }
 
 MwSystemMgr* MwSystemMgr::getInstance()
@@ -69,16 +62,13 @@ bool MwSystemMgr::initialize(MwModel* model)
         return false;
     }
     _model = model;
-    if (_pipe == nullptr)
-        _pipe = ecore_pipe_add(_pipeCb, nullptr);
+    _mainLoopPipe.open();
     return true;
 }
 
 void MwSystemMgr::deinitialize()
 {
-    if (_pipe != nullptr)
-        ecore_pipe_del(_pipe);
-    _pipe = nullptr;
+    _mainLoopPipe.close();
     _model = nullptr;
 }
 
@@ -304,29 +294,4 @@ bool MwSystemMgr::releaseLockDisplayDim()
     return result == 0;
 }
 
-void MwSystemMgr::_callSafetyMainThread(Closure closure, void* data)
-{
-    MW_LOGW("BEGIN");
-    if (_pipe == nullptr) {
-        MW_LOGE("_pipe is nullptr");
-        return;
-    }
-    if (eina_main_loop_is()) {
-        closure(data);
-        return;
-    }
-    const PipeMessage message{closure, data};
-    if (ecore_pipe_write(_pipe, &message, sizeof message) == EINA_FALSE)
-        MW_LOGE("ecore_pipe_write failed!!!");
-    MW_LOGW("END");
-}
-
-void MwSystemMgr::_pipeCb(void*, void* buffer, unsigned int)
-{
-    if (buffer == nullptr) {
-        MW_LOGE("buffer is nullptr");
-        return;
-    }
-    const PipeMessage message = *static_cast<PipeMessage*>(buffer);
-    message.closure(message.data);
-}
+void MwSystemMgr::_callSafetyMainThread(Closure closure, void* data) { _mainLoopPipe.call(closure, data); }

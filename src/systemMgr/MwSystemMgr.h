@@ -10,15 +10,16 @@
 
 #include <array>
 
+#include "MwMainLoopPipe.h"
+
 class MwModel;
-struct _Ecore_Pipe;
 
 // Knows the device around the application: watches its state keys and services and turns changes into the
 // system-information signal, answers questions about it, holds the power locks. One instance for the process. Queries
 // and locks from any thread; everything else on the main loop.
 class MwSystemMgr {
 public:
-    using Closure = void (*)(void* data);
+    using Closure = MwMainLoopPipe::Closure;
 
     static MwSystemMgr* getInstance();
     static void destroyInstance();
@@ -75,11 +76,10 @@ private:
         sound_device_in_e inputDevice, sound_device_out_e outputDevice, void* userData);
     static void _powerStateChangedCb(device_callback_e type, void* value, void* userData);
     static void _themeChangedCb(void* userData);
-    static void _pipeCb(void* data, void* buffer, unsigned int size);
     bool _useOtherStorage(int type, const char* message);
 
     MwModel* _model = nullptr;
     panekit::WTimer::Weak _mediaDBUpdateTimer;
     int _modelType = 0;
-    _Ecore_Pipe* _pipe = nullptr;
+    MwMainLoopPipe _mainLoopPipe;
 };
