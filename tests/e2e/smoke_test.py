@@ -122,6 +122,25 @@ def request_returns_a_path(place):
     check(small.returncode == 1 and "min_size_error" in small.stderr, small.stderr)
 
 
+def interrupted_request_ends_its_recorder(place):
+    """Ctrl-C ends the other instance, and what it had recorded is not lost."""
+    for records in (False, True):
+        request = place.start(os.path.join(BIN, "mewlo-tool"), "request", stdout=subprocess.PIPE, text=True)
+        place.wait_for("the window", place.window, 30)
+        time.sleep(1)
+        if records:
+            place.make_noise(20)
+            place.big_button()
+            temporary = place.env["MEWLO_DEVICE_ROOT"] + "/.mw_temp"
+            place.wait_for("the recording", lambda: os.path.exists(temporary))
+            time.sleep(1.5)
+        request.send_signal(signal.SIGINT)
+        path = request.communicate(timeout=20)[0].strip()
+        check((request.returncode == 0) == records, f"status {request.returncode}, recording: {records}")
+        check(not records or decoded_ms(path) > 1000, "saved")
+        place.wait_for("the end of the window", lambda: place.window() is None)
+
+
 def main():
     place = Place(BIN)
     try:
