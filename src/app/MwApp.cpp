@@ -248,16 +248,18 @@ void MwApp::_launchFirst()
 void MwApp::_openRecordings()
 {
     const std::string saved = _appController->getLastSavedPath();
-    if (saved != _shownPath) {
-        _shownPath = saved;
+    if (saved == _shownPath) {
+        showFolder(_model->getRecordingsDirectory());
+        return;
+    }
+    _shownPath = saved;
+    if (!saved.empty()) {
         const std::string name = saved.substr(saved.rfind('/') + 1);
         notification_status_message_post(
             mwFormat("%s %s", name.substr(0, name.rfind('.')).c_str(), mwTranslate("IDS_MW_POP_SAVED").c_str())
                 .c_str());
-        _appController->getRecorderUpdatedSignal().emit();
-        return;
     }
-    showFolder(_model->getRecordingsDirectory());
+    _appController->getRecorderUpdatedSignal().emit();
 }
 
 bool MwApp::_lastItemPopped()

@@ -196,8 +196,7 @@ bool MwAppController::_createRecorder()
     _model->setRecorderState(MwRecorder::REC_STATE_READY);
     _recorderErrorListener
         = _recorder->errorSignal.addListener([this](MwRecorder::ErrorType type) { _recorderErrorOccurred(type); });
-    _recorderInterruptedListener
-        = _recorder->interruptedSignal.addListener([this] { _emitSignalAfterStopRecording(true); });
+    _recorderInterruptedListener = _recorder->interruptedSignal.addListener([this] { _recorderInterrupted(); });
     _recorderLimitListener = _recorder->limitReachedSignal.addListener(
         [this](MwRecorder::LimitType type) { _recorderLimitReached(type); });
     return true;

@@ -112,6 +112,8 @@ private:
     void _releaseTemporaryFile();
     bool _replyWithRecording();
     void _recorderLimitReached(MwRecorder::LimitType type);
+    void _recorderInterrupted();
+    void _stoppedByItself(Result result);
     bool _saveRecordingFile();
     bool _checkRecordedFileDir();
     bool _moveTempRecordingFile(const char* destFilePath);
@@ -184,5 +186,6 @@ private:
     std::function<void()> _recordingsOpener;
     // Held for the whole execution of a command, by whichever thread executes it.
     mutable std::recursive_mutex _commandMutex;
-    std::string _lastSavedPath;
+    std::string _lastSavedPath; // of this process; empty while or after one that was not saved
+    std::string _stopReason; // identifier of the message that says why a recording ended by itself
 };

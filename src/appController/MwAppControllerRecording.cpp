@@ -88,6 +88,7 @@ bool MwAppController::_startRecording()
 
 bool MwAppController::_setUpRecorder()
 {
+    _lastSavedPath.clear();
     _model->setElapsedTime(0);
     _model->setLevel(MwModel::SILENCE);
     if (!_recorder->createHandle(_model)) {
@@ -335,30 +336,43 @@ void MwAppController::_insertBookmarkList(const std::string& mediaId)
 void MwAppController::_recorderLimitReached(MwRecorder::LimitType type)
 {
     if (type == MwRecorder::LIMIT_FREE_SPACE)
-        post("IDS_MW_POP_NOT_ENOUGH_MEMORY_DELETE_SOME_ITEMS");
+        _stopReason = "IDS_MW_POP_NOT_ENOUGH_MEMORY_DELETE_SOME_ITEMS";
     _emitSignalAfterStopRecording(false);
+}
+
+void MwAppController::_recorderInterrupted()
+{
+    _stopReason = "IDS_MW_TPOP_RECORDING_INTERRUPTED_WHAT_WAS_RECORDED_IS_SAVED";
+    _emitSignalAfterStopRecording(true);
 }
 
 void MwAppController::_emitSignalAfterStopRecording(bool interrupted)
 {
-    const auto stopped = [](Command command, Result result, void* userData) {
-        auto* self = static_cast<MwAppController*>(userData);
-        MW_LOGI("async Command[%d] result is [%d]", static_cast<int>(command), result);
-        if (result == FAIL) {
-            MW_LOGE("STOP_RECORDING failed");
-            return;
-        }
-        if (self->_model->getAppState() == MwModel::APP_STATE_RESUMED) {
-            if (command == STOP_RECORDING_INTERRUPTED && !self->_model->isRequestMode())
-                post("IDS_MW_TPOP_RECORDING_INTERRUPTED_WHAT_WAS_RECORDED_IS_SAVED");
-            self->openRecordings();
-        } else if (self->_model->getAppState() == MwModel::APP_STATE_PAUSED) {
-            MW_LOGI("recording stop success");
-        } else {
-            MW_LOGW("app state is [%d]. need to scenario check.", self->_model->getAppState());
-        }
-    };
-    dispatchCommandAsync(interrupted ? STOP_RECORDING_INTERRUPTED : STOP_RECORDING, stopped, this);
+    dispatchCommandAsync(
+        interrupted ? STOP_RECORDING_INTERRUPTED : STOP_RECORDING,
+        [](Command command, Result result, void* userData) {
+            MW_LOGI("async Command[%d] result is [%d]", static_cast<int>(command), result);
+            static_cast<MwAppController*>(userData)->_stoppedByItself(result);
+        },
+        this);
+}
+
+// The recording ended without the user: after whatever opens for a saved recording, the last word is why.
+void MwAppController::_stoppedByItself(Result result)
+{
+    const std::string reason = std::exchange(_stopReason, {});
+    if (result == FAIL) {
+        MW_LOGE("STOP_RECORDING failed");
+    } else if (_model->getAppState() == MwModel::APP_STATE_RESUMED) {
+        openRecordings();
+    } else if (_model->getAppState() == MwModel::APP_STATE_PAUSED) {
+        MW_LOGI("recording stop success");
+    } else {
+        MW_LOGW("app state is [%d]. need to scenario check.", _model->getAppState());
+    }
+    const bool wasTooShort = _lastSavedPath.empty();
+    if (!reason.empty() && !wasTooShort)
+        post(reason.c_str());
 }
 
 void MwAppController::_pauseInRequestMode()

@@ -191,13 +191,15 @@ TEST_F(MwAppControllerTest, InterruptionsSaveWithoutAskingTheRecorder)
     EXPECT_FALSE(calls.has("recorder_commit"));
     EXPECT_FALSE(calls.has("usage"));
     EXPECT_NE("", _controller.getLastSavedPath());
+    EXPECT_EQ(mwTranslate("IDS_MW_TPOP_RECORDING_INTERRUPTED_WHAT_WAS_RECORDED_IS_SAVED"), fakes::desktop.lastMessage);
 
     startRecording(10);
     calls.clear();
     fakes::recorder.state = RECORDER_STATE_READY;
     fakes::recorder.interrupted(
         RECORDER_POLICY_SOUND, RECORDER_STATE_RECORDING, RECORDER_STATE_READY, fakes::recorder.userData);
-    EXPECT_TRUE(support::runUntil([&] { return state() == MwRecorder::REC_STATE_READY; }));
+    EXPECT_TRUE(support::runUntil([&] { return _opened == 2; }));
+    EXPECT_EQ(mwTranslate("IDS_MW_TPOP_COULDNT_SAVE_RECORDING_RECODING_TOO_SHORT"), fakes::desktop.lastMessage);
     EXPECT_FALSE(calls.has("recorder_cancel"));
     EXPECT_FALSE(std::filesystem::exists(fakes::recorder.fileName));
 }
@@ -211,11 +213,12 @@ TEST_F(MwAppControllerTest, LimitsStopAndOpenTheRecordingsOnlyInTheForeground)
     startRecording();
     _model.setAppState(MwModel::APP_STATE_PAUSED);
     const std::string name = _model.getCurrentRecordingFileName();
+    calls.clear();
     fakes::recorder.limitReached(RECORDER_RECORDING_LIMIT_FREE_SPACE, fakes::recorder.userData);
-    EXPECT_EQ(mwTranslate("IDS_MW_POP_NOT_ENOUGH_MEMORY_DELETE_SOME_ITEMS"), fakes::desktop.lastMessage);
     EXPECT_TRUE(support::runUntil([&] { return fakes::log.has("recording stop success"); }));
     EXPECT_EQ(1, _opened);
-    EXPECT_EQ(name + " " + mwTranslate("IDS_MW_POP_SAVED"), fakes::desktop.lastMessage);
+    EXPECT_TRUE(calls.has("post " + name + " " + mwTranslate("IDS_MW_POP_SAVED")));
+    EXPECT_EQ(mwTranslate("IDS_MW_POP_NOT_ENOUGH_MEMORY_DELETE_SOME_ITEMS"), fakes::desktop.lastMessage);
 }
 
 TEST_F(MwAppControllerTest, AFailedCommitOrMoveLosesNothing)
