@@ -6,7 +6,7 @@ BUILD_PACKAGES=(g++ cmake ninja-build pkg-config gettext librsvg2-bin
 RUN_PACKAGES=(gstreamer1.0-plugins-base gstreamer1.0-plugins-good gstreamer1.0-plugins-bad gstreamer1.0-plugins-ugly
   gstreamer1.0-libav gstreamer1.0-pulseaudio fonts-dejavu-core)
 DISPLAYLESS_PACKAGES=(xvfb openbox xdotool x11-utils imagemagick pulseaudio pulseaudio-utils espeak-ng ffmpeg)
-TEST_PACKAGES=(libgtest-dev libgmock-dev sox dbus dbus-x11 python3-dbusmock playerctl gstreamer1.0-tools)
+TEST_PACKAGES=(libgtest-dev libgmock-dev sox dbus dbus-x11 systemd python3-dbusmock playerctl gstreamer1.0-tools)
 
 have_package() { dpkg-query -W -f='${db:Status-Status}\n' "$1" 2>/dev/null | grep -qx installed; }
 
