@@ -9,6 +9,8 @@
 
 #include <dlog.h>
 
+#include "look/FocusMark.h"
+
 namespace {
 
 constexpr auto ARMED_KEY = "eext.keys";
@@ -134,6 +136,7 @@ void eext_window_arm(Evas_Object* object)
     if (!window || evas_object_data_get(window, ARMED_KEY))
         return;
     evas_object_data_set(window, ARMED_KEY, window);
+    look::watchFocusMark();
     bool grabbed = true;
     for (const char* key : {"Escape", "XF86Back", "Menu", "F10"})
         grabbed = evas_object_key_grab(window, key, 0, 0, EINA_TRUE) && grabbed;

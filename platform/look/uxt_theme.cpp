@@ -10,7 +10,9 @@
 
 #include <vconf.h>
 
-#include "ColorTable.h"
+#include "look/ColorTable.h"
+#include "look/FocusMark.h"
+#include "look/Theme.h"
 
 struct uxt_color_table_s {
     look::Colors colors;
@@ -78,15 +80,19 @@ void tint(const TintedObject& tinted)
     evas_object_color_set(tinted.object, red, green, blue, alpha);
 }
 
+void setColorClass(const std::string& code, const look::Color& color)
+{
+    const int alpha = code == look::FOCUS_COLOR && !look::isFocusMarkShown() ? 0 : color.alpha;
+    edje_color_class_set(code.c_str(), color.red, color.green, color.blue, alpha, 0, 0, 0, 0, 0, 0, 0, 0);
+}
+
 // Every code is a colour class of the layouts too, so that layouts and toolkit widgets follow the theme by themselves.
 void applyColorClasses()
 {
     if (!theme().colors)
         return;
-    for (const auto& [code, color] : theme().colors->colors) {
-        const auto& [red, green, blue, alpha] = color.of(theme().dark);
-        edje_color_class_set(code.c_str(), red, green, blue, alpha, 0, 0, 0, 0, 0, 0, 0, 0);
-    }
+    for (const auto& [code, color] : theme().colors->colors)
+        setColorClass(code, color.of(theme().dark));
 }
 
 void apply()
@@ -130,6 +136,16 @@ int deleteTable(std::vector<std::unique_ptr<Table>>& tables, Table*& current, Ta
     if (current == table)
         current = nullptr;
     return std::erase_if(tables, [table](const auto& each) { return each.get() == table; }) > 0 ? 0 : -1;
+}
+
+}
+
+namespace look {
+
+void applyColorClass(const std::string& code)
+{
+    if (const ThemeColor* known = findColor(code); known)
+        setColorClass(code, known->of(theme().dark));
 }
 
 }

@@ -1,9 +1,13 @@
 #include <gtest/gtest.h>
 
+#include <Ecore_Input.h>
 #include <Elementary.h>
+
+#include <cstdlib>
 
 #include <eext_event.h>
 
+#include "UiEnvironment.h"
 #include "support/Screen.h"
 
 namespace {
@@ -82,6 +86,41 @@ TEST_F(KeyTest, RegistrationsEndAndCallbacksMayEndThemAll)
     eext_object_event_callback_add(_lower, EEXT_CALLBACK_BACK, countBack, &presses);
     support::key(_window, "Escape");
     EXPECT_EQ(1, presses.back);
+}
+
+TEST_F(KeyTest, TheFocusMarkShowsWithTheKeyboardAndGoesWithAClick)
+{
+    const auto isShown = [] {
+        int alpha = 0;
+        edje_color_class_get("mewlo/focus", nullptr, nullptr, nullptr, &alpha, nullptr, nullptr, nullptr, nullptr,
+            nullptr, nullptr, nullptr, nullptr);
+        return alpha == 255;
+    };
+    const auto happen = [](int type, auto* event) {
+        ecore_event_add(type, event, nullptr, nullptr);
+        support::runFor(0.02);
+    };
+    const auto press = [happen](const char* name) {
+        auto* event = static_cast<Ecore_Event_Key*>(std::calloc(1, sizeof(Ecore_Event_Key)));
+        event->key = event->keyname = name;
+        happen(ECORE_EVENT_KEY_DOWN, event);
+    };
+    const auto click
+        = [happen] { happen(ECORE_EVENT_MOUSE_BUTTON_DOWN, std::calloc(1, sizeof(Ecore_Event_Mouse_Button))); };
+    eext_window_arm(_window);
+    click();
+    EXPECT_FALSE(isShown());
+    press("Alt_L"); // on the way to another window
+    press("a");
+    EXPECT_FALSE(isShown());
+    press("Tab");
+    EXPECT_TRUE(isShown());
+    ui::useTheme(true);
+    EXPECT_TRUE(isShown());
+    click();
+    EXPECT_FALSE(isShown());
+    ui::useTheme(false);
+    EXPECT_FALSE(isShown());
 }
 
 TEST_F(KeyTest, EachWindowHasItsOwnKeys)
