@@ -4,52 +4,108 @@
 
 #include <Elementary.h>
 
-#include <memory>
+#include <algorithm>
 
 namespace platform {
 
 namespace {
 
+    constexpr auto GROUP = "mewlo/toast"; // of the application's theme
+    constexpr auto TEXT_PART = "text";
     constexpr double SHOWN_FOR = 3.0; // seconds
-    constexpr double HEIGHT_ON_SCREEN = 0.92; // near the bottom, clear of the last row of buttons
+    constexpr double FADES_FOR = 0.3;
+    // Design units.
+    constexpr int LARGEST_WIDTH = 640;
+    constexpr int PADDING = 40; // of the text, on each side
+    constexpr int MARGIN = 40;
+    constexpr int ABOVE_BOTTOM = 226; // where the last row of buttons begins
 
-    Evas_Object*& current()
+    // A picture above everything else in the window: it takes neither focus nor clicks, and no popup can cover it.
+    struct Toast {
+        Evas_Object* plate = nullptr; // goes with the canvas
+        Evas_Object* window = nullptr;
+        Ecore_Timer* timer = nullptr;
+    };
+
+    Toast& current()
     {
-        static Evas_Object* toast = nullptr;
+        static Toast toast;
         return toast;
     }
 
-    void goneCb(void*, Evas*, Evas_Object* toast, void*)
+    int scaled(int units) { return static_cast<int>(units * elm_config_scale_get() / elm_app_base_scale_get()); }
+
+    int heightFor(int width)
     {
-        if (current() == toast)
-            current() = nullptr;
+        int leastWidth = 0;
+        int height = 0;
+        edje_object_size_min_restricted_calc(current().plate, &leastWidth, &height, width, 0);
+        return height;
     }
 
-    void timeoutCb(void*, Evas_Object* toast, void*) { evas_object_del(toast); }
-
-    // A dark rounded plate with light text can be read on a dark and on a light window alike.
-    Evas_Object* addPlate(Evas_Object* parent, const std::string& text)
+    // One line is as wide as it needs; the lines of a longer text are about equally long.
+    int widthFor(int textWidth, int room)
     {
-        Evas_Object* table = elm_table_add(parent);
-        Evas_Object* plate = evas_object_rectangle_add(evas_object_evas_get(parent));
-        evas_object_color_set(plate, 38, 38, 38, 235);
-        evas_object_size_hint_weight_set(plate, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
-        evas_object_size_hint_align_set(plate, EVAS_HINT_FILL, EVAS_HINT_FILL);
-        elm_table_pack(table, plate, 0, 0, 1, 1);
-        evas_object_show(plate);
-        Evas_Object* label = elm_label_add(parent);
-        const std::unique_ptr<char, void (*)(void*)> markup(elm_entry_utf8_to_markup(text.c_str()), ::free);
-        elm_object_text_set(
-            label, ("<font_size=16 color=#ffffff align=center>" + std::string(markup.get()) + "</>").c_str());
-        elm_label_line_wrap_set(label, ELM_WRAP_MIXED);
-        Evas_Coord width = 0;
-        evas_object_geometry_get(static_cast<Evas_Object*>(mainWindow()), nullptr, nullptr, &width, nullptr);
-        elm_label_wrap_width_set(label, width > 0 ? width * 4 / 5 : 280);
-        evas_object_size_hint_padding_set(label, 14, 14, 10, 10);
-        elm_table_pack(table, label, 0, 0, 1, 1);
-        evas_object_show(label);
-        evas_object_show(table);
-        return table;
+        const int padding = 2 * scaled(PADDING) + 2;
+        if (textWidth + padding <= room)
+            return textWidth + padding;
+        const int lines = textWidth / std::max(room - padding, 1) + 1;
+        const int even = textWidth / lines * 6 / 5 + padding;
+        return even < room && heightFor(even) <= heightFor(room) ? even : room;
+    }
+
+    void place()
+    {
+        Evas_Object* plate = current().plate;
+        int windowWidth = 0;
+        int windowHeight = 0;
+        evas_object_geometry_get(current().window, nullptr, nullptr, &windowWidth, &windowHeight);
+        const int room = std::max(std::min(windowWidth - 2 * scaled(MARGIN), scaled(LARGEST_WIDTH)), 1);
+        evas_object_resize(plate, room, 1);
+        int textWidth = 0;
+        evas_object_textblock_size_native_get(edje_object_part_object_get(plate, TEXT_PART), &textWidth, nullptr);
+        const int width = widthFor(textWidth, room);
+        const int height = heightFor(width);
+        evas_object_resize(plate, width, height);
+        evas_object_move(plate, (windowWidth - width) / 2, std::max(windowHeight - scaled(ABOVE_BOTTOM) - height, 0));
+    }
+
+    void resizedCb(void*, Evas*, Evas_Object*, void*) { place(); }
+
+    void windowGoneCb(void*, Evas*, Evas_Object*, void*) { evas_object_del(current().plate); }
+
+    void goneCb(void*, Evas*, Evas_Object*, void*)
+    {
+        evas_object_event_callback_del(current().window, EVAS_CALLBACK_RESIZE, resizedCb);
+        evas_object_event_callback_del(current().window, EVAS_CALLBACK_DEL, windowGoneCb);
+        ecore_timer_del(current().timer);
+        current() = {};
+    }
+
+    Eina_Bool fadedCb(void*)
+    {
+        evas_object_del(current().plate);
+        return ECORE_CALLBACK_CANCEL;
+    }
+
+    Eina_Bool shownCb(void*)
+    {
+        edje_object_signal_emit(current().plate, "hide", "");
+        current().timer = ecore_timer_add(FADES_FOR, fadedCb, nullptr);
+        return ECORE_CALLBACK_CANCEL;
+    }
+
+    Evas_Object* addPlate(Evas_Object* window, const std::string& text)
+    {
+        const char* file = elm_theme_group_path_find(nullptr, GROUP);
+        if (file == nullptr)
+            return nullptr;
+        Evas_Object* plate = edje_object_add(evas_object_evas_get(window));
+        edje_object_file_set(plate, file, GROUP);
+        edje_object_part_text_unescaped_set(plate, TEXT_PART, text.c_str());
+        evas_object_layer_set(plate, EVAS_LAYER_MAX - 1);
+        evas_object_pass_events_set(plate, EINA_TRUE);
+        return plate;
     }
 
 }
@@ -59,17 +115,17 @@ bool showToast(const std::string& text)
     auto* window = static_cast<Evas_Object*>(mainWindow());
     if (window == nullptr)
         return false;
-    if (current() != nullptr)
-        evas_object_del(current());
-    Evas_Object* toast = elm_notify_add(window);
-    elm_notify_align_set(toast, 0.5, HEIGHT_ON_SCREEN);
-    elm_notify_allow_events_set(toast, EINA_TRUE);
-    elm_notify_timeout_set(toast, SHOWN_FOR);
-    elm_object_content_set(toast, addPlate(toast, text));
-    evas_object_event_callback_add(toast, EVAS_CALLBACK_DEL, goneCb, nullptr);
-    evas_object_smart_callback_add(toast, "timeout", timeoutCb, nullptr);
-    evas_object_show(toast);
-    current() = toast;
+    if (current().plate != nullptr)
+        evas_object_del(current().plate);
+    Evas_Object* plate = addPlate(window, text);
+    if (plate == nullptr)
+        return false;
+    current() = {plate, window, ecore_timer_add(SHOWN_FOR, shownCb, nullptr)};
+    evas_object_event_callback_add(plate, EVAS_CALLBACK_DEL, goneCb, nullptr);
+    evas_object_event_callback_add(window, EVAS_CALLBACK_RESIZE, resizedCb, nullptr);
+    evas_object_event_callback_add(window, EVAS_CALLBACK_DEL, windowGoneCb, nullptr);
+    place();
+    evas_object_show(plate);
     return true;
 }
 

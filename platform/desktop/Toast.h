@@ -4,7 +4,8 @@
 
 namespace platform {
 
-// A short text at the bottom of the main window, replacing the one before; false when there is no window. Main loop.
+// A short text above the lowest row of buttons in the main window, replacing the one before. False when there is no
+// window, or none with the application's theme. Main loop.
 bool showToast(const std::string& text);
 
 }
