@@ -112,6 +112,8 @@ void WContentViewController::setMoreButton(std::function<void()> handler)
     Evas_Object* button = uxt_button_add_with_style(getEvasObject(), "mewlo/title/more");
     evas_object_smart_callback_add(button, "clicked", _moreKeyCb, this);
     setAccessibleName(button, "IDS_MW_BUTTON_MORE");
+    // A click or touch leaves the keyboard where it was.
+    elm_object_focus_move_policy_set(button, ELM_FOCUS_MOVE_POLICY_KEY_ONLY);
     evas_object_show(button);
     if (elm_layout_content_set(getEvasObject(), MORE_PART, button))
         return;

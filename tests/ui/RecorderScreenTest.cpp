@@ -316,7 +316,7 @@ TEST(RecorderScreenTest, TheMenuFollowsStateCallRejectionAndCard)
     support::runFor(0.02);
     EXPECT_TRUE(MwSystemMgr::getInstance()->getRejectCall());
     EXPECT_EQ("on", support::partState(screen.view, "call_rejection"));
-    EXPECT_EQ("Incoming calls are rejected while recording.", fakes::desktop.lastMessage);
+    EXPECT_EQ("Calls are rejected while recording.", fakes::desktop.lastMessage);
     EXPECT_EQ(Texts{"Stop rejecting calls"}, labels(screen));
     screen.enter(MwRecorder::REC_STATE_READY);
     EXPECT_FALSE(MwSystemMgr::getInstance()->getRejectCall());

@@ -91,6 +91,7 @@ Evas_Object* MwRenamePopupController::_createWindowBaseLayout(Evas_Object* paren
     elm_win_borderless_set(_window, EINA_TRUE);
     elm_win_modal_set(_window, EINA_TRUE);
     evas_object_event_callback_add(_window, EVAS_CALLBACK_DEL, _windowDelCb, this);
+    evas_object_smart_callback_add(_window, "focus,in", _windowFocusedCb, this);
     // Taken and without effect: the answer is given with the buttons.
     eext_object_event_callback_add(
         _window, EEXT_CALLBACK_BACK, [](void*, Evas_Object*, void*) {}, nullptr);
@@ -232,6 +233,7 @@ void MwRenamePopupController::_respond(const char* text, int response)
 void MwRenamePopupController::destory()
 {
     WTimer::destroy(_closedJob);
+    WTimer::destroy(_selectJob);
     Evas_Object* window = std::exchange(_window, nullptr);
     _popup = _entry = _renameButton = _cancelButton = nullptr;
     if (!window)
@@ -268,6 +270,14 @@ void MwRenamePopupController::_entryActivatedCb(void* data, Evas_Object* entry, 
     auto* self = static_cast<MwRenamePopupController*>(data);
     elm_object_focus_set(entry, EINA_TRUE);
     self->_respond(self->_entryText().c_str(), RESPONSE_RENAME);
+}
+
+// Getting the keyboard drops the selection made before; typing must replace the name.
+void MwRenamePopupController::_windowFocusedCb(void* data, Evas_Object* window, void*)
+{
+    evas_object_smart_callback_del_full(window, "focus,in", _windowFocusedCb, data);
+    auto* self = static_cast<MwRenamePopupController*>(data);
+    self->_selectJob = WTimer::addJob([self](void*) { elm_entry_select_all(self->_entry); });
 }
 
 void MwRenamePopupController::_entryMaxlengthReachedCb(void*, Evas_Object*, void*)

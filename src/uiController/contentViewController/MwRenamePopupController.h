@@ -48,6 +48,7 @@ private:
     [[nodiscard]] std::string _entryText() const;
     void _respond(const char* text, int response);
 
+    static void _windowFocusedCb(void* data, Evas_Object* object, void* info);
     static void _windowDelCb(void* data, Eo* canvas, Evas_Object* window, void* info);
     static void _cancelButtonClicked(void* data, Evas_Object* object, void* info);
     static void _renameButtonClicked(void* data, Evas_Object* object, void* info);
@@ -66,4 +67,5 @@ private:
     void* _userData = nullptr;
     ResponseCb _responseCb;
     panekit::WTimer::Weak _closedJob;
+    panekit::WTimer::Weak _selectJob;
 };
