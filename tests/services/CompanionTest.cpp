@@ -74,6 +74,7 @@ TEST_F(CompanionTest, StorageSettingOpensTheFileManagerAtTheRoot)
     ::setenv("PATH", (programs.path() + ":" + path).c_str(), 1);
     EXPECT_EQ(0, send("com.tovanic.setting.storage"));
     EXPECT_TRUE(runUntil([&] { return support::readFile(opened) == std::string(storage_device_root()) + "\n"; }, 30));
+    EXPECT_TRUE(runUntil([&] { return _results == std::vector<int>{APP_CONTROL_RESULT_APP_STARTED}; }, 30));
     ::setenv("PATH", path.c_str(), 1);
 }
 
