@@ -199,13 +199,30 @@ void MwApp::onAppControl(app_control_h request, bool firstLaunch)
         MW_LOGE("_appController is nullptr");
         return;
     }
-    MwRequestParser().parse(request, _model.get());
+    _parseRequest(request);
     _model->setRequestHandle(request);
     if (_refuseTinyRequest())
         return;
     if (firstLaunch)
         _launchFirst();
     MW_LOGI("END");
+}
+
+// A request that comes while a recording runs must not change what is being written.
+void MwApp::_parseRequest(app_control_h request)
+{
+    const int codec = _model->getAudioCodec();
+    const int format = _model->getFileFormat();
+    const int sampleRate = _model->getSampleRate();
+    const int bitRate = _model->getBitRate();
+    MwRequestParser().parse(request, _model.get());
+    const int state = _model->getRecorderState();
+    if (state != MwRecorder::REC_STATE_RECORDING && state != MwRecorder::REC_STATE_PAUSED)
+        return;
+    _model->setAudioCodec(codec);
+    _model->setFileFormat(format);
+    _model->setSampleRate(sampleRate);
+    _model->setBitRate(bitRate);
 }
 
 // A limit so small that no recording fits is answered at once; the instance then ends.

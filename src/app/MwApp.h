@@ -39,6 +39,7 @@ private:
     static void _unsetThemeExtension();
     static void _connectMediaContentDB();
     static void _disconnectMediaContentDB();
+    void _parseRequest(app_control_h request);
     bool _refuseTinyRequest();
     void _launchFirst();
     bool _lastItemPopped();
