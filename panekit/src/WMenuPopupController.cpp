@@ -8,6 +8,8 @@
 #include <eext_event.h>
 #include <uxt_theme.h>
 
+#include "PopupEnd.h"
+
 namespace panekit {
 
 struct WMenuPopupController::Impl {
@@ -112,7 +114,7 @@ bool WMenuPopupController::create(Evas_Object* window, Evas_Object*)
 void WMenuPopupController::destroy()
 {
     if (_impl->popup)
-        return evas_object_del(_impl->popup);
+        return deletePopup(_impl->popup);
     const auto destroyed = std::exchange(_impl->onDestroyed, nullptr);
     if (const auto detached = std::exchange(_impl->onDetached, nullptr); detached)
         detached();

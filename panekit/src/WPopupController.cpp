@@ -11,6 +11,8 @@
 #include <eext_event.h>
 #include <uxt_theme.h>
 
+#include "PopupEnd.h"
+
 namespace panekit {
 
 namespace {
@@ -170,7 +172,7 @@ bool WPopupController::create(Evas_Object* window)
 void WPopupController::destroy()
 {
     if (_impl->popup)
-        return evas_object_del(_impl->popup);
+        return deletePopup(_impl->popup);
     const auto destroyed = std::exchange(_impl->onDestroyed, nullptr);
     if (const auto detached = std::exchange(_impl->onDetached, nullptr); detached)
         detached();
