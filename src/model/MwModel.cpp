@@ -7,6 +7,7 @@
 #include <algorithm>
 
 #include "MwLog.h"
+#include "MwRecorder.h"
 #include "MwRecordingNotes.h"
 #include "MwStorageRoots.h"
 #include "MwText.h"
@@ -33,10 +34,14 @@ void postTooManyBookmarks()
 
 void MwModel::setRecorderState(int state)
 {
-    _recorderState = state;
-    // For the desktop: what its remote controls show, and whether a shutdown waits for the recording to be saved.
-    vconf_set_int(VCONFKEY_MEWLO_RECORDER_STATE, state);
-    vconf_set_str(VCONFKEY_MEWLO_TITLE, getCurrentRecordingFileName().c_str());
+    const int before = _recorderState.exchange(state);
+    // For the desktop: what its remote controls show, and whether a shutdown waits for the recording to be saved. An
+    // instance that only comes and goes beside a recording one must not speak for it.
+    const bool isRecordings = state >= MwRecorder::REC_STATE_RECORDING || before >= MwRecorder::REC_STATE_RECORDING;
+    if (!_requestMode || isRecordings) {
+        vconf_set_int(VCONFKEY_MEWLO_RECORDER_STATE, state);
+        vconf_set_str(VCONFKEY_MEWLO_TITLE, getCurrentRecordingFileName().c_str());
+    }
     if (!_requestMode)
         MW_CALL(preference_set_int, RECORDING_STATE_KEY, state);
 }

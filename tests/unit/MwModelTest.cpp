@@ -205,6 +205,16 @@ TEST_F(MwModelTest, PublishesItsStateUnlessItServesARequest)
     preference_get_int("MainRecordingState", &published);
     EXPECT_EQ(2, published);
     EXPECT_EQ(3, _model.getRecorderState());
+
+    vconf_set_int(VCONFKEY_MEWLO_RECORDER_STATE, 2); // of another instance
+    MwModel guest;
+    guest.setRequestMode(true);
+    for (const auto& [state, shown] :
+        std::vector<std::pair<int, int>>{{1, 2}, {0, 2}, {2, 2}, {3, 3}, {1, 1}, {0, 1}}) {
+        guest.setRecorderState(state);
+        vconf_get_int(VCONFKEY_MEWLO_RECORDER_STATE, &published);
+        EXPECT_EQ(shown, published) << state;
+    }
 }
 
 TEST_F(MwModelTest, DurationTexts)
