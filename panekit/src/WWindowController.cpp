@@ -122,7 +122,8 @@ bool WWindowController::create()
     return true;
 }
 
-// Never larger than the screen: at twice the scale the design would not fit on many.
+// Never larger than the screen, with some room for title bar and panel: at twice the scale the design would not fit on
+// many.
 void WWindowController::_applySize()
 {
     int width = scaled(DESIGN_WIDTH);
@@ -132,7 +133,7 @@ void WWindowController::_applySize()
     elm_win_screen_size_get(_window, nullptr, nullptr, &screenWidth, &screenHeight);
     if (screenWidth > 0 && screenHeight > 0) {
         width = std::min(width, screenWidth);
-        height = std::min(height, screenHeight);
+        height = std::min(height, screenHeight * 9 / 10);
     }
     evas_object_resize(_window, width, height);
 }
