@@ -2,6 +2,7 @@
 
 #include <Ecore.h>
 
+#include <cerrno>
 #include <cstdlib>
 #include <fstream>
 #include <sstream>
@@ -86,7 +87,8 @@ void MountWatch::start()
     }
     _alive = std::make_shared<bool>(true);
     _report();
-    _thread = std::thread([this, table, end = _end[0]] { _poll(table, end); });
+    _thread
+        = std::thread([this, table, end = _end[0], alive = std::weak_ptr<bool>(_alive)] { _poll(table, end, alive); });
 }
 
 void MountWatch::stop()
@@ -99,12 +101,16 @@ void MountWatch::stop()
     ::close(std::exchange(_end[0], -1));
 }
 
-void MountWatch::_poll(int table, int end) const
+void MountWatch::_poll(int table, int end, const std::weak_ptr<bool>& alive) const
 {
     pollfd waits[] = {{table, POLLPRI, 0}, {end, POLLIN, 0}};
-    const std::weak_ptr<bool> alive = _alive;
     auto* self = const_cast<MountWatch*>(this); // only touched on the main loop, while alive
-    while (::poll(waits, 2, -1) >= 0 && waits[1].revents == 0) {
+    while (waits[1].revents == 0) {
+        const int ready = ::poll(waits, 2, -1);
+        if (ready < 0 && errno != EINTR)
+            break;
+        if (ready < 0 || waits[1].revents != 0)
+            continue;
         auto* delivery = new Delivery{alive, [self] { self->_report(); }};
         ecore_main_loop_thread_safe_call_async(
             [](void* data) {
