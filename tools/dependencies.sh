@@ -30,7 +30,7 @@ need_packages() {
   "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive apt-get install -y -q --no-install-recommends "${missing[@]}" >&2
 }
 
-# build_preset PRESET [TARGET...]: configures once, then builds.
+# build_preset PRESET [TARGET...]: configures once, then builds; without a target what the preset names.
 build_preset() {
   local preset=$1
   shift
@@ -38,5 +38,5 @@ build_preset() {
     cmake --preset "$preset" >"build-$preset.log" 2>&1 || { cat "build-$preset.log" >&2; rm -f "build-$preset.log"; return 1; }
     mv "build-$preset.log" "build/$preset/configure.log"
   fi
-  cmake --build "build/$preset" ${1:+--target "$@"}
+  cmake --build --preset "$preset" ${1:+--target "$@"}
 }
