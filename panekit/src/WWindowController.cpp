@@ -27,20 +27,38 @@ namespace {
 
     int scaled(int units) { return static_cast<int>(units * elm_config_scale_get() / elm_app_base_scale_get()); }
 
-    // The look that replaces the toolkit's own, from the application's resources when they have one.
-    void applyTheme()
+    // A file of the application's resources, empty when it has none of that name.
+    std::string resource(const char* name)
     {
         const std::unique_ptr<char, decltype(&std::free)> resources(app_get_resource_path(), &std::free);
-        const std::string theme = std::string(resources ? resources.get() : "") + "edje/MwTheme.edj";
-        if (std::filesystem::exists(theme))
+        const std::string path = std::string(resources ? resources.get() : "") + name;
+        return std::filesystem::exists(path) ? path : "";
+    }
+
+    // The look that replaces the toolkit's own.
+    void applyTheme()
+    {
+        if (const std::string theme = resource("edje/MwTheme.edj"); !theme.empty())
             elm_theme_overlay_add(nullptr, theme.c_str());
     }
 
-    // A line for whoever measures the start.
-    void firstFrameCb(void*, Evas* canvas, void*)
+    // For task bars and window switchers.
+    void applyIcon(Evas_Object* window)
+    {
+        const std::string file = resource("icon.png");
+        if (file.empty())
+            return;
+        Evas_Object* icon = evas_object_image_add(evas_object_evas_get(window));
+        evas_object_image_file_set(icon, file.c_str(), nullptr);
+        elm_win_icon_object_set(window, icon);
+    }
+
+    // A line for whoever measures the start; then what nobody waits for.
+    void firstFrameCb(void* window, Evas* canvas, void*)
     {
         evas_event_callback_del(canvas, EVAS_CALLBACK_RENDER_POST, firstFrameCb);
         __dlog_print(LOG_ID_MAIN, DLOG_INFO, "PANEKIT", "first frame");
+        applyIcon(static_cast<Evas_Object*>(window));
     }
 
     void applyDesktopScale()
@@ -117,7 +135,7 @@ bool WWindowController::create()
     _applySize();
     _watchVisibility();
     ui_app_set_window(_window);
-    evas_event_callback_add(evas_object_evas_get(_window), EVAS_CALLBACK_RENDER_POST, firstFrameCb, nullptr);
+    evas_event_callback_add(evas_object_evas_get(_window), EVAS_CALLBACK_RENDER_POST, firstFrameCb, _window);
     evas_object_show(_window);
     return true;
 }
