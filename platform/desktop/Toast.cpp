@@ -20,7 +20,7 @@ namespace {
     constexpr int MARGIN = 40;
     constexpr int ABOVE_BOTTOM = 226; // where the last row of buttons begins
 
-    // A picture above everything else in the window: it takes neither focus nor clicks, and no popup can cover it.
+    // A picture on top of what the window shows now: it takes neither focus nor clicks, and the next popup covers it.
     struct Toast {
         Evas_Object* plate = nullptr; // goes with the canvas
         Evas_Object* window = nullptr;
@@ -103,7 +103,7 @@ namespace {
         Evas_Object* plate = edje_object_add(evas_object_evas_get(window));
         edje_object_file_set(plate, file, GROUP);
         edje_object_part_text_unescaped_set(plate, TEXT_PART, text.c_str());
-        evas_object_layer_set(plate, EVAS_LAYER_MAX - 1);
+        evas_object_name_set(plate, GROUP);
         evas_object_pass_events_set(plate, EINA_TRUE);
         return plate;
     }

@@ -4,6 +4,7 @@
 
 #include <panekit/WMenuPopupController.h>
 #include <panekit/WPopupController.h>
+#include <uxt_theme.h>
 #include <vconf.h>
 
 #include "MwRecorderContentViewController.h"
@@ -11,6 +12,7 @@
 #include "MwSignalMgr.h"
 #include "MwSystemMgr.h"
 #include "RecorderScreen.h"
+#include "UiEnvironment.h"
 #include "fakes/Fakes.h"
 #include "support/Screen.h"
 
@@ -41,6 +43,30 @@ void pressPopupButton(size_t position)
 {
     if (WPopupController* popup = WPopupController::topmost(); popup)
         popup->press(position);
+}
+
+TEST(RecorderThemeTest, TextsOnTheScreenFollowTheThemeAtOnce)
+{
+    ui::RecorderScreen screen;
+    screen.model.setRenameString("Interview");
+    screen.enter(MwRecorder::REC_STATE_READY);
+    const auto redOf = [&](const char* part) {
+        int red = 0;
+        support::settle(screen.window);
+        evas_object_color_get(
+            edje_object_part_object_get(elm_layout_edje_get(screen.view), part), &red, nullptr, nullptr, nullptr);
+        return red;
+    };
+    for (const bool dark : {false, true, false}) {
+        SCOPED_TRACE(dark);
+        ui::useTheme(dark);
+        for (const auto& [part, code] : {std::pair("file_name_text", "mewlo/text"),
+                 std::pair("subtitle_text", "mewlo/text/dim"), std::pair("recording_time", "mewlo/text")}) {
+            int red = 0;
+            uxt_theme_get_color(code, &red, nullptr, nullptr, nullptr);
+            EXPECT_EQ(red, redOf(part)) << part;
+        }
+    }
 }
 
 TEST(RecordingTimeTest, TextsCountDownAndEstimate)

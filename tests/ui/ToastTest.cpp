@@ -37,12 +37,7 @@ protected:
         evas_object_resize(_window, width, height);
         support::settle(_window);
     }
-    // The plate on the topmost layer, null when there is none.
-    Evas_Object* toast() const
-    {
-        Evas_Object* top = evas_object_top_get(evas_object_evas_get(_window));
-        return top && evas_object_layer_get(top) == EVAS_LAYER_MAX - 1 ? top : nullptr;
-    }
+    Evas_Object* toast() const { return evas_object_name_find(evas_object_evas_get(_window), "mewlo/toast"); }
     std::string text() const { return edje_object_part_text_get(toast(), "text"); }
     Box box() const
     {
