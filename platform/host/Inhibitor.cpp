@@ -55,7 +55,7 @@ Inhibitor::~Inhibitor()
         ::close(_descriptor);
 }
 
-bool Inhibitor::_ask(Wish wish, std::function<void()> refused)
+bool Inhibitor::_ask(Wish wish, const std::function<void()>& refused)
 {
     BusInLoop* bus = systemBus();
     if (bus == nullptr)

@@ -22,7 +22,7 @@ public:
     [[nodiscard]] bool isHeld() const { return _descriptor >= 0; }
 
 private:
-    bool _ask(Wish wish, std::function<void()> refused);
+    bool _ask(Wish wish, const std::function<void()>& refused);
 
     std::string _why;
     int _descriptor = -1;

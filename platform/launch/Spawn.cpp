@@ -50,6 +50,7 @@ pid_t spawn(const std::vector<std::string>& command, int descriptor)
     if (command.empty())
         return -1;
     std::vector<char*> words;
+    words.reserve(command.size() + 1);
     for (const std::string& word : command)
         words.push_back(const_cast<char*>(word.c_str())); // the interface of exec, which does not write
     words.push_back(nullptr);

@@ -53,7 +53,7 @@ namespace {
 
 }
 
-std::unique_ptr<PlayerPipeline> PlayerPipeline::open(const std::string& path, Events events, Opened& opened)
+std::unique_ptr<PlayerPipeline> PlayerPipeline::open(const std::string& path, const Events& events, Opened& opened)
 {
     opened = Opened::UNREADABLE;
     if (!isGStreamerReady())

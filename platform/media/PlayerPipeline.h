@@ -23,7 +23,7 @@ public:
 
     // Opens the file up to its first sound, paused. Known formats get a chain of their own, others the decoder's
     // choice.
-    static std::unique_ptr<PlayerPipeline> open(const std::string& path, Events events, Opened& opened);
+    static std::unique_ptr<PlayerPipeline> open(const std::string& path, const Events& events, Opened& opened);
     ~PlayerPipeline();
     PlayerPipeline(const PlayerPipeline&) = delete;
     PlayerPipeline& operator=(const PlayerPipeline&) = delete;
