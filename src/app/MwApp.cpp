@@ -50,7 +50,12 @@ void showFolder(const std::string& directory)
     MW_CALL(app_control_set_app_id, request.get(), FILE_MANAGER_APP_ID);
     MW_CALL(app_control_set_uri, request.get(), ("file://" + directory).c_str());
     MW_CALL(app_control_set_launch_mode, request.get(), APP_CONTROL_LAUNCH_MODE_GROUP);
-    MW_CALL(app_control_send_launch_request, request.get(), nullptr, nullptr);
+    if (MW_CALL(app_control_send_launch_request, request.get(), nullptr, nullptr))
+        return;
+    std::string message = mwTranslate("IDS_MW_TPOP_RECORDINGS_ARE_IN_PS");
+    if (const size_t place = message.find("%s"); place != std::string::npos)
+        message.replace(place, 2, directory);
+    notification_status_message_post(message.c_str());
 }
 
 template <typename Apply>
@@ -261,7 +266,8 @@ void MwApp::_launchFirst()
 }
 
 // The one place that says what opens after a stop and for the recordings button. After a stop the recorder is ready for
-// the next recording and says what it saved; the button shows the recordings in the desktop's file manager.
+// the next recording and says what it saved (a request is answered instead); the button shows the recordings in the
+// desktop's file manager.
 void MwApp::_openRecordings()
 {
     const std::string saved = _appController->getLastSavedPath();
@@ -270,6 +276,10 @@ void MwApp::_openRecordings()
         return;
     }
     _shownPath = saved;
+    if (_model->isRequestMode() && !saved.empty()) {
+        _appController->replyAndExit();
+        return;
+    }
     if (!saved.empty()) {
         const std::string name = saved.substr(saved.rfind('/') + 1);
         notification_status_message_post(

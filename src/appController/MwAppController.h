@@ -71,6 +71,9 @@ public:
     void setRecordingsOpener(std::function<void()> opener) { _recordingsOpener = std::move(opener); }
     void openRecordings();
 
+    // Request mode: answers the caller with the recording and ends this instance.
+    void replyAndExit();
+
     // The path of the last recording saved by this process; empty when none.
     [[nodiscard]] std::string getLastSavedPath() const;
 

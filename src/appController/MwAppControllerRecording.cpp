@@ -166,8 +166,8 @@ bool MwAppController::_cancelRecording(bool interrupted)
         cancelled = false;
     }
     _destroyRecorderHandle();
-    if (cancelled)
-        _releaseTemporaryFile();
+    if (interrupted)
+        _releaseTemporaryFile(); // the recorder's own cancel has done it already
     _soundSession->unsetRecordSoundSession();
     _model->setRecorderState(MwRecorder::REC_STATE_READY);
     _model->clearBookMark();
@@ -385,6 +385,11 @@ void MwAppController::_pauseInRequestMode()
                 MW_LOGE("_stopRecording failed");
         }
     }
+    replyAndExit();
+}
+
+void MwAppController::replyAndExit()
+{
     if (_model->getRequestHandle() != nullptr && !_replyWithRecording())
         return;
     ui_app_exit();

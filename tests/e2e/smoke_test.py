@@ -103,7 +103,7 @@ def minimised_goes_on_and_close_saves(place):
     check(decoded_ms(recordings(place)[0][0]) > 1300, "all of it")
 
 
-def request_returns_a_path(place):
+def request_once(place, end):
     request = place.start(os.path.join(BIN, "mewlo-tool"), "request", "--mime", "audio/AMR", "--max-kb", "100",
                           stdout=subprocess.PIPE, text=True)
     place.wait_for("the window", place.window, 30)
@@ -113,10 +113,19 @@ def request_returns_a_path(place):
     temporary = place.env["MEWLO_DEVICE_ROOT"] + "/.mw_temp"
     place.wait_for("the recording", lambda: os.path.exists(temporary))
     time.sleep(1.5)
-    place.call("xdotool", "windowminimize", place.window())
+    if end == "minimise":
+        place.call("xdotool", "windowminimize", place.window())
+    else:
+        place.call("xdotool", "key", "Return")
     path = request.communicate(timeout=20)[0].strip()
     check(request.returncode == 0, "status 0")
     check(path.endswith(".amr") and decoded_ms(path) > 1000, path)
+    place.wait_for("the end of the window", lambda: place.window() is None)
+
+
+def request_returns_a_path(place):
+    for end in ("minimise", "stop"):
+        request_once(place, end)
     small = subprocess.run([os.path.join(BIN, "mewlo-tool"), "request", "--max-kb", "2"], env=place.env, capture_output=True,
                            text=True, timeout=30)
     check(small.returncode == 1 and "min_size_error" in small.stderr, small.stderr)
