@@ -10,7 +10,8 @@ namespace support {
 inline bool runUntil(const std::function<bool()>& condition, double limit = 5.0)
 {
     // The timer wakes a loop that has nothing else to do, so that the limit is kept.
-    Ecore_Timer* tick = ecore_timer_add(0.01, [](void*) -> Eina_Bool { return ECORE_CALLBACK_RENEW; }, nullptr);
+    Ecore_Timer* tick = ecore_timer_add(
+        0.01, [](void*) -> Eina_Bool { return ECORE_CALLBACK_RENEW; }, nullptr);
     const double end = ecore_time_get() + limit;
     bool met = condition();
     while (!met && ecore_time_get() < end) {
