@@ -4,6 +4,7 @@
 
 #include <cstdlib>
 #include <fcntl.h>
+#include <filesystem>
 #include <sys/inotify.h>
 #include <unistd.h>
 
@@ -32,6 +33,9 @@ void Notice::touch(int pid)
 bool Notice::watch(std::function<void(int pid)> callback)
 {
     unwatch();
+    // On the very first start the database, which makes the folder, may still be opening.
+    std::error_code ignored;
+    std::filesystem::create_directories(std::filesystem::path(_path).parent_path(), ignored);
     const int file = ::open(_path.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0644);
     if (file >= 0)
         ::close(file);

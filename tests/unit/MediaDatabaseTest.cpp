@@ -158,6 +158,26 @@ TEST_F(MediaDatabaseTest, OtherProcessesAreToldOfCommits)
     media_content_unset_db_updated_cb();
 }
 
+TEST_F(MediaDatabaseTest, IsWatchedFromTheVeryFirstStart)
+{
+    media_content_disconnect();
+    for (int i = 0; i < 20; ++i) {
+        // The folder of the database does not exist yet, and the database opens beside the caller.
+        ::setenv("MEWLO_MEDIA_DB", _directory.file(std::to_string(i) + "/a/media.db").c_str(), 1);
+        ASSERT_EQ(0, media_content_connect());
+        int heard = 0;
+        const auto callback
+            = [](media_content_error_e, int, media_content_db_update_item_type_e, media_content_db_update_type_e,
+                  media_content_type_e, char*, char*, char*, void* data) { ++*static_cast<int*>(data); };
+        ASSERT_EQ(0, media_content_set_db_updated_cb(callback, &heard));
+        addRecording("a.m4a");
+        EXPECT_TRUE(support::runUntil([&] { return heard > 0; }));
+        media_content_unset_db_updated_cb();
+        media_content_disconnect();
+    }
+    ASSERT_EQ(0, media_content_connect());
+}
+
 TEST_F(MediaDatabaseTest, ScanningKeepsRowsOfAFolderThatIsAway)
 {
     addRecording("a.m4a");
