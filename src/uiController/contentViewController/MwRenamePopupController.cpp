@@ -23,6 +23,8 @@ constexpr auto WINDOW_NAME = "mewlo_rename_popup_win";
 constexpr auto INVALID_CHARACTERS = "\\:/*?\"<>|";
 constexpr int WINDOW_WIDTH = 680; // design units
 constexpr int WINDOW_HEIGHT = 330;
+constexpr double SELECT_INTERVAL = 0.1; // seconds
+constexpr int SELECT_ROUNDS = 5;
 
 int scaled(int units) { return static_cast<int>(units * elm_config_scale_get() / elm_app_base_scale_get()); }
 
@@ -277,7 +279,21 @@ void MwRenamePopupController::_windowFocusedCb(void* data, Evas_Object* window, 
 {
     evas_object_smart_callback_del_full(window, "focus,in", _windowFocusedCb, data);
     auto* self = static_cast<MwRenamePopupController*>(data);
-    self->_selectJob = WTimer::addJob([self](void*) { elm_entry_select_all(self->_entry); });
+    self->_keepSelected();
+}
+
+// The entry itself gets the keyboard some time after its window, and then drops its selection. Whoever types before
+// that has begun a name already.
+void MwRenamePopupController::_keepSelected()
+{
+    WTimer::destroy(_selectJob);
+    _selectJob = WTimer::addTimer(SELECT_INTERVAL, [this, rounds = 0](void*) mutable {
+        if (_initialText != elm_entry_entry_get(_entry))
+            return false;
+        elm_entry_select_none(_entry); // selecting what counts as selected already would do nothing
+        elm_entry_select_all(_entry);
+        return ++rounds < SELECT_ROUNDS;
+    });
 }
 
 void MwRenamePopupController::_entryMaxlengthReachedCb(void*, Evas_Object*, void*)

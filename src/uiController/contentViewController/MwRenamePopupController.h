@@ -48,6 +48,7 @@ private:
     [[nodiscard]] std::string _entryText() const;
     void _respond(const char* text, int response);
 
+    void _keepSelected();
     static void _windowFocusedCb(void* data, Evas_Object* object, void* info);
     static void _windowDelCb(void* data, Eo* canvas, Evas_Object* window, void* info);
     static void _cancelButtonClicked(void* data, Evas_Object* object, void* info);
