@@ -66,7 +66,11 @@ TEST_F(RenamePopupTest, OffersTheNameSelectedAndEnablesOnlyAChangedVisibleOne)
     EXPECT_FALSE(canRename());
     elm_entry_select_none(_popup->getEntry()); // as happens when a window gets the keyboard
     evas_object_smart_callback_call(_popup->getWindow(), "focus,in", nullptr);
-    support::runFor(0.02);
+    const auto isSelected = [this] {
+        const char* selection = elm_entry_selection_get(_popup->getEntry());
+        return selection != nullptr && *selection != '\0';
+    };
+    EXPECT_TRUE(support::runUntil(isSelected));
     type("x"); // takes the place of the selection
     EXPECT_EQ("x", entered());
     EXPECT_TRUE(canRename());
