@@ -10,6 +10,9 @@ std::string mwFormat(const char* format, ...) __attribute__((format(printf, 1, 2
 // The translated text of a string identifier.
 std::string mwTranslate(const char* id);
 
+// Shows the translated text of an identifier to the user as a status message. Any thread.
+void mwPost(const char* id);
+
 // Adopts a text that a service allocated; null becomes the empty string.
 inline std::string mwAdopt(char* text)
 {

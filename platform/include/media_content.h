@@ -74,5 +74,6 @@ int media_info_foreach_bookmark_from_db(
     const char* media_id, filter_h filter, media_bookmark_cb callback, void* user_data);
 int media_bookmark_get_bookmark_id(media_bookmark_h bookmark, int* id);
 int media_bookmark_get_marked_time(media_bookmark_h bookmark, unsigned int* time);
-int media_bookmark_get_name(media_bookmark_h bookmark, char** name);
+// Answers the name of the bookmark, which has no picture.
+int media_bookmark_get_thumbnail_path(media_bookmark_h bookmark, char** name);
 }

@@ -521,7 +521,7 @@ int media_bookmark_get_marked_time(media_bookmark_h bookmark, unsigned int* time
     return MEDIA_CONTENT_ERROR_NONE;
 }
 
-int media_bookmark_get_name(media_bookmark_h bookmark, char** name)
+int media_bookmark_get_thumbnail_path(media_bookmark_h bookmark, char** name)
 {
     return bookmark != nullptr ? giveText(bookmark->row.name, name) : MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
 }

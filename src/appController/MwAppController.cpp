@@ -2,7 +2,6 @@
 
 #include <app.h>
 #include <message_port.h>
-#include <notification.h>
 #include <panekit/WPopupController.h>
 #include <panekit/WWindowController.h>
 

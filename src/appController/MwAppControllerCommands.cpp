@@ -1,6 +1,5 @@
 #include "MwAppController.h"
 
-#include <notification.h>
 
 #include "MwAvrcp.h"
 #include "MwLog.h"
@@ -128,7 +127,7 @@ bool MwAppController::_executeStop(bool interrupted)
     _ungrabMediaKey();
     bool stopped = false;
     if (_model->getElapsedTime() < SHORTEST_RECORDING_MS) {
-        notification_status_message_post(mwTranslate("IDS_MW_TPOP_COULDNT_SAVE_RECORDING_RECODING_TOO_SHORT").c_str());
+        mwPost("IDS_MW_TPOP_COULDNT_SAVE_RECORDING_RECODING_TOO_SHORT");
         stopped = _cancelRecording(interrupted);
     } else {
         stopped = _stopRecording(interrupted);

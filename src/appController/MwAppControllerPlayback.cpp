@@ -1,6 +1,5 @@
 #include "MwAppController.h"
 
-#include <notification.h>
 
 #include "MwAvrcp.h"
 #include "MwLog.h"
@@ -12,8 +11,6 @@ namespace {
 
 constexpr int AUDIO = 0, VIDEO = 1; // kinds of recording asked about
 constexpr unsigned int RESTART_THRESHOLD_MS = 3000;
-
-void post(const char* id) { notification_status_message_post(mwTranslate(id).c_str()); }
 
 bool endsByItself(player_interrupted_code_e code)
 {
@@ -27,12 +24,12 @@ bool MwAppController::_refusedByRecording()
 {
     if (_recorder->isInRecording(AUDIO)) {
         MW_LOGE("Other audio recordings");
-        post("IDS_MW_TPOP_CANT_PLAY_RECORDINGS_WHILE_RECORDING_AUDIO");
+        mwPost("IDS_MW_TPOP_CANT_PLAY_RECORDINGS_WHILE_RECORDING_AUDIO");
         return true;
     }
     if (_recorder->isInRecording(VIDEO)) {
         MW_LOGE("Other vedio recordings");
-        post("IDS_FM_TPOP_CANT_PLAY_RECORDINGS_WHILE_RECORDING_VIDEO");
+        mwPost("IDS_FM_TPOP_CANT_PLAY_RECORDINGS_WHILE_RECORDING_VIDEO");
         return true;
     }
     return false;
@@ -54,7 +51,7 @@ bool MwAppController::_isPlayingAllowed()
     }
     if (MwSystemMgr::getInstance()->isCallConnected()) {
         MW_LOGE("call is connected");
-        post("IDS_FM_TPOP_CANT_PLAY_RECORDINGS_DURING_CALLS");
+        mwPost("IDS_FM_TPOP_CANT_PLAY_RECORDINGS_DURING_CALLS");
         return false;
     }
     return !_refusedByRecording();
@@ -66,7 +63,7 @@ bool MwAppController::_startPlaying()
         return false;
     if (!_player->start()) {
         MW_LOGE("play start failed");
-        post("IDS_MW_POP_UNABLE_TO_PLAY");
+        mwPost("IDS_MW_POP_UNABLE_TO_PLAY");
         return false;
     }
     _resumeAfterInterruption = false;
@@ -102,7 +99,7 @@ bool MwAppController::_resumePlaying()
     }
     if (!_player->resume()) {
         MW_LOGE("play resume failed");
-        post("IDS_MW_POP_UNABLE_TO_PLAY");
+        mwPost("IDS_MW_POP_UNABLE_TO_PLAY");
         return false;
     }
     MwSystemMgr::getInstance()->requestLockCPU();

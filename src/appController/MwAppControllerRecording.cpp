@@ -25,8 +25,6 @@ namespace {
 
 constexpr int AUDIO = 0; // kind of recording asked about
 
-void post(const char* id) { notification_status_message_post(mwTranslate(id).c_str()); }
-
 bool isRecordingOrPaused(const MwModel& model)
 {
     const int state = model.getRecorderState();
@@ -61,7 +59,7 @@ bool MwAppController::_startRecording()
     }
     if (_recorder->isInRecording(AUDIO)) {
         MW_LOGE("Other app is recording");
-        post("IDS_MW_TPOP_UNABLE_TO_START_NEW_RECORDING_OTHER_APP_ALREADY_RECORDING");
+        mwPost("IDS_MW_TPOP_UNABLE_TO_START_NEW_RECORDING_OTHER_APP_ALREADY_RECORDING");
         return false;
     }
     if (const std::string name = _model->getRenameString(); !name.empty()) {
@@ -73,7 +71,7 @@ bool MwAppController::_startRecording()
     }
     if (const int reason = _soundSession->setRecordSoundSession(); reason != MwSoundSession::SESSION_RESULT_NONE) {
         MW_LOGE("set sound session failed : [%d]!!!", reason);
-        post(reason == MwSoundSession::SESSION_RESULT_BLOCKED_BY_CALL ? "IDS_MW_TPOP_CANT_RECORD_VOICE_DURING_CALLS"
+        mwPost(reason == MwSoundSession::SESSION_RESULT_BLOCKED_BY_CALL ? "IDS_MW_TPOP_CANT_RECORD_VOICE_DURING_CALLS"
                                                                       : "IDS_MUSIC_TPOP_CANT_RECORD_VOICE");
         return false;
     }
@@ -109,11 +107,11 @@ bool MwAppController::_setUpRecorder()
 void MwAppController::_postStartFailure(MwRecorder::ErrorType error)
 {
     if (error == MwRecorder::ERROR_OUT_OF_STORAGE)
-        post("IDS_MW_POP_NOT_ENOUGH_MEMORY_DELETE_SOME_ITEMS");
+        mwPost("IDS_MW_POP_NOT_ENOUGH_MEMORY_DELETE_SOME_ITEMS");
     else if (error == MwRecorder::ERROR_BLOCKED_BY_CALL)
-        post("IDS_MW_TPOP_CANT_RECORD_VOICE_DURING_CALLS");
+        mwPost("IDS_MW_TPOP_CANT_RECORD_VOICE_DURING_CALLS");
     else
-        post("IDS_MUSIC_TPOP_CANT_RECORD_VOICE");
+        mwPost("IDS_MUSIC_TPOP_CANT_RECORD_VOICE");
 }
 
 bool MwAppController::_pauseRecording()
@@ -372,7 +370,7 @@ void MwAppController::_stoppedByItself(Result result)
     }
     const bool wasTooShort = _lastSavedPath.empty();
     if (!reason.empty() && !wasTooShort)
-        post(reason.c_str());
+        mwPost(reason.c_str());
 }
 
 void MwAppController::_pauseInRequestMode()

@@ -1,6 +1,7 @@
 #include "MwText.h"
 
 #include <glib.h>
+#include <notification.h>
 
 #include <cstdarg>
 #include <libintl.h>
@@ -21,3 +22,5 @@ std::string mwTranslate(const char* id)
     const char* text = gettext(id);
     return text != nullptr ? text : id;
 }
+
+void mwPost(const char* id) { notification_status_message_post(mwTranslate(id).c_str()); }

@@ -113,7 +113,7 @@ bool MwModel::addBookMark(unsigned int& markedTime)
         if (std::any_of(
                 _bookmarks.begin(), _bookmarks.end(), [&](const MwBookmark& b) { return b.markedTime == second; })) {
             MW_LOGE("book mark position is already existing!!");
-            notification_status_message_post(mwTranslate("IDS_MW_TPOP_ALREADY_ADDED_TO_BOOKMARKS").c_str());
+            mwPost("IDS_MW_TPOP_ALREADY_ADDED_TO_BOOKMARKS");
             return false;
         }
         const int index = static_cast<int>(_bookmarks.size());

@@ -54,6 +54,9 @@ public:
     [[nodiscard]] const std::vector<MwFileInfo>& getRecordedFileList() const { return _recordedFiles; }
     // Borrowed until the list changes; null when it is not listed.
     [[nodiscard]] const MwFileInfo* getRecordedFileInfoByPath(const std::string& path) const;
+    // Keep the list in step with a file that was deleted or renamed. False when the path is not listed.
+    bool removeRecordedFile(const std::string& path);
+    bool renameRecordedFile(const std::string& path, const std::string& newPath, const std::string& newDisplayName);
     [[nodiscard]] std::optional<std::string> getPreviousPlayPath() const;
     [[nodiscard]] std::optional<std::string> getNextPlayPath() const;
     // Milliseconds, 0 when unknown.

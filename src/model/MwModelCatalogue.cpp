@@ -146,6 +146,23 @@ const MwFileInfo* MwModel::getRecordedFileInfoByPath(const std::string& path) co
     return found != _recordedFiles.end() ? &*found : nullptr;
 }
 
+bool MwModel::removeRecordedFile(const std::string& path)
+{
+    return std::erase_if(_recordedFiles, [&](const MwFileInfo& info) { return info.path == path; }) > 0;
+}
+
+bool MwModel::renameRecordedFile(
+    const std::string& path, const std::string& newPath, const std::string& newDisplayName)
+{
+    const auto found = std::find_if(
+        _recordedFiles.begin(), _recordedFiles.end(), [&](const MwFileInfo& info) { return info.path == path; });
+    if (found == _recordedFiles.end())
+        return false;
+    found->path = newPath;
+    found->displayName = newDisplayName;
+    return true;
+}
+
 std::optional<size_t> MwModel::_currentPlayIndex() const
 {
     const MwFileInfo* info = getRecordedFileInfoByPath(getCurrentPlayPath());

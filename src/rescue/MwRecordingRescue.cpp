@@ -169,6 +169,6 @@ std::vector<std::string> MwRecordingRescue::run(MwModel& model)
     if (!work.rescued.empty())
         notification_status_message_post(tellRescued(work.rescued).c_str());
     else if (work.beyondRescue > 0)
-        notification_status_message_post(mwTranslate("IDS_MW_TPOP_RECORDING_BEYOND_RESCUE_KEPT").c_str());
+        mwPost("IDS_MW_TPOP_RECORDING_BEYOND_RESCUE_KEPT");
     return work.rescued;
 }

@@ -1,6 +1,5 @@
 #include "MwSystemMgr.h"
 
-#include <notification.h>
 #include <storage.h>
 #include <system_info.h>
 
@@ -143,7 +142,7 @@ bool MwSystemMgr::isStorageFull()
 // Answers what isStorageFull answers after the switch: false.
 bool MwSystemMgr::_useOtherStorage(int type, const char* message)
 {
-    notification_status_message_post(mwTranslate(message).c_str());
+    mwPost(message);
     _model->setStorageType(static_cast<MwStorageType>(type));
     return false;
 }

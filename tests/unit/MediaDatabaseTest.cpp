@@ -78,7 +78,7 @@ TEST_F(MediaDatabaseTest, BookmarksGoWithTheirRecording)
     std::string order;
     const auto collect = [](media_bookmark_h bookmark, void* data) {
         char* name = nullptr;
-        media_bookmark_get_name(bookmark, &name);
+        media_bookmark_get_thumbnail_path(bookmark, &name);
         *static_cast<std::string*>(data) += mwAdopt(name) + " ";
         return true;
     };

@@ -5,7 +5,6 @@
 #include <Elementary.h>
 
 #include <app.h>
-#include <notification.h>
 #include <panekit/WPopupController.h>
 
 #include "MwLog.h"
@@ -22,15 +21,6 @@ namespace {
 
 constexpr auto LAYOUT_FILE = "edje/MwRecorderContentView.edj";
 constexpr auto LAYOUT_GROUP = "recorder_content_view";
-
-void post(const char* id) { notification_status_message_post(mwTranslate(id).c_str()); }
-
-template <typename Signal>
-void forget(Signal& signal, unsigned int& listener)
-{
-    if (const unsigned int id = std::exchange(listener, 0); id != 0)
-        signal.removeListener(id);
-}
 
 }
 
@@ -104,8 +94,8 @@ void MwRecorderContentViewController::_stopListening()
     MwSignalMgr* signals = MwSignalMgr::existing();
     if (!signals)
         return;
-    forget(signals->getSystemInfoSignal(), _systemInfoListener);
-    forget(signals->getLifeCycleSignal(), _lifeCycleListener);
+    mwForget(signals->getSystemInfoSignal(), _systemInfoListener);
+    mwForget(signals->getLifeCycleSignal(), _lifeCycleListener);
 }
 
 void MwRecorderContentViewController::onDestroy()
@@ -135,7 +125,7 @@ void MwRecorderContentViewController::onTop()
     _updateContentView();
     if (getModel()->getRecorderState() == MwRecorder::REC_STATE_RECORDING
         && MwSystemMgr::getInstance()->isEarjackInserted())
-        post("IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
+        mwPost("IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
 }
 
 bool MwRecorderContentViewController::_isRecordingOrPaused() const
@@ -236,7 +226,7 @@ void MwRecorderContentViewController::_earjackInserted()
 {
     if (!isTop() || getModel()->getAppState() != MwModel::APP_STATE_RESUMED)
         return;
-    post(getModel()->getRecorderState() == MwRecorder::REC_STATE_NONE
+    mwPost(getModel()->getRecorderState() == MwRecorder::REC_STATE_NONE
             ? "IDS_MW_TPOP_EXTERNAL_MICROPHONE_WILL_BE_USED_TO_RECORD"
             : "IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
 }

@@ -3,7 +3,6 @@
 
 #include <Elementary.h>
 
-#include <notification.h>
 #include <panekit/WMenuPopupController.h>
 
 #include "MwLog.h"
@@ -22,8 +21,6 @@ namespace {
 
 constexpr unsigned long long SHORTEST_RECORDING = 1000; // milliseconds
 constexpr double BOOKMARK_PAUSE = 1.0; // seconds
-
-void post(const char* id) { notification_status_message_post(mwTranslate(id).c_str()); }
 
 }
 
@@ -53,7 +50,7 @@ void MwRecorderContentViewController::_recordButtonClicked()
     }
     if (MwSystemMgr::getInstance()->isCallConnected()) {
         MW_LOGW("call is connected");
-        post("IDS_MW_TPOP_CANT_RECORD_VOICE_DURING_CALLS");
+        mwPost("IDS_MW_TPOP_CANT_RECORD_VOICE_DURING_CALLS");
         return;
     }
     if (MwSystemMgr::getInstance()->isStorageFull()) {
@@ -83,7 +80,7 @@ void MwRecorderContentViewController::_recordingStarted(MwAppController::Result 
         return;
     }
     if (MwSystemMgr::getInstance()->isEarjackInserted())
-        post("IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
+        mwPost("IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
 }
 
 void MwRecorderContentViewController::_stopButtonClicked()
@@ -103,7 +100,7 @@ void MwRecorderContentViewController::_stopButtonClicked()
 void MwRecorderContentViewController::_cancelTooShortRecording()
 {
     MW_LOGW("current elapsedTime is under 1 sec");
-    post("IDS_MW_TPOP_COULDNT_SAVE_RECORDING_RECODING_TOO_SHORT");
+    mwPost("IDS_MW_TPOP_COULDNT_SAVE_RECORDING_RECODING_TOO_SHORT");
     if (!_dispatchAsync(MwAppController::CANCEL_RECORDING, &MwRecorderContentViewController::_tooShortCancelled)) {
         MW_LOGE("Record stop failed!");
         return;

@@ -7,7 +7,6 @@
 
 #include <app.h>
 #include <app_control.h>
-#include <notification.h>
 #include <panekit/WPopupController.h>
 
 #include "MwHandle.h"
@@ -24,8 +23,6 @@ using panekit::WPopupController;
 namespace {
 
 constexpr auto STORAGE_SETTINGS = "com.tovanic.setting.storage";
-
-void post(const char* id) { notification_status_message_post(mwTranslate(id).c_str()); }
 
 void closePopup(WPopupController* popup) { popup->destroy(); }
 
@@ -52,7 +49,7 @@ void MwRecorderContentViewController::_renameResponseCb(const char* text, int re
     if (response == MwRenamePopupController::RESPONSE_RENAME && text) {
         const std::string name = text;
         if (getModel()->checkRecordFileNameExist(name)) {
-            post("IDS_MW_POP_RENAMEALREADYUSED");
+            mwPost("IDS_MW_POP_RENAMEALREADYUSED");
             return;
         }
         getModel()->setRenameString(name);
@@ -141,7 +138,7 @@ void MwRecorderContentViewController::_discardRecording()
     getModel()->clearBookMark();
     // Closes the popup when the recorder is ready again.
     _updateContentView();
-    post("IDS_MW_TPOP_RECORDING_DISCARDED_M_SOUND");
+    mwPost("IDS_MW_TPOP_RECORDING_DISCARDED_M_SOUND");
 }
 
 void MwRecorderContentViewController::_createStorageFullPopup()

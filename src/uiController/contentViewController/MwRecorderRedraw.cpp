@@ -7,7 +7,6 @@
 
 #include <Elementary.h>
 
-#include <notification.h>
 #include <panekit/WPopupController.h>
 
 #include "MwCircleRecordingEffect.h"
@@ -210,7 +209,7 @@ void MwRecorderContentViewController::_setCallRejection(bool enable)
     if (!enable)
         return;
     MwLoggingMgr::getInstance()->insert("REJC");
-    notification_status_message_post(mwTranslate("IDS_MW_TPOP_INCOMING_CALLS_BLOCKED_WHILE_RECORDING").c_str());
+    mwPost("IDS_MW_TPOP_INCOMING_CALLS_BLOCKED_WHILE_RECORDING");
 }
 
 void MwRecorderContentViewController::_createUpdateNextRecordingFileNameTimer()

@@ -198,7 +198,7 @@ void MwRenamePopupController::_invalidCharacterFilter(void*, Evas_Object*, char*
         return;
     std::free(*text);
     *text = valid.empty() ? nullptr : elm_entry_utf8_to_markup(valid.c_str());
-    notification_status_message_post(mwTranslate("IDS_IDLE_TPOP_INVALID_CHARACTER_ENTERED").c_str());
+    mwPost("IDS_IDLE_TPOP_INVALID_CHARACTER_ENTERED");
 }
 
 std::string MwRenamePopupController::_entryText() const
