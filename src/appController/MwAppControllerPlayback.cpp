@@ -1,6 +1,5 @@
 #include "MwAppController.h"
 
-
 #include "MwAvrcp.h"
 #include "MwLog.h"
 #include "MwModel.h"

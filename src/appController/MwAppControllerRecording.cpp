@@ -72,7 +72,7 @@ bool MwAppController::_startRecording()
     if (const int reason = _soundSession->setRecordSoundSession(); reason != MwSoundSession::SESSION_RESULT_NONE) {
         MW_LOGE("set sound session failed : [%d]!!!", reason);
         mwPost(reason == MwSoundSession::SESSION_RESULT_BLOCKED_BY_CALL ? "IDS_MW_TPOP_CANT_RECORD_VOICE_DURING_CALLS"
-                                                                      : "IDS_MUSIC_TPOP_CANT_RECORD_VOICE");
+                                                                        : "IDS_MUSIC_TPOP_CANT_RECORD_VOICE");
         return false;
     }
     if (!_setUpRecorder())

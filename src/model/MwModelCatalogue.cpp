@@ -151,8 +151,7 @@ bool MwModel::removeRecordedFile(const std::string& path)
     return std::erase_if(_recordedFiles, [&](const MwFileInfo& info) { return info.path == path; }) > 0;
 }
 
-bool MwModel::renameRecordedFile(
-    const std::string& path, const std::string& newPath, const std::string& newDisplayName)
+bool MwModel::renameRecordedFile(const std::string& path, const std::string& newPath, const std::string& newDisplayName)
 {
     const auto found = std::find_if(
         _recordedFiles.begin(), _recordedFiles.end(), [&](const MwFileInfo& info) { return info.path == path; });
