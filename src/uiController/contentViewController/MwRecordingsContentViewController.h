@@ -1,6 +1,7 @@
 #pragma once
 
 #include <array>
+#include <functional>
 #include <memory>
 #include <string>
 #include <vector>
@@ -9,15 +10,18 @@
 
 #include <panekit/WTimer.h>
 
+#include "MwAppController.h"
 #include "MwContentViewController.h"
 #include "MwHandle.h"
 #include "MwModel.h"
+#include "MwRecordingsListItem.h"
 #include "MwSignalMgr.h"
 
 class MwFileOperator;
 class MwPlayViewController;
-class MwRecordingsListItem;
+class MwRecordingsRows;
 class MwRenamePopupController;
+typedef void (*Evas_Smart_Cb)(void* data, Evas_Object* object, void* info);
 
 namespace panekit {
 class WMenuPopupController;
@@ -33,7 +37,7 @@ class WPopupController;
 class MwRecordingsContentViewController : public MwContentViewController {
 public:
     enum ViewType : int { NORMAL, PICK, DELETE, SHARE, RENAME, MOVE_TO_PRIVATE, REMOVE_FROM_PRIVATE };
-    enum ListType : int { NO_CHOICE, SINGLE_CHOICE, MULTIPLE_CHOICE };
+    using ListType = MwRecordingsListItem::ListType;
 
     MwRecordingsContentViewController(MwModel* model, MwAppController* appController);
 
@@ -50,6 +54,92 @@ protected:
     void onTop() override;
 
 private:
+    // Life and signals (MwRecordingsContentViewController.cpp)
+    bool _isComplete() const;
+    void _listen();
+    void _stopListening();
+    void _onPlayerUpdateSignal();
+    void _onSystemInfoSignal(MwSignalMgr::SystemInfo info);
+    void _mediaDBUpdated();
+    void _forgetVanishedPlayPath();
+    void _formatChanged();
+    void _themeChanged();
+    void _stopAndExit();
+    void _earjackInserted();
+    void _earjackRemoved();
+    bool _isPlayingOrPaused() const;
+    void _stopPlaying();
+
+    // Contents and redraw (MwRecordingsList.cpp)
+    // Redraws everything from the model. Rows follow every change of the catalogue: those of records that were removed
+    // from it vanish, renamed ones are rewritten. With _reloadNeeded set list and empty view change places as needed.
+    void _update();
+    void _loadContents();
+    void _createNoContents();
+    void _colourNoContents();
+    void _createList();
+    void _replaceDateFormatter();
+    void _loadListItems();
+    void _loadSelectAllItem();
+    void _removeSelectAllItem();
+    // Deletes the row of a recording; its record may go before or afterwards.
+    void _removeListItem(const std::string& path);
+    void _refreshRealizedItems();
+    void _updateController();
+    void _createRecordController();
+    void _createPlayViewController();
+    void _createTrimViewController();
+    void _destroyController();
+    void _playViewEvent(int event);
+    void _updateLater();
+    void _bringInItem();
+    void _bringInAfterFrame();
+    void _cancelBringIn();
+    static void _playerViewFulshPost(void* data, Evas* canvas, void* info);
+    void _clickRecordButton();
+
+    // Modes, title, taps (MwRecordingsSelection.cpp)
+    ListType _getListType() const;
+    ViewType _restingViewType() const;
+    void _loadTitle(size_t count);
+    void _loadTitleButtons();
+    void _setTitleButton(const char* part, const char* style, const char* textId, Evas_Smart_Cb clicked);
+    void _loadMoreButton();
+    void _enableDoneButton();
+    bool _isDonePossible() const;
+    size_t _checkedCount() const;
+    void _clearChecks();
+    void _preselect();
+    void _onSelectListItem(MwRecordingsListItem& item);
+    void _selectAll(bool checked);
+    void _playListItem(MwRecordingsListItem& item);
+    void _toggleCurrent();
+    void _playOther(MwRecordingsListItem& item);
+    void _titleRightButtonClicked();
+    void _replyWithSelected();
+
+    // Menu, keys (MwRecordingsMenu.cpp)
+    void _clickMoreKey();
+    void _clickBackKey();
+    void _enterViewType(ViewType type);
+    void _loadPrivateMoveView(ViewType type);
+    void _clickDeleteMenu();
+    void _clickShareMenu();
+    void _clickRenameMenu();
+    void _addPrivateItems(panekit::WMenuPopupController& menu);
+    void _createDeletePopup(std::function<void()> confirmed);
+    void _openBookmarks();
+    void _openDetails();
+    void _createSaveToPopup();
+    void _destroySaveToPopup();
+    void _listenToKeys(Evas_Object* object);
+    bool _keyPressed(const std::string& key);
+    void _deleteHighlighted();
+    void _renameHighlighted();
+    void _togglePlaying();
+    bool _seek(int milliseconds);
+    std::string _highlightedPath() const;
+
     // File operations (MwRecordingsFileOperations.cpp). At most one runs at a time; while it runs, a change of the
     // media database does not rebuild the list.
     void _clickDeleteButton(const std::vector<std::string>& pathList);
@@ -73,6 +163,8 @@ private:
     bool _reloadNeeded = false;
     Evas_Object* _genlist = nullptr; // at most one of these two
     Evas_Object* _noContents = nullptr;
+    MwRecordingsListItem::Context _rowContext; // shared by all rows
+    std::unique_ptr<MwRecordingsRows> _rows; // with the genlist
     MwPlayViewController* _playView = nullptr; // deletes itself with its view
     std::unique_ptr<MwFileOperator> _fileOperator;
     panekit::WPopupController* _fileOperationPopup = nullptr; // progress, deleting or clash; deletes itself
@@ -81,5 +173,6 @@ private:
     panekit::WPopupController* _saveToPopup = nullptr; // deletes itself
     std::unique_ptr<MwRenamePopupController> _renamePopup;
     std::string _renameTarget; // path
+    unsigned int _lifeCycleListener = 0;
     unsigned int _systemInfoListener = 0;
 };
