@@ -23,6 +23,7 @@ enum media_content_type_e { MEDIA_CONTENT_TYPE_OTHERS = 4, MEDIA_CONTENT_TYPE_SO
 typedef struct media_info_s* media_info_h;
 typedef struct audio_meta_s* audio_meta_h;
 typedef struct filter_s* filter_h;
+typedef struct files_lock_s* files_lock_h;
 typedef struct media_bookmark_s* media_bookmark_h;
 typedef bool (*media_info_cb)(media_info_h media, void* user_data);
 typedef bool (*media_bookmark_cb)(media_bookmark_h bookmark, void* user_data);
@@ -36,11 +37,21 @@ extern "C" {
 // that need it. A damaged database is set aside under another name and rebuilt from the files.
 int media_content_connect(void);
 int media_content_disconnect(void);
+// While a callback is set, what other programs do to the files in the recordings folders is catalogued as well, within
+// about half a second. Main loop.
 int media_content_set_db_updated_cb(media_content_db_updated_cb callback, void* user_data);
 int media_content_unset_db_updated_cb(void);
 // Catalogues the files of a directory that the database does not know and drops the rows whose file is gone.
 // added and removed may be null.
 int media_content_scan_folder(const char* directory, int* added, int* removed);
+// The same for all recordings folders at once: a file that moved keeps its row and bookmarks.
+int media_content_scan_all(void);
+// Catalogues one file anew, or drops its row when it is gone.
+int media_content_scan_file(const char* path);
+// Hold while changing a file together with its row (briefly: everybody else's wait for at most two seconds), so that no
+// scan of any process sees one without the other. Free it on any thread.
+int media_content_lock_files(files_lock_h* lock);
+int media_content_unlock_files(files_lock_h lock);
 // Doubles quotes and drops what ends a condition text; newly allocated, to be put between double quotes.
 char* media_content_escape(const char* text);
 
@@ -56,6 +67,8 @@ int media_info_foreach_media_from_db(filter_h filter, media_info_cb callback, vo
 int media_info_foreach_media_from_db_with_media_mode(filter_h filter, media_info_cb callback, void* user_data);
 // Inserts (or refreshes) the row of a file; the handle is the caller's.
 int media_info_insert_to_db(const char* path, media_info_h* media);
+// The row of an identifier; the handle is the caller's.
+int media_info_get_media_from_db(const char* media_id, media_info_h* media);
 int media_info_delete_from_db(const char* media_id);
 int media_info_move_to_db(media_info_h media, const char* path);
 int media_info_destroy(media_info_h media);

@@ -90,6 +90,12 @@ public:
                                : std::string();
     }
     [[nodiscard]] long long number(int column) const { return sqlite3_column_int64(_statement, column); }
+    // Of a selection of MEDIA_COLUMNS.
+    [[nodiscard]] MediaRow mediaRow() const
+    {
+        return {text(0), text(1), text(2), text(3), static_cast<int>(number(4)), static_cast<int>(number(5)), number(6),
+            number(7), number(8), number(9), static_cast<int>(number(10))};
+    }
 
 private:
     Statement& _keep(int code)
@@ -205,20 +211,19 @@ int Database::select(const Query& query, std::vector<MediaRow>& rows)
     return _guarded([&] {
         rows.clear();
         Statement statement(_db, std::string("SELECT ") + MEDIA_COLUMNS + " FROM media WHERE 1" + tailOf(query));
-        while (statement.step()) {
-            MediaRow& row = rows.emplace_back();
-            row.id = statement.text(0);
-            row.path = statement.text(1);
-            row.displayName = statement.text(2);
-            row.mimeType = statement.text(3);
-            row.mode = static_cast<int>(statement.number(4));
-            row.storage = static_cast<int>(statement.number(5));
-            row.size = statement.number(6);
-            row.addedTime = statement.number(7);
-            row.modifiedTime = statement.number(8);
-            row.timeline = statement.number(9);
-            row.duration = static_cast<int>(statement.number(10));
-        }
+        while (statement.step())
+            rows.push_back(statement.mediaRow());
+        return statement.code();
+    });
+}
+
+int Database::find(const std::string& mediaId, std::optional<MediaRow>& row)
+{
+    return _guarded([&] {
+        row.reset();
+        Statement statement(_db, std::string("SELECT ") + MEDIA_COLUMNS + " FROM media WHERE MEDIA_ID = ?");
+        if (statement.bind(mediaId).step())
+            row = statement.mediaRow();
         return statement.code();
     });
 }
@@ -259,19 +264,34 @@ int Database::_removePath(const std::string& path)
     return statement.bind(path).run();
 }
 
-int Database::putAll(std::vector<MediaRow>& rows, const std::vector<std::string>& removedPaths)
+int Database::_moveRow(const std::string& formerPath, const MediaRow& row)
+{
+    // Ignored when somebody has entered the new path already; the next look then drops the former row.
+    Statement statement(_db,
+        "UPDATE OR IGNORE media SET MEDIA_PATH = ?, MEDIA_DISPLAY_NAME = ?, MEDIA_MODE = ?, MEDIA_STORAGE = ? "
+        "WHERE MEDIA_PATH = ? COLLATE BINARY");
+    return statement.bind(row.path).bind(row.displayName).bind(row.mode).bind(row.storage).bind(formerPath).run();
+}
+
+int Database::apply(const FileChanges& changes)
 {
     return _transaction([&] {
-        for (MediaRow& row : rows) {
-            if (const int result = _putRow(row); result != SQLITE_OK)
-                return result;
+        int result = SQLITE_OK;
+        for (auto move = changes.moved.begin(); result == SQLITE_OK && move != changes.moved.end(); ++move)
+            result = _moveRow(move->first, move->second);
+        for (auto put = changes.put.begin(); result == SQLITE_OK && put != changes.put.end(); ++put) {
+            MediaRow row = *put;
+            result = _putRow(row);
         }
-        for (const std::string& path : removedPaths) {
-            if (const int result = _removePath(path); result != SQLITE_OK)
-                return result;
-        }
-        return SQLITE_OK;
+        for (auto gone = changes.removed.begin(); result == SQLITE_OK && gone != changes.removed.end(); ++gone)
+            result = _removePath(*gone);
+        return result;
     });
+}
+
+int Database::removeByPath(const std::string& path)
+{
+    return _transaction([&] { return _removePath(path); });
 }
 
 int Database::removeById(const std::string& mediaId)

@@ -5,7 +5,9 @@
 #include <functional>
 #include <memory>
 #include <mutex>
+#include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace media {
@@ -39,6 +41,13 @@ struct Query {
     int count = -1; // all
 };
 
+// What a look at the folders found, by path.
+struct FileChanges {
+    std::vector<MediaRow> put;
+    std::vector<std::pair<std::string, MediaRow>> moved; // from the former path; the row keeps its identifier
+    std::vector<std::string> removed;
+};
+
 // The SQLite file behind the media content interface: one connection, shared by all threads under a lock. A damaged
 // file is set aside and replaced by an empty one; the caller fills it again from the recordings.
 class Database {
@@ -55,10 +64,13 @@ public:
     bool takeReplaced();
 
     int select(const Query& query, std::vector<MediaRow>& rows);
+    int find(const std::string& mediaId, std::optional<MediaRow>& row);
     // Inserts the row, or refreshes the one of the same path and takes over its identifier.
     int put(MediaRow& row);
-    int putAll(std::vector<MediaRow>& rows, const std::vector<std::string>& removedPaths);
+    // All or nothing.
+    int apply(const FileChanges& changes);
     int removeById(const std::string& mediaId);
+    int removeByPath(const std::string& path);
     int rename(const std::string& mediaId, const MediaRow& row);
 
     int insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name);
@@ -73,6 +85,7 @@ private:
     int _transaction(const Work& work);
     int _openOnce();
     int _putRow(MediaRow& row);
+    int _moveRow(const std::string& formerPath, const MediaRow& row);
     int _removePath(const std::string& path);
     void _setAside();
     void _close();

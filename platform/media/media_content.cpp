@@ -1,25 +1,24 @@
 #include <media_content.h>
 
-#include <Ecore.h>
-#include <dlog.h>
-#include <storage.h>
+#include <vconf.h>
 
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>
-#include <filesystem>
-#include <map>
 #include <memory>
+#include <optional>
 #include <string>
-#include <sys/stat.h>
-#include <system_error>
 #include <thread>
 #include <unistd.h>
 #include <utility>
 
+#include "media/FolderWatch.h"
 #include "media/MediaDatabase.h"
 #include "media/MediaFile.h"
 #include "media/MediaNotice.h"
+#include "media/MediaScan.h"
+#include "media/Rescanner.h"
+#include "state/Trees.h"
 
 struct media_info_s {
     media::MediaRow row;
@@ -33,10 +32,11 @@ struct filter_s {
 struct media_bookmark_s {
     media::BookmarkRow row;
 };
+struct files_lock_s : media::FilesLock {
+    using FilesLock::FilesLock;
+};
 
 namespace {
-
-constexpr auto RECORDINGS_DIRECTORY = "/Sounds/Mewlo";
 
 struct Connection {
     explicit Connection(const std::string& path)
@@ -46,11 +46,19 @@ struct Connection {
     }
     ~Connection()
     {
+        stopWatching();
         if (opener.joinable())
             opener.join();
     }
     Connection(const Connection&) = delete;
     Connection& operator=(const Connection&) = delete;
+
+    void stopWatching()
+    {
+        platform::stateTree().unwatch(std::exchange(cardWatch, 0));
+        folders.reset();
+        rescanner.reset();
+    }
 
     // Held from finding a database damaged until it is filled again, so that nobody reads it empty in between.
     std::recursive_mutex mutex;
@@ -59,6 +67,9 @@ struct Connection {
     media_content_db_updated_cb callback = nullptr;
     void* userData = nullptr;
     std::thread opener;
+    platform::KeyTree::WatchId cardWatch = 0;
+    std::unique_ptr<media::Rescanner> rescanner;
+    std::unique_ptr<media::FolderWatch> folders;
 };
 
 std::mutex connectionMutex; // guards the pointer and the count
@@ -153,74 +164,11 @@ int write(const Work& work)
     return toError(result);
 }
 
-struct ScanResult {
-    std::vector<media::MediaRow> changed;
-    std::vector<std::string> removed;
-    int added = 0;
-};
-
-std::map<std::string, media::MediaRow> knownRows(media::Database& database, const std::string& directory)
+int scan(Connection& held, const std::vector<std::string>& folders, media::ScanCount& count)
 {
-    std::vector<media::MediaRow> rows;
-    database.select({}, rows);
-    std::map<std::string, media::MediaRow> known;
-    for (auto& row : rows) {
-        const size_t slash = row.path.rfind('/');
-        if (slash == directory.size() && row.path.compare(0, slash, directory) == 0)
-            known.emplace(row.path, std::move(row));
-    }
-    return known;
-}
-
-bool isUnchanged(const media::MediaRow& row, const std::string& path)
-{
-    struct stat status { };
-    return ::stat(path.c_str(), &status) == 0 && row.size == status.st_size
-        && row.modifiedTime == status.st_mtim.tv_sec;
-}
-
-ScanResult compareFolder(media::Database& database, const std::string& directory)
-{
-    ScanResult result;
-    auto known = knownRows(database, directory);
-    std::error_code error;
-    for (auto entry = std::filesystem::directory_iterator(directory, error);
-         !error && entry != std::filesystem::directory_iterator(); entry.increment(error)) {
-        const std::string name = entry->path().filename().string();
-        if (!media::isRecordingName(name))
-            continue;
-        const std::string path = directory + "/" + name;
-        const auto row = known.extract(path);
-        if (!row.empty() && isUnchanged(row.mapped(), path))
-            continue;
-        if (auto described = media::describeFile(path)) {
-            result.added += row.empty() ? 1 : 0;
-            result.changed.push_back(std::move(*described));
-        }
-    }
-    // A folder that cannot be read (a card pulled out) says nothing about its files.
-    if (!error) {
-        for (const auto& [path, row] : known)
-            result.removed.push_back(path);
-    }
-    return result;
-}
-
-int scan(Connection& held, const std::string& directory, int* added, int* removed)
-{
-    std::error_code ignored;
-    if (!std::filesystem::is_directory(directory, ignored))
-        return MEDIA_CONTENT_ERROR_NONE;
-    ScanResult result = compareFolder(held.database, directory);
-    if (added != nullptr)
-        *added = result.added;
-    if (removed != nullptr)
-        *removed = static_cast<int>(result.removed.size());
-    if (result.changed.empty() && result.removed.empty())
-        return MEDIA_CONTENT_ERROR_NONE;
-    const int code = held.database.putAll(result.changed, result.removed);
+    const int code = media::scanFolders(held.database, folders, count);
     // The finds are nobody's own change: process id 0 makes every listener reload.
-    if (code == SQLITE_OK)
+    if (code == SQLITE_OK && count.changed > 0)
         held.notice.touch(0);
     return toError(code);
 }
@@ -228,9 +176,8 @@ int scan(Connection& held, const std::string& directory, int* added, int* remove
 // After a damaged database was set aside: the new one gets what the files tell.
 void refill(Connection& held)
 {
-    for (const std::string& root : {std::string(storage_device_root()), std::string(storage_card_root())})
-        scan(held, root + RECORDINGS_DIRECTORY, nullptr, nullptr);
-    scan(held, storage_private_root(), nullptr, nullptr);
+    media::ScanCount count;
+    scan(held, media::recordingFolders(), count);
 }
 
 void openNow(Connection& held)
@@ -239,6 +186,26 @@ void openNow(Connection& held)
     held.database.open();
     if (held.database.takeReplaced())
         refill(held);
+}
+
+// From now on what other programs do to the files arrives by itself.
+void watchFolders(Connection& held)
+{
+    held.folders
+        = std::make_unique<media::FolderWatch>(media::recordingFolders(), [&held] { held.rescanner->request(); });
+}
+
+void startWatching(Connection& held)
+{
+    held.rescanner = std::make_unique<media::Rescanner>([&held] {
+        media::ScanCount count;
+        scan(held, media::recordingFolders(), count);
+    });
+    watchFolders(held);
+    held.cardWatch = platform::stateTree().watch(VCONFKEY_SYSMAN_MMC_STATUS, [&held](const std::string&) {
+        watchFolders(held);
+        held.rescanner->request();
+    });
 }
 
 }
@@ -274,6 +241,8 @@ int media_content_set_db_updated_cb(media_content_db_updated_cb callback, void* 
         return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
     held->callback = callback;
     held->userData = user_data;
+    held->stopWatching();
+    startWatching(*held);
     return held->notice.watch(committed) ? MEDIA_CONTENT_ERROR_NONE : MEDIA_CONTENT_ERROR_DB_FAILED;
 }
 
@@ -282,6 +251,7 @@ int media_content_unset_db_updated_cb(void)
     const auto held = current();
     if (!held)
         return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    held->stopWatching();
     held->notice.unwatch();
     held->callback = nullptr;
     return MEDIA_CONTENT_ERROR_NONE;
@@ -294,7 +264,47 @@ int media_content_scan_folder(const char* directory, int* added, int* removed)
         return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
     if (directory == nullptr)
         return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
-    return scan(*held, directory, added, removed);
+    media::ScanCount count;
+    const int result = scan(*held, {directory}, count);
+    if (added != nullptr)
+        *added = count.added;
+    if (removed != nullptr)
+        *removed = count.removed;
+    return result;
+}
+
+int media_content_scan_all(void)
+{
+    const auto held = current();
+    if (!held)
+        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    media::ScanCount count;
+    return scan(*held, media::recordingFolders(), count);
+}
+
+int media_content_scan_file(const char* path)
+{
+    if (path == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    auto row = media::describeFile(path);
+    return write([&](media::Database& database) { return row ? database.put(*row) : database.removeByPath(path); });
+}
+
+int media_content_lock_files(files_lock_h* lock)
+{
+    const auto held = current();
+    if (!held)
+        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    if (lock == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    *lock = new files_lock_s(held->database.path());
+    return MEDIA_CONTENT_ERROR_NONE;
+}
+
+int media_content_unlock_files(files_lock_h lock)
+{
+    delete lock;
+    return MEDIA_CONTENT_ERROR_NONE;
 }
 
 char* media_content_escape(const char* text)
@@ -387,6 +397,24 @@ int media_info_insert_to_db(const char* path, media_info_h* media)
     if (result == MEDIA_CONTENT_ERROR_NONE)
         *media = new media_info_s{std::move(*row)};
     return result;
+}
+
+int media_info_get_media_from_db(const char* media_id, media_info_h* media)
+{
+    if (media_id == nullptr || media == nullptr)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    *media = nullptr;
+    const auto held = current();
+    if (!held)
+        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
+    std::optional<media::MediaRow> row;
+    const int result = read(*held, [&](media::Database& database) { return database.find(media_id, row); });
+    if (result != SQLITE_OK)
+        return toError(result);
+    if (!row)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    *media = new media_info_s{std::move(*row)};
+    return MEDIA_CONTENT_ERROR_NONE;
 }
 
 int media_info_delete_from_db(const char* media_id)

@@ -163,9 +163,8 @@ std::vector<std::string> MwRecordingRescue::run(MwModel& model)
         if (const int found = recorder_rescue_leftovers(temporary.c_str(), leftoverCb, &work); found < 0)
             MW_LOGE("recorder_rescue_leftovers failed : [%d]!!!", found);
         catalogueWaitingNotes(directoryOf(root));
-        MW_CALL(media_content_scan_folder, directoryOf(root).c_str(), nullptr, nullptr);
     }
-    MW_CALL(media_content_scan_folder, mwPrivateRoot().c_str(), nullptr, nullptr);
+    MW_CALL(media_content_scan_all);
     if (!work.rescued.empty())
         notification_status_message_post(tellRescued(work.rescued).c_str());
     else if (work.beyondRescue > 0)

@@ -4,6 +4,8 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <thread>
+
 #include "support/Recordings.h"
 #include "support/RunUntil.h"
 
@@ -45,6 +47,23 @@ protected:
         EXPECT_EQ(0, media_info_foreach_media_from_db(filter, collect, &found));
         media_filter_destroy(filter);
         return found;
+    }
+    static std::string idOf(const std::string& name)
+    {
+        filter_h filter = nullptr;
+        media_filter_create(&filter);
+        media_filter_set_condition(
+            filter, ("MEDIA_DISPLAY_NAME=\"" + name + "\"").c_str(), MEDIA_CONTENT_COLLATE_NOCASE);
+        std::string id;
+        const auto take = [](media_info_h media, void* data) {
+            char* text = nullptr;
+            media_info_get_media_id(media, &text);
+            *static_cast<std::string*>(data) = mwAdopt(text);
+            return false;
+        };
+        media_info_foreach_media_from_db(filter, take, &id);
+        media_filter_destroy(filter);
+        return id;
     }
     const support::TempDir _directory;
 };
@@ -139,8 +158,8 @@ TEST_F(MediaDatabaseTest, OtherProcessesAreToldOfCommits)
         static_cast<Heard*>(data)->pid = pid;
         ++static_cast<Heard*>(data)->count;
     };
-    ASSERT_EQ(0, media_content_set_db_updated_cb(callback, &heard));
     support::writeFile(support::recordingPath("foreign.m4a"), "x");
+    ASSERT_EQ(0, media_content_set_db_updated_cb(callback, &heard));
     // The writer is a fresh process: a database connection must not cross a fork.
     ::setenv("MEWLO_TEST_FOREIGN_FILE", support::recordingPath("foreign.m4a").c_str(), 1);
     const pid_t child = ::fork();
@@ -195,6 +214,56 @@ TEST_F(MediaDatabaseTest, ScanningKeepsRowsOfAFolderThatIsAway)
     EXPECT_EQ(1, added);
     EXPECT_EQ(0, removed);
     EXPECT_EQ(2u, names().size());
+}
+
+// What happens in the folders from outside: files come, change, go, and are renamed.
+TEST_F(MediaDatabaseTest, FollowsTheFilesWhileWatched)
+{
+    int heard = 0;
+    const auto callback
+        = [](media_content_error_e, int, media_content_db_update_item_type_e, media_content_db_update_type_e,
+              media_content_type_e, char*, char*, char*, void* data) { ++*static_cast<int*>(data); };
+    ASSERT_EQ(0, media_content_set_db_updated_cb(callback, &heard));
+    const auto become
+        = [&](const Names& expected) { return support::runUntil([&] { return names() == expected; }, 2.0); };
+    std::filesystem::remove_all(support::deviceRoot() + "/Sounds");
+    support::runFor(0.5); // the watch moves up to the nearest folder that is left
+    std::filesystem::create_directories(support::recordingsDirectory());
+    support::runFor(0.5);
+    support::writeFile(support::recordingPath("a.m4a"), "x");
+    EXPECT_TRUE(become({"a.m4a"}));
+    EXPECT_TRUE(support::runUntil([&] { return heard > 0; }));
+
+    const std::string id = idOf("a.m4a");
+    EXPECT_EQ(0, media_bookmark_insert_to_db(id.c_str(), 7, "Here"));
+    std::filesystem::rename(support::recordingPath("a.m4a"), support::recordingPath("b.m4a"));
+    EXPECT_TRUE(become({"b.m4a"}));
+    EXPECT_EQ(id, idOf("b.m4a"));
+    int bookmarks = 0;
+    media_info_get_bookmark_count_from_db(id.c_str(), nullptr, &bookmarks);
+    EXPECT_EQ(1, bookmarks);
+
+    std::filesystem::remove(support::recordingPath("b.m4a"));
+    EXPECT_TRUE(become({}));
+    media_content_unset_db_updated_cb();
+}
+
+TEST_F(MediaDatabaseTest, AScanWaitsForAFileThatIsBeingChanged)
+{
+    const std::string id = addRecording("a.m4a");
+    files_lock_h lock = nullptr;
+    ASSERT_EQ(0, media_content_lock_files(&lock));
+    std::filesystem::rename(support::recordingPath("a.m4a"), support::recordingPath("b.m4a"));
+    std::thread scanner([] { media_content_scan_all(); });
+    std::this_thread::sleep_for(std::chrono::milliseconds(50)); // it has looked by now and waits
+    media_info_h media = nullptr;
+    ASSERT_EQ(0, media_info_get_media_from_db(id.c_str(), &media));
+    EXPECT_EQ(0, media_info_move_to_db(media, support::recordingPath("b.m4a").c_str()));
+    media_info_destroy(media);
+    media_content_unlock_files(lock);
+    scanner.join();
+    EXPECT_EQ(id, idOf("b.m4a"));
+    EXPECT_EQ(Names{"b.m4a"}, names());
 }
 
 }

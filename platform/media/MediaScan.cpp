@@ -1,0 +1,151 @@
+#include "media/MediaScan.h"
+
+#include <dlog.h>
+#include <storage.h>
+
+#include <algorithm>
+#include <chrono>
+#include <fcntl.h>
+#include <filesystem>
+#include <map>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <system_error>
+#include <thread>
+#include <unistd.h>
+#include <utility>
+
+#include "media/MediaFile.h"
+
+namespace media {
+
+namespace {
+
+    constexpr auto RECORDINGS_DIRECTORY = "/Sounds/Mewlo";
+    constexpr auto LOCK_PATIENCE = std::chrono::seconds(2);
+    constexpr auto LOCK_RETRY = std::chrono::milliseconds(10);
+
+    using KnownRows = std::map<std::string, MediaRow>;
+
+    KnownRows takeRowsOf(std::vector<MediaRow>& rows, const std::string& folder)
+    {
+        KnownRows known;
+        for (auto& row : rows) {
+            const size_t slash = row.path.rfind('/');
+            if (slash == folder.size() && row.path.compare(0, slash, folder) == 0)
+                known.emplace(row.path, std::move(row));
+        }
+        return known;
+    }
+
+    bool isUnchanged(const MediaRow& row, const std::string& path)
+    {
+        struct stat status { };
+        return ::stat(path.c_str(), &status) == 0 && row.size == status.st_size
+            && row.modifiedTime == status.st_mtim.tv_sec;
+    }
+
+    struct Differences {
+        std::vector<MediaRow> found; // no row yet
+        std::vector<MediaRow> changed;
+        std::vector<MediaRow> gone;
+    };
+
+    void compareFolder(const std::string& folder, KnownRows known, Differences& differences)
+    {
+        std::error_code error;
+        for (auto entry = std::filesystem::directory_iterator(folder, error);
+             !error && entry != std::filesystem::directory_iterator(); entry.increment(error)) {
+            const std::string name = entry->path().filename().string();
+            if (!isRecordingName(name))
+                continue;
+            const std::string path = folder + "/" + name;
+            const auto row = known.extract(path);
+            if (!row.empty() && isUnchanged(row.mapped(), path))
+                continue;
+            if (auto described = describeFile(path))
+                (row.empty() ? differences.found : differences.changed).push_back(std::move(*described));
+        }
+        if (error)
+            return;
+        for (auto& [path, row] : known)
+            differences.gone.push_back(std::move(row));
+    }
+
+    // Renaming and moving keep size and time.
+    bool isSameFile(const MediaRow& gone, const MediaRow& found)
+    {
+        return gone.size == found.size && gone.timeline == found.timeline && gone.mimeType == found.mimeType;
+    }
+
+    FileChanges reconcile(Differences differences)
+    {
+        FileChanges changes;
+        changes.put = std::move(differences.changed);
+        for (MediaRow& found : differences.found) {
+            const auto former = std::find_if(differences.gone.begin(), differences.gone.end(),
+                [&](const MediaRow& gone) { return isSameFile(gone, found); });
+            if (former == differences.gone.end()) {
+                changes.put.push_back(std::move(found));
+                continue;
+            }
+            found.id = former->id;
+            changes.moved.emplace_back(former->path, std::move(found));
+            differences.gone.erase(former);
+        }
+        for (const MediaRow& gone : differences.gone)
+            changes.removed.push_back(gone.path);
+        return changes;
+    }
+
+}
+
+std::vector<std::string> recordingFolders()
+{
+    std::vector<std::string> folders;
+    for (const char* root : {storage_device_root(), storage_card_root(), storage_private_root()})
+        folders.push_back(std::string(root) + RECORDINGS_DIRECTORY);
+    return folders;
+}
+
+int scanFolders(Database& database, const std::vector<std::string>& folders, ScanCount& count)
+{
+    std::vector<MediaRow> rows;
+    if (const int result = database.select({}, rows); result != SQLITE_OK)
+        return result;
+    Differences differences;
+    for (const std::string& folder : folders)
+        compareFolder(folder, takeRowsOf(rows, folder), differences);
+    count.added = static_cast<int>(differences.found.size());
+    FileChanges changes = reconcile(std::move(differences));
+    count.added -= static_cast<int>(changes.moved.size());
+    count.removed = static_cast<int>(changes.removed.size());
+    count.changed = static_cast<int>(changes.put.size()) + static_cast<int>(changes.moved.size()) + count.removed;
+    if (count.changed == 0)
+        return SQLITE_OK;
+    // Rows that moved on in the meantime are under another path by now and not touched; files that came back stay.
+    const FilesLock lock(database.path());
+    std::erase_if(changes.removed, [](const std::string& path) { return ::access(path.c_str(), F_OK) == 0; });
+    return database.apply(changes);
+}
+
+FilesLock::FilesLock(const std::string& databasePath)
+    : _file(::open((databasePath + ".lock").c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600))
+{
+    const auto end = std::chrono::steady_clock::now() + LOCK_PATIENCE;
+    while (_file >= 0 && ::flock(_file, LOCK_EX | LOCK_NB) != 0) {
+        if (std::chrono::steady_clock::now() > end) {
+            __dlog_print(LOG_ID_MAIN, DLOG_WARN, "MEWLO", "another process holds the recordings; going on");
+            return;
+        }
+        std::this_thread::sleep_for(LOCK_RETRY);
+    }
+}
+
+FilesLock::~FilesLock()
+{
+    if (_file >= 0)
+        ::close(_file);
+}
+
+}
