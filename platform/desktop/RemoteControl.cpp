@@ -18,9 +18,9 @@ namespace {
         media_key_e key;
     };
 
-    constexpr Named METHODS[] = {{"Play", MEDIA_KEY_PLAY}, {"Pause", MEDIA_KEY_PAUSE},
-        {"PlayPause", MEDIA_KEY_PLAYPAUSE}, {"Stop", MEDIA_KEY_STOP}, {"Next", MEDIA_KEY_NEXT},
-        {"Previous", MEDIA_KEY_PREVIOUS}, {"SeekForward", MEDIA_KEY_FASTFORWARD}, {"SeekBack", MEDIA_KEY_REWIND}};
+    constexpr Named METHODS[]
+        = {{"Play", MEDIA_KEY_PLAY}, {"Pause", MEDIA_KEY_PAUSE}, {"PlayPause", MEDIA_KEY_PLAYPAUSE},
+            {"Stop", MEDIA_KEY_STOP}, {"Next", MEDIA_KEY_NEXT}, {"Previous", MEDIA_KEY_PREVIOUS}};
 
     // Keyboards have one key for play and pause; it bears the name of play.
     constexpr Named KEYBOARD[] = {{"Play", MEDIA_KEY_PLAYPAUSE}, {"Pause", MEDIA_KEY_PAUSE}, {"Stop", MEDIA_KEY_STOP},
@@ -57,7 +57,10 @@ void RemoteControl::reserve(media_key_event_cb callback, void* userData)
             _send(*key, down ? MEDIA_KEY_STATUS_PRESSED : MEDIA_KEY_STATUS_RELEASED);
     });
     if (host::BusInLoop* bus = host::sessionBus())
-        _mpris = std::make_unique<host::Mpris>(*bus, [this](const std::string& method) { _called(method); });
+        _mpris = std::make_unique<host::Mpris>(*bus,
+            host::Mpris::Handlers{[this](const std::string& method) { _called(method); },
+                [this] { return _playback.position(_playbackData); },
+                [this](int milliseconds) { _playback.seek(milliseconds, _playbackData); }});
     _recorderWatch = stateTree().watch(KEY_RECORDER_STATE, [this](const std::string&) { _update(); });
     _titleWatch = stateTree().watch(KEY_TITLE, [this](const std::string&) { _update(); });
     _update();
@@ -103,18 +106,52 @@ void RemoteControl::_send(media_key_e key, media_key_event_e status)
         _callback(key, status, _userData);
 }
 
+void RemoteControl::setPlayer(const remote_player_callbacks_s* callbacks, void* userData)
+{
+    _playback = callbacks != nullptr ? *callbacks : remote_player_callbacks_s{};
+    _playbackData = userData;
+    _update();
+}
+
+void RemoteControl::tellSeeked(int milliseconds)
+{
+    if (_mpris != nullptr)
+        _mpris->tellSeeked(milliseconds);
+}
+
+host::Mpris::State RemoteControl::_recorderState(int recorder) const
+{
+    host::Mpris::State state;
+    state.status = recorder == RECORDING ? "Playing" : "Paused";
+    state.title = stateTree().read(KEY_TITLE).value_or("");
+    state.canSkip = false;
+    return state;
+}
+
+host::Mpris::State RemoteControl::_playerState() const
+{
+    constexpr const char* STATUS[] = {"Stopped", "Playing", "Paused"};
+    host::Mpris::State state;
+    state.status = STATUS[_player];
+    remote_player_track_s track{};
+    if (_player == BT_AVRCP_PLAYER_STATE_STOPPED || _playback.track == nullptr
+        || !_playback.track(&track, _playbackData)) {
+        state.title = stateTree().read(KEY_TITLE).value_or("");
+        return state;
+    }
+    state.title = track.title;
+    state.length = track.duration;
+    state.canSeek = true;
+    return state;
+}
+
 void RemoteControl::_update()
 {
     if (_mpris == nullptr)
         return;
-    constexpr const char* STATUS[] = {"Stopped", "Playing", "Paused"};
     const int recorder = stateInt(KEY_RECORDER_STATE).value_or(0);
     const bool records = recorder == RECORDING || recorder == RECORDING_PAUSED;
-    host::Mpris::State state;
-    state.status = records ? (recorder == RECORDING ? "Playing" : "Paused") : STATUS[_player];
-    state.title = stateTree().read(KEY_TITLE).value_or("");
-    state.canSkip = !records;
-    _mpris->setState(state);
+    _mpris->setState(records ? _recorderState(recorder) : _playerState());
 }
 
 }
@@ -145,5 +182,20 @@ int media_key_release(void)
 {
     ++lastOrder;
     platform::onMainLoop([] { RemoteControl::instance().release(); });
+    return 0;
+}
+
+int remote_player_set_callbacks(const remote_player_callbacks_s* callbacks, void* user_data)
+{
+    constexpr int INVALID_PARAMETER = -22;
+    if (callbacks != nullptr && (!callbacks->track || !callbacks->position || !callbacks->seek))
+        return INVALID_PARAMETER;
+    RemoteControl::instance().setPlayer(callbacks, user_data);
+    return 0;
+}
+
+int remote_player_seeked(int position)
+{
+    platform::onMainLoop([position] { RemoteControl::instance().tellSeeked(position); });
     return 0;
 }

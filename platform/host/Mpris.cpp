@@ -1,6 +1,7 @@
 #include "Mpris.h"
 
-#include <cstring>
+#include <algorithm>
+#include <tuple>
 
 #include <unistd.h>
 
@@ -17,10 +18,13 @@ namespace {
     {
         const std::string method = sd_bus_message_get_member(message);
         const int result = sd_bus_reply_method_return(message, nullptr);
-        static_cast<const Mpris*>(self)->call(method); // last: it may end the object
+        static_cast<const Mpris*>(self)->handlers().called(method); // last: it may end the object
         return result;
     }
 
+    constexpr int64_t MICROSECONDS = 1000; // in a millisecond
+
+    // Beyond the end means the next one.
     int seekCalled(sd_bus_message* message, void* self, sd_bus_error*)
     {
         int64_t offset = 0;
@@ -28,7 +32,30 @@ namespace {
         if (result < 0)
             return result;
         sd_bus_reply_method_return(message, nullptr);
-        static_cast<const Mpris*>(self)->call(offset < 0 ? "SeekBack" : "SeekForward");
+        const auto* mpris = static_cast<const Mpris*>(self);
+        if (!mpris->state().canSeek)
+            return 1;
+        const int64_t target = mpris->handlers().position() + offset / MICROSECONDS;
+        if (mpris->state().length > 0 && target > mpris->state().length)
+            mpris->handlers().called("Next");
+        else
+            mpris->seekTo(static_cast<int>(std::max<int64_t>(target, 0)));
+        return 1;
+    }
+
+    // A place outside, or of a track that is over, is ignored.
+    int setPositionCalled(sd_bus_message* message, void* self, sd_bus_error*)
+    {
+        const char* track = nullptr;
+        int64_t position = 0;
+        const int result = sd_bus_message_read(message, "ox", &track, &position);
+        if (result < 0)
+            return result;
+        sd_bus_reply_method_return(message, nullptr);
+        const auto* mpris = static_cast<const Mpris*>(self);
+        const int64_t target = position / MICROSECONDS;
+        if (mpris->trackId() == track && target >= 0 && target <= mpris->state().length)
+            mpris->seekTo(static_cast<int>(target));
         return 1;
     }
 
@@ -56,7 +83,8 @@ namespace {
     {
         const std::string_view name = property;
         const bool skips = name == "CanGoNext" || name == "CanGoPrevious";
-        const bool truth = skips ? static_cast<const Mpris*>(self)->state().canSkip : name.starts_with("Can");
+        const auto& state = static_cast<const Mpris*>(self)->state();
+        const bool truth = skips ? state.canSkip : name == "CanSeek" ? state.canSeek : name.starts_with("Can");
         return sd_bus_message_append(reply, "b", truth ? 1 : 0);
     }
 
@@ -65,9 +93,11 @@ namespace {
         return sd_bus_message_append(reply, "d", 1.0);
     }
 
-    int readPosition(sd_bus*, const char*, const char*, const char*, sd_bus_message* reply, void*, sd_bus_error*)
+    int readPosition(sd_bus*, const char*, const char*, const char*, sd_bus_message* reply, void* self, sd_bus_error*)
     {
-        return sd_bus_message_append(reply, "x", int64_t{0});
+        const auto* mpris = static_cast<const Mpris*>(self);
+        const int position = mpris->state().canSeek ? mpris->handlers().position() : 0;
+        return sd_bus_message_append(reply, "x", position * MICROSECONDS);
     }
 
     int readList(sd_bus*, const char*, const char*, const char*, sd_bus_message* reply, void*, sd_bus_error*)
@@ -77,9 +107,14 @@ namespace {
 
     int readMetadata(sd_bus*, const char*, const char*, const char*, sd_bus_message* reply, void* self, sd_bus_error*)
     {
-        const auto& title = static_cast<const Mpris*>(self)->state().title;
-        return sd_bus_message_append(reply, "a{sv}", 2, "mpris:trackid", "o", "/com/tovanic/mewlo_lite/track",
-            "xesam:title", "s", title.c_str());
+        const auto* mpris = static_cast<const Mpris*>(self);
+        const std::string track = mpris->trackId();
+        const auto& [title, length] = std::tie(mpris->state().title, mpris->state().length);
+        if (length <= 0)
+            return sd_bus_message_append(
+                reply, "a{sv}", 2, "mpris:trackid", "o", track.c_str(), "xesam:title", "s", title.c_str());
+        return sd_bus_message_append(reply, "a{sv}", 3, "mpris:trackid", "o", track.c_str(), "xesam:title", "s",
+            title.c_str(), "mpris:length", "x", length * MICROSECONDS);
     }
 
     constexpr auto CHANGES = SD_BUS_VTABLE_PROPERTY_EMITS_CHANGE;
@@ -107,7 +142,7 @@ namespace {
         SD_BUS_METHOD("Next", "", "", methodCalled, SD_BUS_VTABLE_UNPRIVILEGED),
         SD_BUS_METHOD("Previous", "", "", methodCalled, SD_BUS_VTABLE_UNPRIVILEGED),
         SD_BUS_METHOD("Seek", "x", "", seekCalled, SD_BUS_VTABLE_UNPRIVILEGED),
-        SD_BUS_METHOD("SetPosition", "ox", "", ignoredCall, SD_BUS_VTABLE_UNPRIVILEGED),
+        SD_BUS_METHOD("SetPosition", "ox", "", setPositionCalled, SD_BUS_VTABLE_UNPRIVILEGED),
         SD_BUS_METHOD("OpenUri", "s", "", ignoredCall, SD_BUS_VTABLE_UNPRIVILEGED),
         SD_BUS_SIGNAL("Seeked", "x", 0),
         SD_BUS_PROPERTY("PlaybackStatus", "s", readText, 0, CHANGES),
@@ -123,16 +158,16 @@ namespace {
         SD_BUS_PROPERTY("CanGoPrevious", "b", readTruth, 0, CHANGES),
         SD_BUS_PROPERTY("CanPlay", "b", readTruth, 0, 0),
         SD_BUS_PROPERTY("CanPause", "b", readTruth, 0, 0),
-        SD_BUS_PROPERTY("CanSeek", "b", readTruth, 0, 0),
+        SD_BUS_PROPERTY("CanSeek", "b", readTruth, 0, CHANGES),
         SD_BUS_PROPERTY("CanControl", "b", readTruth, 0, 0),
         SD_BUS_VTABLE_END,
     };
 
 }
 
-Mpris::Mpris(BusInLoop& bus, Called called)
+Mpris::Mpris(BusInLoop& bus, Handlers handlers)
     : _bus(bus)
-    , _called(std::move(called))
+    , _handlers(std::move(handlers))
 {
     if (!_add(ROOT_INTERFACE, ROOT_TABLE) || !_add(PLAYER_INTERFACE, PLAYER_TABLE))
         return;
@@ -161,10 +196,26 @@ void Mpris::setState(const State& state)
 {
     if (_state == state)
         return;
+    if (state.title != _state.title || state.length != _state.length)
+        ++_track;
     _state = state;
     if (isOpen())
-        sd_bus_emit_properties_changed(
-            _bus.get(), PATH, PLAYER_INTERFACE, "PlaybackStatus", "Metadata", "CanGoNext", "CanGoPrevious", nullptr);
+        sd_bus_emit_properties_changed(_bus.get(), PATH, PLAYER_INTERFACE, "PlaybackStatus", "Metadata", "CanGoNext",
+            "CanGoPrevious", "CanSeek", nullptr);
+}
+
+std::string Mpris::trackId() const { return "/com/tovanic/mewlo_lite/track/" + std::to_string(_track); }
+
+void Mpris::seekTo(int milliseconds) const
+{
+    if (_state.canSeek)
+        _handlers.seek(milliseconds);
+}
+
+void Mpris::tellSeeked(int milliseconds)
+{
+    if (isOpen())
+        sd_bus_emit_signal(_bus.get(), PATH, PLAYER_INTERFACE, "Seeked", "x", milliseconds * MICROSECONDS);
 }
 
 }

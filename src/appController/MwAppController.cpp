@@ -56,13 +56,6 @@ bool sendToIndicator(const char* value)
     return true;
 }
 
-template <typename Signal>
-void dropListener(Signal& signal, unsigned int& id)
-{
-    if (id != 0)
-        signal.removeListener(std::exchange(id, 0));
-}
-
 }
 
 MwAppController::MwAppController() = default;
@@ -102,6 +95,7 @@ bool MwAppController::initialize(MwModel* model, panekit::WWindowController* win
         return false;
     }
     _mainLoopPipe.open();
+    _connectRemote();
     MW_LOGW("END");
     return true;
 }
@@ -111,6 +105,7 @@ void MwAppController::deinitialize()
     MW_LOGW("BEGIN");
     if (_model == nullptr)
         return;
+    _disconnectRemote();
     const int playerState = _model->getPlayerState();
     const bool plays = playerState == MwPlayer::PLAY_STATE_PLAYING || playerState == MwPlayer::PLAY_STATE_PAUSED;
     if (_player && plays && !dispatchCommand(STOP_PLAYING))
@@ -133,7 +128,7 @@ void MwAppController::deinitialize()
     _avrcp.reset();
     _releaseLock();
     if (MwSignalMgr* signals = MwSignalMgr::existing(); signals != nullptr)
-        dropListener(signals->getLifeCycleSignal(), _lifeCycleListener);
+        mwForget(signals->getLifeCycleSignal(), _lifeCycleListener);
     _playerUpdatedSignal.removeAll();
     _recorderUpdatedSignal.removeAll();
     _mainLoopPipe.close(); // results still on their way are freed; nobody waits for them any more
@@ -206,9 +201,9 @@ bool MwAppController::_destroyRecorder()
     const std::lock_guard lock(_commandMutex);
     if (!_recorder)
         return false;
-    dropListener(_recorder->errorSignal, _recorderErrorListener);
-    dropListener(_recorder->interruptedSignal, _recorderInterruptedListener);
-    dropListener(_recorder->limitReachedSignal, _recorderLimitListener);
+    mwForget(_recorder->errorSignal, _recorderErrorListener);
+    mwForget(_recorder->interruptedSignal, _recorderInterruptedListener);
+    mwForget(_recorder->limitReachedSignal, _recorderLimitListener);
     _recorder.reset();
     _model->setRecorderState(MwRecorder::REC_STATE_NONE);
     return true;
@@ -234,9 +229,9 @@ bool MwAppController::_destroyPlayer()
     const std::lock_guard lock(_commandMutex);
     if (!_player)
         return false;
-    dropListener(_player->getCompletedSignal(), _playerCompletedListener);
-    dropListener(_player->getInterruptedSignal(), _playerInterruptedListener);
-    dropListener(_player->getErrorSignal(), _playerErrorListener);
+    mwForget(_player->getCompletedSignal(), _playerCompletedListener);
+    mwForget(_player->getInterruptedSignal(), _playerInterruptedListener);
+    mwForget(_player->getErrorSignal(), _playerErrorListener);
     _player.reset();
     return true;
 }

@@ -3,6 +3,7 @@
 #include <media_key.h>
 #include <panekit/WTimer.h>
 #include <player.h>
+#include <remote_player.h>
 
 #include <functional>
 #include <memory>
@@ -156,6 +157,14 @@ private:
     void _releaseSeekKey(panekit::WTimer::Weak& timer, Command shortPress);
     bool _seekTick(bool forward);
     void _dispatchByKey(Command command, const char* failure);
+
+    static bool _remoteTrackCb(remote_player_track_s* track, void* userData);
+    static int _remotePositionCb(void* userData);
+    static void _remoteSeekCb(int position, void* userData);
+    void _connectRemote();
+    static void _disconnectRemote();
+    bool _remoteTrack(remote_player_track_s& track) const;
+    void _seekByRemote(unsigned int position);
 
     void _emitPlayerUpdatedSignal();
     void _emitRecorderUpdatedSignal();

@@ -137,6 +137,7 @@ bool MwAppController::_setPlayerPosition(unsigned int position)
         MW_LOGE("setPlayPosition failed");
         return false;
     }
+    remote_player_seeked(static_cast<int>(position));
     return true;
 }
 

@@ -35,6 +35,18 @@ int media_key_reserve(media_key_event_cb callback, void* data)
 }
 int media_key_release(void) { return calls.record(__func__); }
 
+int remote_player_set_callbacks(const remote_player_callbacks_s* callbacks, void* data)
+{
+    desktop.remote = callbacks != nullptr ? *callbacks : remote_player_callbacks_s{};
+    desktop.remoteData = data;
+    return 0;
+}
+int remote_player_seeked(int position)
+{
+    desktop.seekedTo = position;
+    return 0;
+}
+
 int bt_initialize(void) { return calls.record(__func__); }
 int bt_deinitialize(void) { return calls.record(__func__); }
 int bt_avrcp_target_initialize(bt_avrcp_target_connection_state_changed_cb, void*) { return calls.record(__func__); }

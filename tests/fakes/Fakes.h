@@ -5,6 +5,7 @@
 #include <player.h>
 #include <recorder.h>
 #include <recorder_leftover.h>
+#include <remote_player.h>
 #include <sound_manager.h>
 
 #include <algorithm>
@@ -77,6 +78,9 @@ struct Sound {
 struct Desktop {
     media_key_event_cb mediaKey = nullptr;
     void* mediaKeyData = nullptr;
+    remote_player_callbacks_s remote{};
+    void* remoteData = nullptr;
+    int seekedTo = -1; // milliseconds
     std::string lastMessage;
     std::vector<std::string> indicator;
     int liveCalls = 0;

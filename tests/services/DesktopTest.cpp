@@ -6,6 +6,7 @@
 #include "launch/Toolkit.h"
 #include "media_key.h"
 #include "notification.h"
+#include "remote_player.h"
 #include "tovanic_log_manager.h"
 #include "vconf.h"
 
@@ -17,6 +18,7 @@
 
 #include <Elementary.h>
 
+#include <cstring>
 #include <thread>
 
 namespace {
@@ -122,6 +124,43 @@ TEST_F(MprisTest, ShowsThePlayerAndTheRecorder)
     playerctl({"next"});
     support::runFor(0.05);
     EXPECT_EQ("", _events);
+}
+
+TEST_F(MprisTest, ShowsAndMovesThePlaceInARecording)
+{
+    static int position;
+    static std::vector<int> seeks;
+    position = 4000;
+    seeks.clear();
+    const remote_player_callbacks_s callbacks = {[](remote_player_track_s* track, void*) {
+                                                     std::strcpy(track->title, "Talk");
+                                                     track->duration = 60000;
+                                                     return true;
+                                                 },
+        [](void*) { return position; }, [](int milliseconds, void*) { seeks.push_back(milliseconds); }};
+    ASSERT_EQ(0, remote_player_set_callbacks(&callbacks, nullptr));
+    reserve();
+    EXPECT_EQ("Memo 007", playerctl({"metadata", "title"})) << "nothing is played";
+    playerctl({"position", "9"});
+    EXPECT_TRUE(seeks.empty());
+
+    bt_avrcp_target_notify_player_state(BT_AVRCP_PLAYER_STATE_PLAYING);
+    EXPECT_TRUE(runUntil([&] { return playerctl({"metadata", "title"}) == "Talk"; }));
+    EXPECT_EQ("60000000", playerctl({"metadata", "mpris:length"}));
+    EXPECT_EQ("4.0", playerctl({"position"}).substr(0, 3));
+    playerctl({"position", "9"});
+    playerctl({"position", "2.5+"});
+    playerctl({"position", "30-"});
+    EXPECT_EQ((std::vector<int>{9000, 6500, 0}), seeks);
+    _events.clear();
+    playerctl({"position", "90+"}); // beyond the end is the next one
+    EXPECT_TRUE(runUntil([&] { return _events == "4+4- "; })) << _events;
+
+    vconf_set_int(RECORDER_STATE, 2);
+    EXPECT_TRUE(runUntil([&] { return playerctl({"metadata", "title"}) == "Memo 007"; }));
+    playerctl({"position", "9"});
+    EXPECT_EQ(3u, seeks.size()) << "a recording cannot be moved in";
+    remote_player_set_callbacks(nullptr, nullptr);
 }
 
 TEST_F(MprisTest, AReceiverMayReleaseTheKeysInItsCallback)

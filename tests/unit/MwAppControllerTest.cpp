@@ -449,6 +449,26 @@ TEST_F(MwPlaybackTest, SeeksRefusePauseAndStepsFollowTheList)
     EXPECT_TRUE(fakes::log.has("getPreviousPlayPath failed!!!"));
 }
 
+TEST_F(MwPlaybackTest, RemoteControlsSeeTheRecordingAndSeekInIt)
+{
+    const auto& remote = fakes::desktop.remote;
+    remote_player_track_s track{};
+    ASSERT_TRUE(play());
+    ASSERT_TRUE(remote.track(&track, fakes::desktop.remoteData));
+    EXPECT_EQ(_model.getCurrentPlayPath(), support::recordingPath(std::string(track.title) + ".m4a"));
+    int updates = 0;
+    _controller.getPlayerUpdatedSignal().addListener([&] { ++updates; });
+    remote.seek(7000, fakes::desktop.remoteData);
+    EXPECT_TRUE(calls.has("player_set_play_position 7000"));
+    EXPECT_EQ(7000, remote.position(fakes::desktop.remoteData));
+    EXPECT_EQ(7000, fakes::desktop.seekedTo);
+    EXPECT_EQ(1, updates);
+    _model.setCurrentPlayPath("");
+    EXPECT_FALSE(remote.track(&track, fakes::desktop.remoteData));
+    _controller.deinitialize();
+    EXPECT_EQ(nullptr, fakes::desktop.remote.seek);
+}
+
 TEST_F(MwPlaybackTest, ResumesAfterACallButNotAfterAnUnpluggedHeadset)
 {
     for (const auto& [code, resumes] : std::map<player_interrupted_code_e, bool>{{PLAYER_INTERRUPTED_BY_CALL, true},
