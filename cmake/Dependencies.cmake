@@ -22,6 +22,7 @@ mewlo_pkg(EFL elementary edje evas ecore ecore-evas ecore-file ecore-x ecore-inp
 mewlo_pkg(ECORE ecore ecore-file eina evas)
 mewlo_pkg(CAIRO cairo)
 mewlo_pkg(GLIB glib-2.0)
+mewlo_pkg(GIO gio-2.0)
 mewlo_pkg(ICU icu-i18n icu-uc)
 mewlo_pkg(GST gstreamer-1.0 gstreamer-base-1.0 gstreamer-audio-1.0)
 mewlo_pkg(PULSE libpulse)

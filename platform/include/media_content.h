@@ -70,6 +70,8 @@ int media_info_insert_to_db(const char* path, media_info_h* media);
 // The row of an identifier; the handle is the caller's.
 int media_info_get_media_from_db(const char* media_id, media_info_h* media);
 int media_info_delete_from_db(const char* media_id);
+// Several rows in one commit: all or none.
+int media_info_delete_list_from_db(const char* const* media_ids, int count);
 int media_info_move_to_db(media_info_h media, const char* path);
 int media_info_destroy(media_info_h media);
 int media_info_get_media_id(media_info_h media, char** media_id);

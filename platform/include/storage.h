@@ -13,4 +13,7 @@ int storage_get_external_memory_size(struct statvfs* size);
 const char* storage_device_root(void);
 const char* storage_card_root(void);
 const char* storage_private_root(void);
+
+// Deletes a file: into the desktop's trash where its file system has one, else for good. 0, or a negative error number.
+int storage_trash_file(const char* path);
 }

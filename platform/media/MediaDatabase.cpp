@@ -294,14 +294,22 @@ int Database::removeByPath(const std::string& path)
     return _transaction([&] { return _removePath(path); });
 }
 
-int Database::removeById(const std::string& mediaId)
+int Database::removeByIds(const std::vector<std::string>& mediaIds)
 {
-    return _transaction([&] { return Statement(_db, "DELETE FROM media WHERE MEDIA_ID = ?").bind(mediaId).run(); });
+    return _transaction([&] {
+        int result = SQLITE_OK;
+        for (auto id = mediaIds.begin(); result == SQLITE_OK && id != mediaIds.end(); ++id)
+            result = Statement(_db, "DELETE FROM media WHERE MEDIA_ID = ?").bind(*id).run();
+        return result;
+    });
 }
 
 int Database::rename(const std::string& mediaId, const MediaRow& row)
 {
     return _transaction([&] {
+        Statement replaced(_db, "DELETE FROM media WHERE MEDIA_PATH = ? COLLATE BINARY AND MEDIA_ID <> ?");
+        if (const int result = replaced.bind(row.path).bind(mediaId).run(); result != SQLITE_OK)
+            return result;
         Statement statement(_db,
             "UPDATE media SET MEDIA_PATH = ?, MEDIA_DISPLAY_NAME = ?, MEDIA_MODE = ?, MEDIA_STORAGE = ? "
             "WHERE MEDIA_ID = ?");

@@ -69,8 +69,9 @@ public:
     int put(MediaRow& row);
     // All or nothing.
     int apply(const FileChanges& changes);
-    int removeById(const std::string& mediaId);
+    int removeByIds(const std::vector<std::string>& mediaIds);
     int removeByPath(const std::string& path);
+    // A row that had the new path goes: its file was replaced.
     int rename(const std::string& mediaId, const MediaRow& row);
 
     int insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name);

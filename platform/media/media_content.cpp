@@ -11,6 +11,7 @@
 #include <thread>
 #include <unistd.h>
 #include <utility>
+#include <vector>
 
 #include "media/FolderWatch.h"
 #include "media/MediaDatabase.h"
@@ -421,7 +422,15 @@ int media_info_delete_from_db(const char* media_id)
 {
     if (media_id == nullptr)
         return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
-    return write([&](media::Database& database) { return database.removeById(media_id); });
+    return media_info_delete_list_from_db(&media_id, 1);
+}
+
+int media_info_delete_list_from_db(const char* const* media_ids, int count)
+{
+    if (media_ids == nullptr || count < 0)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    const std::vector<std::string> ids(media_ids, media_ids + count);
+    return write([&](media::Database& database) { return database.removeByIds(ids); });
 }
 
 int media_info_move_to_db(media_info_h media, const char* path)
