@@ -1,0 +1,128 @@
+#include "MwFileMover.h"
+
+#include <media_content.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <sys/stat.h>
+#include <unistd.h>
+#include <utility>
+
+#include "MwFilePlaces.h"
+#include "MwFiles.h"
+#include "MwHandle.h"
+#include "MwLog.h"
+#include "MwMediaRow.h"
+#include "MwStagedFile.h"
+
+namespace {
+
+using FilesLock = MwHandle<files_lock_h, media_content_unlock_files>;
+
+// A file that is where it should go must not be taken for a clash with itself.
+bool isInside(const std::string& path, const std::string& directory)
+{
+    struct stat own { };
+    struct stat other { };
+    const std::string folder = path.substr(0, path.rfind('/') + 1);
+    return ::stat(folder.c_str(), &own) == 0 && ::stat(directory.c_str(), &other) == 0 && own.st_dev == other.st_dev
+        && own.st_ino == other.st_ino;
+}
+
+}
+
+MwFileMover::MwFileMover(
+    std::string directory, uint64_t totalBytes, const std::atomic<bool>& cancelled, Ask ask, Report report)
+    : _directory(std::move(directory))
+    , _chunksPerReport(MwFilePlaces::chunksPerReport(totalBytes))
+    , _cancelled(cancelled)
+    , _ask(std::move(ask))
+    , _report(std::move(report))
+{
+}
+
+MwFileMover::Outcome MwFileMover::move(const std::string& source, std::string& destination)
+{
+    if (source.empty()) {
+        MW_LOGE("path is empty");
+        return Outcome::FAILED;
+    }
+    if (!MwFilePlaces::isTaken(source)) {
+        MW_LOGE("file is not existed!!!");
+        return Outcome::FAILED;
+    }
+    const auto place = isInside(source, _directory) ? std::nullopt : _choosePlace(source, false);
+    if (!place) {
+        _report(MwFilePlaces::sizeOf(source));
+        return Outcome::SKIPPED;
+    }
+    if (!MwFiles::makeDirectories(_directory))
+        return Outcome::FAILED;
+    return _stageAndPublish(source, *place, destination);
+}
+
+// The path to use, after asking if it is taken; nothing when the file is to stay. A clash found late is one, too.
+std::optional<MwFileMover::Place> MwFileMover::_choosePlace(const std::string& source, bool late)
+{
+    const std::string plain = MwFilePlaces::destinationOf(source, _directory);
+    if (!late && !MwFilePlaces::isTaken(plain))
+        return Place{plain, false};
+    const MwClashAction action = _ask(source);
+    if (!MwFilePlaces::isTaken(plain))
+        return Place{plain, false};
+    MW_LOGW("action : [%d]", static_cast<int>(action));
+    if (action == MwClashAction::REPLACE)
+        return Place{plain, true};
+    if (action == MwClashAction::RENAME)
+        return Place{MwFilePlaces::freePath(source, _directory), false};
+    return std::nullopt;
+}
+
+MwFileMover::Outcome MwFileMover::_stageAndPublish(const std::string& source, Place place, std::string& destination)
+{
+    MwStagedFile staged(source, _directory);
+    if (!staged.stage(_chunksPerReport, _report, _cancelled))
+        return Outcome::FAILED;
+    for (;;) {
+        FilesLock lock;
+        MW_CALL(media_content_lock_files, lock.out());
+        const auto published = staged.publish(place.path, place.replace);
+        if (published == MwStagedFile::Outcome::FAILED)
+            return Outcome::FAILED;
+        if (published == MwStagedFile::Outcome::DONE) {
+            destination = place.path;
+            return _moveRow(source, place, staged.leavesSource()) ? Outcome::MOVED : Outcome::FAILED;
+        }
+        lock.close(); // somebody took the name meanwhile, and the user may think about it for long
+        auto other = _choosePlace(source, true);
+        if (!other)
+            return Outcome::SKIPPED;
+        place = std::move(*other);
+    }
+}
+
+bool MwFileMover::_moveRow(const std::string& source, const Place& place, bool sourceLeft)
+{
+    const auto row = MwMediaRow::move(source, place.path);
+    if (row == MwMediaRow::Move::FAILED) {
+        // A replaced file does not come back: better twice there than not at all.
+        if (!sourceLeft)
+            (void)MwFiles::moveWithoutOverwriting(place.path, source);
+        else if (!place.replace)
+            ::unlink(place.path.c_str());
+        return false;
+    }
+    if (sourceLeft) {
+        MW_LOGI("remove source file");
+        if (::unlink(source.c_str()) != 0 && errno != ENOENT) {
+            MW_LOGE("remove failed.");
+            return false;
+        }
+    }
+    // A known recording has brought its row along; only an unknown one is to be catalogued.
+    if (row == MwMediaRow::Move::UNKNOWN) {
+        if (const int result = media_content_scan_file(place.path.c_str()); result != 0)
+            MW_LOGE("media_content_scan_file().. [0x%X]", static_cast<unsigned>(result));
+    }
+    return true;
+}
