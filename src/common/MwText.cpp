@@ -23,4 +23,12 @@ std::string mwTranslate(const char* id)
     return text != nullptr ? text : id;
 }
 
+std::string mwTranslateNumber(const char* id, size_t number)
+{
+    std::string text = mwTranslate(id);
+    if (const size_t place = text.find("%d"); place != std::string::npos)
+        text.replace(place, 2, std::to_string(number));
+    return text;
+}
+
 void mwPost(const char* id) { notification_status_message_post(mwTranslate(id).c_str()); }

@@ -21,11 +21,7 @@ constexpr size_t MAX_MESSAGE_BYTES = 1024;
 
 void postTooManyBookmarks()
 {
-    const std::string format = mwTranslate("IDS_MW_TPOP_CANT_ADD_MORE_THAN_PD_BOOKMARKS");
-    std::string message = format;
-    // The text comes from a translation: only its number is replaced, it is never used as a format.
-    if (const size_t place = message.find("%d"); place != std::string::npos)
-        message.replace(place, 2, std::to_string(MwModel::MAX_BOOKMARKS));
+    std::string message = mwTranslateNumber("IDS_MW_TPOP_CANT_ADD_MORE_THAN_PD_BOOKMARKS", MwModel::MAX_BOOKMARKS);
     message.resize(std::min(message.size(), MAX_MESSAGE_BYTES - 1));
     notification_status_message_post(message.c_str());
 }
