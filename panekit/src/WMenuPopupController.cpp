@@ -22,8 +22,7 @@ struct WMenuPopupController::Impl {
     Evas_Object* popup = nullptr;
     // Filled before create and then left alone: callbacks point into it.
     std::vector<Item> items;
-    std::function<void()> onDestroyed;
-    std::function<void()> onDetached;
+    PopupEnd end;
 
     static void closeCb(void* data, Evas_Object* object, void* info);
     static void itemCb(void* data, Evas_Object* object, void* info);
@@ -50,12 +49,7 @@ void WMenuPopupController::Impl::deletedCb(void* data, Evas*, Evas_Object*, void
 {
     auto* self = static_cast<WMenuPopupController*>(data);
     self->_impl->popup = nullptr;
-    const auto detached = std::exchange(self->_impl->onDetached, nullptr);
-    const auto destroyed = std::exchange(self->_impl->onDestroyed, nullptr);
-    if (detached)
-        detached();
-    if (destroyed)
-        destroyed();
+    self->_impl->end.tell();
     delete self;
 }
 
@@ -89,9 +83,9 @@ void WMenuPopupController::addItem(std::string label, std::function<void()> acti
         _impl->items.push_back({std::move(label), std::move(action), this});
 }
 
-void WMenuPopupController::setOnDestroyed(std::function<void()> handler) { _impl->onDestroyed = std::move(handler); }
+void WMenuPopupController::setOnDestroyed(std::function<void()> handler) { _impl->end.onDestroyed = std::move(handler); }
 
-void WMenuPopupController::_setOnDetached(std::function<void()> handler) { _impl->onDetached = std::move(handler); }
+void WMenuPopupController::_setOnDetached(std::function<void()> handler) { _impl->end.onDetached = std::move(handler); }
 
 bool WMenuPopupController::create(Evas_Object* window, Evas_Object*)
 {
@@ -115,11 +109,7 @@ void WMenuPopupController::destroy()
 {
     if (_impl->popup)
         return deletePopup(_impl->popup);
-    const auto destroyed = std::exchange(_impl->onDestroyed, nullptr);
-    if (const auto detached = std::exchange(_impl->onDetached, nullptr); detached)
-        detached();
-    if (destroyed)
-        destroyed();
+    _impl->end.tell();
     delete this;
 }
 

@@ -55,8 +55,7 @@ struct WPopupController::Impl {
     // Filled before create and then left alone: callbacks point into it.
     std::vector<Button> buttons;
     Handler onBack;
-    std::function<void()> onDestroyed;
-    std::function<void()> onDetached;
+    PopupEnd end;
 
     static void backCb(void* data, Evas_Object* object, void* info);
     static void buttonCb(void* data, Evas_Object* object, void* info);
@@ -88,12 +87,7 @@ void WPopupController::Impl::deletedCb(void* data, Evas*, Evas_Object*, void*)
     auto* self = static_cast<WPopupController*>(data);
     self->_impl->popup = nullptr;
     std::erase(openPopups(), self);
-    const auto detached = std::exchange(self->_impl->onDetached, nullptr);
-    const auto destroyed = std::exchange(self->_impl->onDestroyed, nullptr);
-    if (detached)
-        detached();
-    if (destroyed)
-        destroyed();
+    self->_impl->end.tell();
     delete self;
 }
 
@@ -141,9 +135,9 @@ void WPopupController::addButton(std::string label, Handler handler, Text kind)
 
 void WPopupController::setOnBack(Handler handler) { _impl->onBack = std::move(handler); }
 
-void WPopupController::setOnDestroyed(std::function<void()> handler) { _impl->onDestroyed = std::move(handler); }
+void WPopupController::setOnDestroyed(std::function<void()> handler) { _impl->end.onDestroyed = std::move(handler); }
 
-void WPopupController::_setOnDetached(std::function<void()> handler) { _impl->onDetached = std::move(handler); }
+void WPopupController::_setOnDetached(std::function<void()> handler) { _impl->end.onDetached = std::move(handler); }
 
 bool WPopupController::create(Evas_Object* window)
 {
@@ -173,11 +167,7 @@ void WPopupController::destroy()
 {
     if (_impl->popup)
         return deletePopup(_impl->popup);
-    const auto destroyed = std::exchange(_impl->onDestroyed, nullptr);
-    if (const auto detached = std::exchange(_impl->onDetached, nullptr); detached)
-        detached();
-    if (destroyed)
-        destroyed();
+    _impl->end.tell();
     delete this;
 }
 
