@@ -83,7 +83,10 @@ void WMenuPopupController::addItem(std::string label, std::function<void()> acti
         _impl->items.push_back({std::move(label), std::move(action), this});
 }
 
-void WMenuPopupController::setOnDestroyed(std::function<void()> handler) { _impl->end.onDestroyed = std::move(handler); }
+void WMenuPopupController::setOnDestroyed(std::function<void()> handler)
+{
+    _impl->end.onDestroyed = std::move(handler);
+}
 
 void WMenuPopupController::_setOnDetached(std::function<void()> handler) { _impl->end.onDetached = std::move(handler); }
 

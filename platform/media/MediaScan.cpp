@@ -133,19 +133,13 @@ FilesLock::FilesLock(const std::string& databasePath)
     : _file(::open((databasePath + ".lock").c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600))
 {
     const auto end = std::chrono::steady_clock::now() + LOCK_PATIENCE;
-    while (_file >= 0 && ::flock(_file, LOCK_EX | LOCK_NB) != 0) {
+    while (_file && ::flock(_file.get(), LOCK_EX | LOCK_NB) != 0) {
         if (std::chrono::steady_clock::now() > end) {
             __dlog_print(LOG_ID_MAIN, DLOG_WARN, "MEWLO", "another process holds the recordings; going on");
             return;
         }
         std::this_thread::sleep_for(LOCK_RETRY);
     }
-}
-
-FilesLock::~FilesLock()
-{
-    if (_file >= 0)
-        ::close(_file);
 }
 
 }

@@ -3,6 +3,7 @@
 #include <string>
 #include <vector>
 
+#include "media/FileDescriptor.h"
 #include "media/MediaDatabase.h"
 
 namespace media {
@@ -26,12 +27,9 @@ int scanFolders(Database& database, const std::vector<std::string>& folders, Sca
 class FilesLock {
 public:
     explicit FilesLock(const std::string& databasePath);
-    ~FilesLock();
-    FilesLock(const FilesLock&) = delete;
-    FilesLock& operator=(const FilesLock&) = delete;
 
 private:
-    int _file = -1;
+    FileDescriptor _file;
 };
 
 }
