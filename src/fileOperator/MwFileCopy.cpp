@@ -42,6 +42,8 @@ bool MwFileCopy::run(const std::atomic<bool>& cancelled)
 {
     if (_shareBlocks())
         return true;
+    if (!_reserve())
+        return false;
     constexpr std::array<Step (MwFileCopy::*)(), 3> WAYS
         = {&MwFileCopy::_copyInKernel, &MwFileCopy::_sendInKernel, &MwFileCopy::_copyThroughBuffer};
     for (const auto way : WAYS) {
@@ -66,6 +68,15 @@ bool MwFileCopy::_shareBlocks()
         return false;
     _report(static_cast<uint64_t>(_source.st_size));
     return true;
+}
+
+// A full disk shows before anything is copied, and blocks that lie together are written twice as fast.
+bool MwFileCopy::_reserve() const
+{
+    if (_source.st_size == 0 || ::fallocate(_to, 0, 0, _source.st_size) == 0 || isUnsupported(errno))
+        return true;
+    MW_LOGE("no room for the copy : %d", errno);
+    return false;
 }
 
 MwFileCopy::Step MwFileCopy::_copyInKernel()

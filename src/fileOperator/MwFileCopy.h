@@ -22,6 +22,7 @@ private:
     enum class Step { DONE, MORE, UNABLE, FAILED };
 
     bool _shareBlocks();
+    [[nodiscard]] bool _reserve() const;
     Step _copyInKernel();
     Step _sendInKernel();
     Step _copyThroughBuffer();
