@@ -46,4 +46,5 @@ set(MEWLO_LAYOUT_IMAGES
   look/disc.png disc 200
   look/more.png more 56
   look/round.png round 64
-  look/round_outline.png round_outline 64)
+  look/round_outline.png round_outline 64
+  look/spinner.png spinner 112)
