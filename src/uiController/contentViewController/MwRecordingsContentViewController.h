@@ -17,6 +17,7 @@
 #include "MwRecordingsListItem.h"
 #include "MwSignalMgr.h"
 
+class MwFileOperationPopup;
 class MwFileOperator;
 class MwPlayViewController;
 class MwRecordingsRows;
@@ -148,14 +149,31 @@ private:
     void _deleteFileOperator();
     // Rewrites the texts of a clash popup after a change of language or region.
     void _updateDuplicationPopup();
+    std::unique_ptr<MwFileOperator> _createFileOperator(int type, const std::vector<std::string>& pathList);
+    void _cancelDeleting();
+    void _onDeleteFiles();
+    void _catalogueShrank();
+    void _moveStart();
+    void _createMovingingPopupController();
+    void _cancelMoving();
+    void _updateMovePopup();
+    void _createDuplicationPopupController(const std::string& path);
+    void _onSelectedDuplicationPopupButton(int action);
+    void _moveFinished();
+    void _onMoveFiles();
+    void _moveEnded(const MwFileOperator& fileOperator);
 
     // Sharing, private storage and rename (MwRecordingsSharing.cpp)
     bool _clickShareDoneButton(const std::vector<std::string>& pathList);
+    void _shareReply(int result);
+    bool _requestPrivateModeAppControl(bool mount);
+    void _privateModeReply(app_control_h reply, int result);
     void _destroyShareRequest(bool terminate);
     void _destroyPrivateModeRequest(bool terminate);
     void _openRenamePopup(const std::string& path);
     void _closeRenamePopup();
     void _renameResponseCb(const char* text, int response);
+    bool _renameRecording(const std::string& name);
 
     using Request = MwHandle<app_control_h, app_control_destroy>;
 
@@ -167,7 +185,8 @@ private:
     std::unique_ptr<MwRecordingsRows> _rows; // with the genlist
     MwPlayViewController* _playView = nullptr; // deletes itself with its view
     std::unique_ptr<MwFileOperator> _fileOperator;
-    panekit::WPopupController* _fileOperationPopup = nullptr; // progress, deleting or clash; deletes itself
+    std::unique_ptr<MwFileOperationPopup> _fileOperationPopup; // while an operator works
+    bool _privateStorageOpen = false; // asked for by a move, to be handed back
     Request _shareRequest;
     Request _privateModeRequest;
     panekit::WPopupController* _saveToPopup = nullptr; // deletes itself
