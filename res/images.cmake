@@ -40,10 +40,12 @@ set(MEWLO_LAYOUT_IMAGES
   look/back.png back 56
   look/bookmark.png bookmark 44
   look/call_rejected.png call_rejected 52
+  look/check.png check 52
   look/circle_hairline.png circle_hairline 400
   look/circle_outline.png circle_outline 200
   look/close.png close 56
   look/disc.png disc 200
+  look/mic.png mic 120
   look/more.png more 56
   look/round.png round 64
   look/round_outline.png round_outline 64

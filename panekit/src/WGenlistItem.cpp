@@ -2,7 +2,6 @@
 
 #include <cstring>
 #include <map>
-#include <unordered_set>
 
 #include <Elementary.h>
 
@@ -11,12 +10,6 @@ namespace panekit {
 namespace {
 
     constexpr auto REALIZED_KEY = "panekit.realized";
-
-    std::unordered_set<const void*>& rows()
-    {
-        static std::unordered_set<const void*> all;
-        return all;
-    }
 
 }
 
@@ -65,7 +58,7 @@ struct WGenlistItem::Callbacks {
     }
 };
 
-WGenlistItem::~WGenlistItem() { rows().erase(this); }
+WGenlistItem::~WGenlistItem() = default;
 
 Evas_Object* WGenlistItem::append(Evas_Object* genlist, Evas_Object* after)
 {
@@ -95,15 +88,15 @@ Evas_Object* WGenlistItem::_adopt(Evas_Object* genlist, Evas_Object* item)
         return nullptr;
     _item = item;
     _genlist = genlist;
-    rows().insert(this);
     Callbacks::watchRealized(genlist);
     return item;
 }
 
 WGenlistItem* WGenlistItem::fromItem(Evas_Object* item)
 {
-    void* data = item ? elm_object_item_data_get(item) : nullptr;
-    return rows().contains(data) ? static_cast<WGenlistItem*>(data) : nullptr;
+    const Elm_Genlist_Item_Class* itemClass = item ? elm_genlist_item_item_class_get(item) : nullptr;
+    const bool isOurs = itemClass && itemClass->func.del == Callbacks::deleted;
+    return isOurs ? static_cast<WGenlistItem*>(elm_object_item_data_get(item)) : nullptr;
 }
 
 std::string WGenlistItem::getText(const char*) { return {}; }

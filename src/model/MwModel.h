@@ -52,6 +52,8 @@ public:
     void destroyRecordedFileList();
     bool foreachRecordedFiles(RecordedFileCallback callback, void* userData);
     [[nodiscard]] const std::vector<MwFileInfo>& getRecordedFileList() const { return _recordedFiles; }
+    // Another number after every change of the list, never 0.
+    [[nodiscard]] unsigned int getCatalogueRevision() const { return _catalogueRevision; }
     // Borrowed until the list changes; null when it is not listed.
     [[nodiscard]] const MwFileInfo* getRecordedFileInfoByPath(const std::string& path) const;
     // Keep the list in step with a file that was deleted or renamed. False when the path is not listed.
@@ -188,5 +190,6 @@ private:
     std::atomic<bool> _playView = false;
     RequestHandle _request;
     std::vector<MwFileInfo> _recordedFiles;
+    unsigned int _catalogueRevision = 1;
     std::vector<MwBookmark> _bookmarks;
 };

@@ -137,7 +137,11 @@ bool MwModel::createRecordedFileList()
     return true;
 }
 
-void MwModel::destroyRecordedFileList() { _recordedFiles.clear(); }
+void MwModel::destroyRecordedFileList()
+{
+    _recordedFiles.clear();
+    ++_catalogueRevision;
+}
 
 const MwFileInfo* MwModel::getRecordedFileInfoByPath(const std::string& path) const
 {
@@ -148,6 +152,7 @@ const MwFileInfo* MwModel::getRecordedFileInfoByPath(const std::string& path) co
 
 bool MwModel::removeRecordedFile(const std::string& path)
 {
+    ++_catalogueRevision;
     return std::erase_if(_recordedFiles, [&](const MwFileInfo& info) { return info.path == path; }) > 0;
 }
 
@@ -157,6 +162,7 @@ bool MwModel::renameRecordedFile(const std::string& path, const std::string& new
         _recordedFiles.begin(), _recordedFiles.end(), [&](const MwFileInfo& info) { return info.path == path; });
     if (found == _recordedFiles.end())
         return false;
+    ++_catalogueRevision;
     found->path = newPath;
     found->displayName = newDisplayName;
     return true;

@@ -46,6 +46,10 @@ int app_control_add_extra_data(app_control_h, const char* key, const char* value
 {
     return calls.record(__func__, std::string(key) + "=" + value);
 }
+int app_control_reply_to_launch_request(app_control_h, app_control_h, app_control_result_e result)
+{
+    return calls.record(__func__, std::to_string(result));
+}
 int app_control_set_launch_mode(app_control_h, app_control_launch_mode_e mode)
 {
     return calls.record(__func__, std::to_string(mode));

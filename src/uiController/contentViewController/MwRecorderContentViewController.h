@@ -125,8 +125,6 @@ private:
     void _renameResponseCb(const char* text, int response);
     void _destroyRenamePopup();
     void _createSaveToPopup();
-    Evas_Object* _createSaveToList(Evas_Object* popup);
-    void _storageChosen(int storage);
     void _destroySaveToPopup();
     void _createDiscardPopup();
     void _discardRecording();

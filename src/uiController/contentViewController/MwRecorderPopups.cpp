@@ -14,8 +14,7 @@
 #include "MwModel.h"
 #include "MwRecorder.h"
 #include "MwRenamePopupController.h"
-#include "MwSaveToListItem.h"
-#include "MwSystemMgr.h"
+#include "MwSaveToPopup.h"
 #include "MwText.h"
 
 using panekit::WPopupController;
@@ -70,44 +69,8 @@ void MwRecorderContentViewController::_createSaveToPopup()
 {
     if (_saveToPopup)
         return;
-    _saveToPopup = new WPopupController();
-    _saveToPopup->setTitle("IDS_MW_HEADER_SAVE_TO");
-    _saveToPopup->setStyle("theme_bg");
-    _saveToPopup->setContent([this](Evas_Object* popup) { return _createSaveToList(popup); });
-    _saveToPopup->setOnBack(closePopup);
+    _saveToPopup = mwCreateSaveToPopup(getWindow(), getModel());
     _saveToPopup->setOnDestroyed([this] { _saveToPopup = nullptr; });
-    _saveToPopup->create(getWindow());
-}
-
-Evas_Object* MwRecorderContentViewController::_createSaveToList(Evas_Object* popup)
-{
-    Evas_Object* genlist = elm_genlist_add(popup);
-    elm_genlist_homogeneous_set(genlist, EINA_TRUE);
-    elm_genlist_mode_set(genlist, ELM_LIST_COMPRESS);
-    elm_scroller_content_min_limit(genlist, EINA_FALSE, EINA_TRUE);
-    evas_object_size_hint_weight_set(genlist, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
-    evas_object_size_hint_align_set(genlist, EVAS_HINT_FILL, EVAS_HINT_FILL);
-    // The group itself, hidden: the radios of the rows come and go with scrolling.
-    Evas_Object* radioMain = elm_radio_add(genlist);
-    elm_radio_state_value_set(radioMain, -1);
-    evas_object_data_set(genlist, "radio", radioMain);
-    const auto chosen = [this](int storage) { _storageChosen(storage); };
-    (new MwSaveToListItem(getModel(), MW_STORAGE_DEVICE, chosen))->append(genlist);
-    if (MwSystemMgr::getInstance()->isMMCMounted())
-        (new MwSaveToListItem(getModel(), MW_STORAGE_CARD, chosen))->append(genlist);
-    else
-        MW_LOGE("MMC not mounted");
-    evas_object_show(genlist);
-    return genlist;
-}
-
-void MwRecorderContentViewController::_storageChosen(int storage)
-{
-    if (storage == MW_STORAGE_DEVICE || storage == MW_STORAGE_CARD)
-        getModel()->setStorageType(static_cast<MwStorageType>(storage));
-    else
-        MW_LOGE("invalid index!! [%d]", storage);
-    _destroySaveToPopup();
 }
 
 void MwRecorderContentViewController::_destroySaveToPopup()

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <array>
 #include <functional>
 #include <memory>
 #include <string>
@@ -79,12 +78,12 @@ private:
     void _createNoContents();
     void _colourNoContents();
     void _createList();
+    void _focusList();
     void _replaceDateFormatter();
     void _loadListItems();
+    Evas_Object* _radioGroup() const;
     void _loadSelectAllItem();
     void _removeSelectAllItem();
-    // Deletes the row of a recording; its record may go before or afterwards.
-    void _removeListItem(const std::string& path);
     void _refreshRealizedItems();
     void _updateController();
     void _createRecordController();
@@ -112,8 +111,9 @@ private:
     void _clearChecks();
     void _preselect();
     void _onSelectListItem(MwRecordingsListItem& item);
-    void _selectAll(bool checked);
+    void _toggle(MwRecordingsListItem& item);
     void _playListItem(MwRecordingsListItem& item);
+    void _startPlaying(MwRecordingsListItem& item);
     void _toggleCurrent();
     void _playOther(MwRecordingsListItem& item);
     void _titleRightButtonClicked();
@@ -133,12 +133,14 @@ private:
     void _openDetails();
     void _createSaveToPopup();
     void _destroySaveToPopup();
-    void _listenToKeys(Evas_Object* object);
+    void _listenToKeys();
+    void _listenToListKeys();
+    bool _listKeyPressed(const std::string& key);
     bool _keyPressed(const std::string& key);
     void _deleteHighlighted();
     void _renameHighlighted();
-    void _togglePlaying();
-    bool _seek(int milliseconds);
+    void _tapHighlighted();
+    void _seek(int milliseconds);
     std::string _highlightedPath() const;
 
     // File operations (MwRecordingsFileOperations.cpp). At most one runs at a time; while it runs, a change of the

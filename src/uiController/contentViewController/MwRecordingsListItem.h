@@ -39,9 +39,14 @@ public:
     [[nodiscard]] bool isChecked() const { return _checked; }
     // Also shows it, when the row is on screen.
     void setChecked(bool checked);
+    // The mark of the row that the keyboard acts on.
+    void setHighlighted(bool highlighted);
+    [[nodiscard]] bool isHighlighted() const { return _highlighted; }
     // Writes texts, mark of the current row and its check or radio anew. For rows on screen.
     void refresh();
-    // Asks the database for bookmarks again.
+    // Asks the database for bookmarks again when the row is shown next.
+    void forgetBookmarks() { _bookmarked.reset(); }
+    // For rows on screen.
     void refreshBookmarks();
 
 protected:
@@ -61,11 +66,12 @@ private:
     Evas_Object* _createChoice(Evas_Object* genlist);
     Evas_Object* _createRadio(Evas_Object* layout, Evas_Object* genlist) const;
     Evas_Object* _createCheck(Evas_Object* layout) const;
-    void _emitCurrent();
+    void _emitState();
 
     const Context& _context;
     std::optional<MwFileInfo> _info;
     int _index = 0;
     bool _checked = false;
+    bool _highlighted = false;
     std::optional<bool> _bookmarked; // not asked yet
 };

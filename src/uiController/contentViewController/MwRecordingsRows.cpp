@@ -1,0 +1,302 @@
+#include "MwRecordingsRows.h"
+
+#include <Elementary.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <string_view>
+#include <unordered_set>
+#include <utility>
+
+#include "MwModel.h"
+#include "MwStorageRoots.h"
+
+namespace {
+
+// Enough for the tallest window; the rest comes while the first rows can be seen and used already.
+constexpr size_t FIRST_ROWS = 64;
+constexpr double SLICE_SECONDS = 0.004;
+constexpr size_t ROWS_BETWEEN_LOOKS_AT_THE_CLOCK = 32;
+
+}
+
+MwRecordingsRows::MwRecordingsRows(Evas_Object* genlist, const Item::Context& context)
+    : _genlist(genlist)
+    , _context(context)
+    , _privateFolder(mwPrivateRoot() + "/")
+{
+}
+
+MwRecordingsRows::~MwRecordingsRows() { panekit::WTimer::destroy(_loader); }
+
+const std::vector<MwFileInfo>& MwRecordingsRows::_catalogue() const { return _context.model->getRecordedFileList(); }
+
+bool MwRecordingsRows::_accepts(const MwFileInfo& info) const
+{
+    return _files == ALL || info.path.starts_with(_privateFolder) == (_files == IN_PRIVATE);
+}
+
+MwRecordingsListItem* MwRecordingsRows::_first() const
+{
+    Item* row = Item::from(elm_genlist_first_item_get(_genlist));
+    return row && row->isSelectAll() ? _next(row) : row;
+}
+
+MwRecordingsListItem* MwRecordingsRows::_next(const Item* row)
+{
+    return Item::from(elm_genlist_item_next_get(row->getItem()));
+}
+
+MwRecordingsListItem* MwRecordingsRows::getSelectAll() const
+{
+    Item* row = Item::from(elm_genlist_first_item_get(_genlist));
+    return row && row->isSelectAll() ? row : nullptr;
+}
+
+void MwRecordingsRows::show(Files files)
+{
+    const unsigned int revision = _context.model->getCatalogueRevision();
+    if (files == _files && revision == _revision)
+        return;
+    const Place place = _place();
+    _files = files;
+    _revision = revision;
+    _removeVanished();
+    _followCatalogue();
+    _restore(place);
+    if (_loaded < _catalogue().size() && _loader.expired())
+        _loader = panekit::WTimer::addIdler([this](void*) { return _loadSlice(SLICE_SECONDS); });
+}
+
+void MwRecordingsRows::finish()
+{
+    show(_files);
+    while (_loadSlice(SLICE_SECONDS)) { }
+}
+
+void MwRecordingsRows::_removeVanished()
+{
+    std::unordered_set<std::string_view> kept;
+    for (const MwFileInfo& info : _catalogue()) {
+        if (_accepts(info))
+            kept.insert(info.path);
+    }
+    for (Item* row = _first(); row;) {
+        Item* next = _next(row);
+        if (!kept.contains(row->getPath()))
+            elm_object_item_del(row->getItem());
+        row = next;
+    }
+}
+
+std::unordered_map<std::string, MwRecordingsListItem*> MwRecordingsRows::_rowsByPath() const
+{
+    std::unordered_map<std::string, Item*> rows;
+    for (Item* row = _first(); row; row = _next(row))
+        rows.emplace(row->getPath(), row);
+    return rows;
+}
+
+// Walks along the rows that there are and puts in between what is new; what comes after the last one is left to the
+// slices, but for the first screens.
+void MwRecordingsRows::_followCatalogue()
+{
+    const auto known = _rowsByPath();
+    Item* row = _first();
+    Item* above = getSelectAll();
+    size_t rows = 0;
+    for (_loaded = 0; _loaded < _catalogue().size() && (row || rows < FIRST_ROWS); ++_loaded) {
+        const MwFileInfo& info = _catalogue()[_loaded];
+        if (!_accepts(info))
+            continue;
+        ++rows;
+        if (row && row->getPath() == info.path) {
+            row->setFileInfo(info);
+            above = std::exchange(row, _next(row));
+            continue;
+        }
+        const auto former = known.find(info.path);
+        above = _insert(info, above, former != known.end() ? former->second : nullptr);
+    }
+}
+
+// A row that moved to another place (former) stays the same for the user: checked or chosen as it was.
+MwRecordingsListItem* MwRecordingsRows::_insert(const MwFileInfo& info, Item* above, Item* former)
+{
+    auto* row = new Item(_context, info, former ? former->getIndex() : ++_lastIndex);
+    if (former) {
+        row->setChecked(former->isChecked());
+        elm_object_item_del(former->getItem());
+    }
+    if (above)
+        row->append(_genlist, above->getItem());
+    else
+        row->prepend(_genlist);
+    return row;
+}
+
+// False when all is loaded.
+bool MwRecordingsRows::_loadSlice(double seconds)
+{
+    show(_files);
+    const double end = ecore_time_get() + seconds;
+    for (size_t count = 1; _loaded < _catalogue().size(); ++count) {
+        const MwFileInfo& info = _catalogue()[_loaded++];
+        if (_accepts(info))
+            (new Item(_context, info, ++_lastIndex))->append(_genlist);
+        if (count % ROWS_BETWEEN_LOOKS_AT_THE_CLOCK == 0 && ecore_time_get() > end)
+            break;
+    }
+    return _loaded < _catalogue().size();
+}
+
+void MwRecordingsRows::addSelectAll()
+{
+    if (getSelectAll())
+        return;
+    (new Item(_context))->prepend(_genlist);
+}
+
+void MwRecordingsRows::removeSelectAll()
+{
+    if (const Item* row = getSelectAll(); row)
+        elm_object_item_del(row->getItem());
+}
+
+void MwRecordingsRows::forEach(const std::function<bool(Item&)>& function)
+{
+    finish();
+    forEachLoaded(function);
+}
+
+void MwRecordingsRows::forEachLoaded(const std::function<bool(Item&)>& function) const
+{
+    for (Item* row = _first(); row;) {
+        Item* next = _next(row);
+        if (!function(*row))
+            return;
+        row = next;
+    }
+}
+
+void MwRecordingsRows::forgetBookmarks()
+{
+    forEachLoaded([](Item& row) {
+        row.forgetBookmarks();
+        return true;
+    });
+    forEachRealized([](Item& row) { row.refreshBookmarks(); });
+}
+
+MwRecordingsListItem* MwRecordingsRows::find(const std::string& path)
+{
+    Item* found = nullptr;
+    forEach([&](Item& row) {
+        if (row.getPath() == path)
+            found = &row;
+        return !found;
+    });
+    return found;
+}
+
+MwRecordingsListItem* MwRecordingsRows::findByIndex(int index)
+{
+    Item* found = nullptr;
+    forEach([&](Item& row) {
+        if (row.getIndex() == index)
+            found = &row;
+        return !found;
+    });
+    return found;
+}
+
+std::vector<std::string> MwRecordingsRows::getCheckedPaths()
+{
+    std::vector<std::string> paths;
+    forEach([&](const Item& row) {
+        if (row.isChecked())
+            paths.push_back(row.getPath());
+        return true;
+    });
+    return paths;
+}
+
+MwRecordingsListItem* MwRecordingsRows::getHighlighted() const
+{
+    for (Item* row = Item::from(elm_genlist_first_item_get(_genlist)); row; row = _next(row)) {
+        if (row->isHighlighted())
+            return row;
+    }
+    return nullptr;
+}
+
+MwRecordingsListItem* MwRecordingsRows::_highlightStart() const
+{
+    Item* start = _onTop();
+    const std::string path = _context.model->getCurrentPlayPath();
+    forEachLoaded([&](Item& row) {
+        if (row.getPath() == path)
+            start = &row;
+        return true;
+    });
+    return start;
+}
+
+void MwRecordingsRows::moveHighlight(int rows)
+{
+    finish();
+    Item* from = getHighlighted();
+    Item* to = from ? from : _highlightStart();
+    for (int left = from ? std::abs(rows) : 0; left > 0; --left) {
+        Elm_Object_Item* next
+            = rows > 0 ? elm_genlist_item_next_get(to->getItem()) : elm_genlist_item_prev_get(to->getItem());
+        if (!next)
+            break;
+        to = Item::from(next);
+    }
+    if (!to)
+        return;
+    if (from)
+        from->setHighlighted(false);
+    to->setHighlighted(true);
+    elm_genlist_item_show(to->getItem(), ELM_GENLIST_ITEM_SCROLLTO_IN);
+}
+
+void MwRecordingsRows::removeHighlight()
+{
+    if (Item* row = getHighlighted(); row)
+        row->setHighlighted(false);
+}
+
+int MwRecordingsRows::getPage() const
+{
+    Eina_List* items = elm_genlist_realized_items_get(_genlist);
+    const int count = static_cast<int>(eina_list_count(items));
+    eina_list_free(items);
+    return std::max(1, count - 1);
+}
+
+MwRecordingsListItem* MwRecordingsRows::_onTop() const
+{
+    int x = 0;
+    int y = 0;
+    int where = 0;
+    evas_object_geometry_get(_genlist, &x, &y, nullptr, nullptr);
+    Elm_Object_Item* item = elm_genlist_at_xy_item_get(_genlist, x + 1, y + 1, &where);
+    return Item::from(item ? item : elm_genlist_first_item_get(_genlist));
+}
+
+void MwRecordingsRows::forEachRealized(const std::function<void(Item&)>& function) const
+{
+    Eina_List* items = elm_genlist_realized_items_get(_genlist);
+    void* item = nullptr;
+    EINA_LIST_FREE(items, item)
+    {
+        if (Item* row = Item::from(static_cast<Elm_Object_Item*>(item)); row)
+            function(*row);
+    }
+}
+
+MwRecordingsRows::Place MwRecordingsRows::_place() const { return {}; }
+
+void MwRecordingsRows::_restore(const Place&) { }

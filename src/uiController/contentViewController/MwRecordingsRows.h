@@ -1,0 +1,81 @@
+#pragma once
+
+#include <functional>
+#include <string>
+#include <unordered_map>
+#include <vector>
+
+#include <panekit/WTimer.h>
+
+#include "MwRecordingsListItem.h"
+
+// The rows of the recordings list. Keeps a genlist in step with the model's catalogue by difference, so that rows stay
+// where they are (and checked as they are) while others come and go; a long list appears with its first screens and
+// grows in slices of a few milliseconds. The genlist is borrowed and outlives this object. Main loop only.
+class MwRecordingsRows {
+public:
+    enum Files : int { ALL, OUTSIDE_PRIVATE, IN_PRIVATE };
+
+    MwRecordingsRows(Evas_Object* genlist, const MwRecordingsListItem::Context& context);
+    ~MwRecordingsRows();
+    MwRecordingsRows(const MwRecordingsRows&) = delete;
+    MwRecordingsRows& operator=(const MwRecordingsRows&) = delete;
+
+    // Shows these files of the catalogue; costs nothing when that is what is shown.
+    void show(Files files);
+    // Loads what is missing. Whatever needs all rows does it by itself.
+    void finish();
+
+    void addSelectAll();
+    void removeSelectAll();
+    [[nodiscard]] MwRecordingsListItem* getSelectAll() const;
+
+    // Rows of recordings in their order, until the function answers false.
+    void forEach(const std::function<bool(MwRecordingsListItem&)>& function);
+    // The same with those that are loaded already: the others are unchecked.
+    void forEachLoaded(const std::function<bool(MwRecordingsListItem&)>& function) const;
+    // Asks the database again, now or when a row comes into view.
+    void forgetBookmarks();
+    [[nodiscard]] MwRecordingsListItem* find(const std::string& path);
+    [[nodiscard]] MwRecordingsListItem* findByIndex(int index);
+    [[nodiscard]] std::vector<std::string> getCheckedPaths();
+    // The row that the keyboard acts on, null for none. Moving it by rows keeps it in view; the first move goes to the
+    // row that plays, else to the one on top.
+    [[nodiscard]] MwRecordingsListItem* getHighlighted() const;
+    void moveHighlight(int rows);
+    void removeHighlight();
+    // How many rows fit into the list.
+    [[nodiscard]] int getPage() const;
+    // Rows on screen, the one that selects all among them.
+    void forEachRealized(const std::function<void(MwRecordingsListItem&)>& function) const;
+
+private:
+    using Item = MwRecordingsListItem;
+    struct Place {
+        std::string path; // of the row on top; empty while the list shows its beginning
+        int offset = 0; // pixels of it that have been scrolled out
+    };
+
+    [[nodiscard]] bool _accepts(const MwFileInfo& info) const;
+    [[nodiscard]] const std::vector<MwFileInfo>& _catalogue() const;
+    [[nodiscard]] Item* _first() const;
+    [[nodiscard]] static Item* _next(const Item* row);
+    [[nodiscard]] std::unordered_map<std::string, Item*> _rowsByPath() const;
+    void _removeVanished();
+    void _followCatalogue();
+    Item* _insert(const MwFileInfo& info, Item* after, Item* former);
+    bool _loadSlice(double seconds);
+    [[nodiscard]] Item* _highlightStart() const;
+    [[nodiscard]] Item* _onTop() const;
+    [[nodiscard]] Place _place() const;
+    void _restore(const Place& place);
+
+    Evas_Object* _genlist;
+    const Item::Context& _context;
+    Files _files = ALL;
+    std::string _privateFolder; // with the slash
+    unsigned int _revision = 0; // of the catalogue that is shown, 0 for none
+    size_t _loaded = 0; // records of the catalogue that have been looked at
+    int _lastIndex = 0;
+    panekit::WTimer::Weak _loader;
+};
