@@ -8,6 +8,7 @@
 #include <panekit/WMenuPopupController.h>
 #include <panekit/WPopupController.h>
 
+#include "MwFileOperationPopup.h"
 #include "MwFileOperator.h"
 #include "MwICU.h"
 #include "MwLog.h"
@@ -131,12 +132,12 @@ void MwRecordingsContentViewController::onDestroy()
     if (_fileOperator)
         _deleteFileOperator();
     _closeRenamePopup();
-    for (auto* popup : {std::exchange(_saveToPopup, nullptr), std::exchange(_fileOperationPopup, nullptr)}) {
-        if (!popup)
-            continue;
-        popup->setOnDestroyed(nullptr);
-        popup->destroy();
-    }
+    _fileOperationPopup.reset();
+    auto* chooser = std::exchange(_saveToPopup, nullptr);
+    if (!chooser)
+        return;
+    chooser->setOnDestroyed(nullptr);
+    chooser->destroy();
 }
 
 bool MwRecordingsContentViewController::onPop()

@@ -1,4 +1,5 @@
 // Stands in for the operations on files until they are there: weak, so that they only have to be added.
+#include "MwFileOperationPopup.h"
 #include "MwFileOperator.h"
 #include "MwRecordingsContentViewController.h"
 #include "MwRecordingsRows.h"
