@@ -121,7 +121,7 @@ Evas_Object* MwFileOperationPopup::_createMovingContent(Evas_Object* parent)
 {
     _movingLayout = createLayout(parent, MOVING_GROUP);
     _progressBar = elm_progressbar_add(_movingLayout);
-    elm_progressbar_unit_format_set(_progressBar, nullptr); // the texts below say it
+    elm_object_style_set(_progressBar, "mewlo/slim"); // the texts below say the number
     evas_object_size_hint_align_set(_progressBar, EVAS_HINT_FILL, 0.5);
     evas_object_size_hint_weight_set(_progressBar, EVAS_HINT_EXPAND, 0.0);
     elm_object_part_content_set(_movingLayout, "progressbar", _progressBar);
@@ -176,6 +176,7 @@ Evas_Object* MwFileOperationPopup::_createClashContent(Evas_Object* parent, cons
 {
     _clashLayout = createLayout(parent, CLASH_GROUP);
     Evas_Object* check = elm_check_add(_clashLayout);
+    elm_object_style_set(check, "mewlo/popup");
     setTranslatable(check, nullptr, "IDS_MF_OPT_APPLY_TO_ALL_ITEMS_ABB");
     evas_object_smart_callback_add(check, "changed", _applyToAllChangedCb, this);
     elm_object_part_content_set(_clashLayout, "elm.swallow.content", check);
