@@ -1,4 +1,4 @@
-// Writes a picture of every state of the recorder screen: mewlo-screenshots <directory>. ELM_SCALE chooses the scale.
+// Writes a picture of every state of the screens: mewlo-screenshots <directory>. ELM_SCALE chooses the scale.
 #include <Elementary.h>
 #include <cstdio>
 #include <string>
@@ -11,6 +11,7 @@
 
 #include "MwRenamePopupController.h"
 #include "MwSignalMgr.h"
+#include "PanelShots.h"
 #include "RecorderScreen.h"
 #include "UiEnvironment.h"
 #include "fakes/Fakes.h"
@@ -137,6 +138,7 @@ int main(int argc, char** argv)
                 continue;
             take(directory, shot, dark ? "-dark" : "-light", width, height);
         }
+        ui::takePanelShots(directory, dark ? "-dark" : "-light", argc > 2 ? argv[2] : "", width, height);
         takeRename(directory, dark ? "-dark" : "-light");
         if (argc == 2)
             take(directory, shots()[2], dark ? "-wide-dark" : "-wide-light", width * 3, height);

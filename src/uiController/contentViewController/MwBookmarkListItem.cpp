@@ -17,6 +17,7 @@ constexpr std::string_view NAME_PART = "elm.text.main.left";
 constexpr std::string_view TIME_PART = "elm.text.sub.right";
 constexpr std::string_view SELECT_ALL_PART = "elm.text.main";
 constexpr auto CHOICE_PART = "elm.icon.2";
+constexpr auto CHOICE_STYLE = "mewlo";
 constexpr auto INNER_PART = "elm.swallow.content";
 constexpr auto RADIO_KEY = "radio";
 
@@ -84,6 +85,7 @@ Evas_Object* MwBookmarkListItem::_createRadio(Evas_Object* layout) const
         return nullptr;
     }
     Evas_Object* radio = elm_radio_add(layout);
+    elm_object_style_set(radio, CHOICE_STYLE);
     elm_radio_state_value_set(radio, _index);
     elm_radio_group_add(radio, radioMain);
     return radio;
@@ -92,6 +94,7 @@ Evas_Object* MwBookmarkListItem::_createRadio(Evas_Object* layout) const
 Evas_Object* MwBookmarkListItem::_createCheck(Evas_Object* layout) const
 {
     Evas_Object* check = elm_check_add(layout);
+    elm_object_style_set(check, CHOICE_STYLE);
     elm_check_state_set(check, _checked);
     return check;
 }
@@ -100,11 +103,13 @@ void MwBookmarkListItem::setChecked(bool checked)
 {
     if (std::exchange(_checked, checked) == checked)
         return;
-    elm_object_item_signal_emit(getItem(), checked ? "elm,activate,check,on" : "elm,activate,check,off", "elm");
+    if (_mode != DELETE)
+        return;
+    const char* signal = checked ? "elm,activate,check,on" : "elm,activate,check,off";
+    elm_object_item_signal_emit(getItem(), signal, "elm");
     Evas_Object* layout = elm_object_item_part_content_get(getItem(), CHOICE_PART);
-    if (Evas_Object* check = layout ? elm_object_part_content_get(layout, INNER_PART) : nullptr;
-        check && _mode == DELETE)
-        elm_check_state_set(check, checked);
+    if (Evas_Object* check = layout ? elm_object_part_content_get(layout, INNER_PART) : nullptr; check)
+        elm_layout_signal_emit(check, signal, "elm");
 }
 
 void MwBookmarkListItem::setMode(Mode mode)

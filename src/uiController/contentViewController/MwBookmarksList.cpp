@@ -146,7 +146,7 @@ void MwBookmarksContentViewController::_renameResponseCb(const char* text, int r
     if (response != MwRenamePopupController::RESPONSE_RENAME)
         return _closeRenamePopup();
     const std::string name = text ? text : "";
-    if (name.empty())
+    if (name.find_first_not_of(' ') == std::string::npos)
         return mwPost("IDS_MW_POP_INVALID_FILE_NAME");
     if (_isNameTaken(name))
         return mwPost("IDS_MW_POP_RENAMEALREADYUSED");

@@ -1,0 +1,192 @@
+#include "PanelScreen.h"
+
+#include <Elementary.h>
+#include <sqlite3.h>
+
+#include <filesystem>
+
+#include <media_content.h>
+#include <panekit/WContentViewController.h>
+
+#include "MwContentViewController.h"
+#include "MwResourceMgr.h"
+#include "MwSystemMgr.h"
+#include "fakes/Fakes.h"
+#include "support/Recordings.h"
+#include "support/Screen.h"
+
+namespace ui {
+
+namespace {
+
+    // What lies below every screen.
+    class EmptyScreen : public MwContentViewController {
+    public:
+        using MwContentViewController::MwContentViewController;
+
+    protected:
+        Evas_Object* onCreateView(Evas_Object* parent, void*) override
+        {
+            Evas_Object* layout = elm_layout_add(parent);
+            elm_layout_theme_set(layout, "layout", "application", "default");
+            return layout;
+        }
+    };
+
+}
+
+PanelScreen::PanelScreen(int width, int height)
+{
+    fakes::reset();
+    fakes::controller = {};
+    fakes::controller.onCommand = [this](MwAppController::Command command) { return _execute(command); };
+    ::setenv("MEWLO_MEDIA_DB", _directory.file("media.db").c_str(), 1);
+    std::filesystem::remove_all(support::deviceRoot() + "/Sounds");
+    media_content_connect();
+    model.setAppState(MwModel::APP_STATE_RESUMED);
+    MwSystemMgr::getInstance()->initialize(&model);
+    _controller = std::make_unique<MwAppController>();
+    window = elm_win_util_standard_add("test", "test");
+    evas_object_resize(window, width, height);
+    naviframe = new panekit::WNaviframeController;
+    naviframe->create(window);
+    elm_win_resize_object_add(window, naviframe->getEvasObject());
+    evas_object_show(window);
+    naviframe->push(new EmptyScreen(&model, _controller.get()));
+}
+
+PanelScreen::~PanelScreen()
+{
+    MwSignalMgr::getInstance()->getLifeCycleSignal().emit(MwSignalMgr::TERMINATE);
+    evas_object_del(window);
+    support::runFor(0.01);
+    MwSystemMgr::getInstance()->deinitialize();
+    media_content_disconnect();
+    MwSignalMgr::destroyInstance();
+    MwSystemMgr::destroyInstance();
+    ::unsetenv("MEWLO_MEDIA_DB");
+}
+
+std::string PanelScreen::addRecording(const std::string& file, int duration, const std::string& content)
+{
+    const std::string id = support::addRecording(file, content);
+    _setDuration(support::recordingPath(file), duration);
+    model.createRecordedFileList();
+    return id;
+}
+
+// The database reads durations from files; a row is all these tests need.
+void PanelScreen::_setDuration(const std::string& path, int duration) const
+{
+    sqlite3* database = nullptr;
+    sqlite3_stmt* statement = nullptr;
+    sqlite3_open(_directory.file("media.db").c_str(), &database);
+    sqlite3_busy_timeout(database, 2000);
+    sqlite3_prepare_v2(database, "UPDATE media SET MEDIA_DURATION = ?, MEDIA_TIMELINE = ? WHERE MEDIA_PATH = ?", -1,
+        &statement, nullptr);
+    sqlite3_bind_int(statement, 1, duration);
+    sqlite3_bind_int(statement, 2, static_cast<int>(model.getRecordedFileList().size()));
+    sqlite3_bind_text(statement, 3, path.c_str(), -1, SQLITE_TRANSIENT);
+    sqlite3_step(statement);
+    sqlite3_finalize(statement);
+    sqlite3_close(database);
+}
+
+void PanelScreen::load(const std::string& file, MwPlayer::PlayState state, unsigned int position)
+{
+    model.setCurrentPlayPath(support::recordingPath(file));
+    model.setPlayerState(state);
+    model.setCurrentPlayPosition(position);
+    announce();
+}
+
+void PanelScreen::announce() { _controller->getPlayerUpdatedSignal().emit(); }
+
+std::vector<MwSavedBookmark> PanelScreen::bookmarksOf(const std::string& mediaId)
+{
+    return mwReadBookmarks(mediaId, [](const char*, int) {});
+}
+
+void PanelScreen::dock(MwPlayViewController::ViewType type)
+{
+    std::string path;
+    MwResourceMgr::getInstance()->getEdjPath("edje/MwBookmarksContentView.edj", path);
+    Evas_Object* host = elm_layout_add(window);
+    elm_layout_file_set(host, path.c_str(), "bookmarks_content_view");
+    evas_object_size_hint_weight_set(host, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
+    elm_win_resize_object_add(window, host);
+    evas_object_show(host);
+    panel = new MwPlayViewController(&model, _controller.get());
+    panel->dock(host, type);
+    panelView = panel->getEvasObject();
+    panel->getEventSignal().addListener([this](auto event) { events.push_back(event); });
+    support::settle(window);
+}
+
+std::string PanelScreen::text(const char* part) const { return support::text(panelView, part); }
+
+Evas_Object* PanelScreen::content(const char* part) const { return elm_object_part_content_get(panelView, part); }
+
+double PanelScreen::sliderValue() const { return elm_slider_value_get(content("slider")); }
+
+void PanelScreen::press(const char* part)
+{
+    support::settle(window);
+    if (Evas_Object* found = content(part); found)
+        support::click(found);
+}
+
+std::vector<MwAppController::Command> PanelScreen::takeCommands()
+{
+    return std::exchange(fakes::controller.commands, {});
+}
+
+Evas_Object* PanelScreen::push(panekit::WContentViewController* screen)
+{
+    naviframe->push(screen);
+    support::runFor(0.1);
+    support::settle(window);
+    return screen->getEvasObject();
+}
+
+void PanelScreen::back() { support::key(window, "Escape"); }
+
+void PanelScreen::more() { support::key(window, "Menu"); }
+
+bool PanelScreen::_play(const std::string& path)
+{
+    model.setCurrentPlayPath(path);
+    model.setCurrentPlayPosition(0);
+    model.setPlayerState(MwPlayer::PLAY_STATE_PLAYING);
+    announce();
+    return true;
+}
+
+// What the controller does to the model.
+bool PanelScreen::_execute(MwAppController::Command command)
+{
+    if (command == failing)
+        return false;
+    switch (command) {
+    case MwAppController::START_PLAYING:
+    case MwAppController::RESUME_PLAYING:
+        model.setPlayerState(MwPlayer::PLAY_STATE_PLAYING);
+        announce();
+        return true;
+    case MwAppController::PAUSE_PLAYING:
+        model.setPlayerState(MwPlayer::PLAY_STATE_PAUSED);
+        announce();
+        return true;
+    case MwAppController::PLAY_PREVIOUS:
+        return _play(*model.getPreviousPlayPath());
+    case MwAppController::PLAY_NEXT:
+        return _play(*model.getNextPlayPath());
+    case MwAppController::SET_PLAYER_POSITION:
+        soughtTo.push_back(model.getCurrentPlayPosition());
+        return true;
+    default:
+        return true;
+    }
+}
+
+}

@@ -1,0 +1,113 @@
+#include "PanelShots.h"
+
+#include <Elementary.h>
+
+#include <cstdio>
+#include <functional>
+
+#include <media_content.h>
+
+#include "MwBookmarksContentViewController.h"
+#include "MwDetailsContentViewController.h"
+#include "PanelScreen.h"
+#include "support/Recordings.h"
+#include "support/Screen.h"
+
+namespace ui {
+
+namespace {
+
+    constexpr int MINUTE = 60000;
+
+    struct Shot {
+        const char* name;
+        std::function<void(PanelScreen&)> arrange;
+    };
+
+    void addBookmarks(const std::string& mediaId, int count, int seconds)
+    {
+        for (int i = 1; i <= count; ++i)
+            media_bookmark_insert_to_db(mediaId.c_str(), static_cast<unsigned int>(seconds * i / (count + 1)),
+                mwFormat("Bookmark%03d", i).c_str());
+    }
+
+    void panel(PanelScreen& screen, int duration, int bookmarks, MwPlayer::PlayState state, double share)
+    {
+        addBookmarks(screen.addRecording("Voice 001.m4a", duration), bookmarks, duration / 1000);
+        screen.load("Voice 001.m4a", state, static_cast<unsigned int>(duration * share));
+        screen.dock();
+    }
+
+    void bookmarks(PanelScreen& screen, int count)
+    {
+        const std::string id = screen.addRecording("Voice 001.m4a", 4 * MINUTE);
+        addBookmarks(id, count, 240);
+        if (count > 2)
+            media_bookmark_insert_to_db(
+                id.c_str(), 200, "What the harbour master said about the storm & the two lost boats");
+        screen.load("Voice 001.m4a", MwPlayer::PLAY_STATE_PAUSED, 83000);
+        screen.push(new MwBookmarksContentViewController(&screen.model, screen.controller(), id));
+    }
+
+    void chooseMode(PanelScreen& screen, int steps)
+    {
+        screen.more();
+        support::runFor(0.4);
+        for (int i = 0; i < steps; ++i)
+            support::key(screen.window, "Tab");
+        support::key(screen.window, "Return");
+        support::runFor(0.5);
+    }
+
+    void details(PanelScreen& screen)
+    {
+        const std::string name = "A very long conversation about everything and nothing in the old harbour.m4a";
+        screen.addRecording(name, 3 * MINUTE + 7000, std::string(3 << 20, 'x'));
+        screen.load(name, MwPlayer::PLAY_STATE_PAUSED);
+        screen.push(new MwDetailsContentViewController(
+            &screen.model, screen.controller(), screen.model.getRecordedFileList().front()));
+    }
+
+    const std::vector<Shot>& shots()
+    {
+        static const std::vector<Shot> all = {
+            {"panel-playing", [](auto& s) { panel(s, 4 * MINUTE, 1, MwPlayer::PLAY_STATE_PLAYING, 0.4); }},
+            {"panel-paused", [](auto& s) { panel(s, 4 * MINUTE, 0, MwPlayer::PLAY_STATE_PAUSED, 0.0); }},
+            {"panel-full", [](auto& s) { panel(s, 10 * MINUTE, 50, MwPlayer::PLAY_STATE_PAUSED, 1.0); }},
+            {"panel-hours", [](auto& s) { panel(s, 61 * MINUTE, 5, MwPlayer::PLAY_STATE_PLAYING, 0.2); }},
+            {"panel-short", [](auto& s) { panel(s, 1000, 0, MwPlayer::PLAY_STATE_NONE, 0.0); }},
+            {"bookmarks", [](auto& s) { bookmarks(s, 12); }},
+            {"bookmarks-empty", [](auto& s) { bookmarks(s, 0); }},
+            {"bookmarks-rename",
+                [](auto& s) {
+                    bookmarks(s, 3);
+                    chooseMode(s, 0);
+                }},
+            {"bookmarks-delete",
+                [](auto& s) {
+                    bookmarks(s, 3);
+                    chooseMode(s, 1);
+                }},
+            {"details", details},
+        };
+        return all;
+    }
+
+}
+
+void takePanelShots(
+    const std::string& directory, const std::string& suffix, const std::string& name, int width, int height)
+{
+    for (const Shot& shot : shots()) {
+        if (!name.empty() && name != shot.name)
+            continue;
+        PanelScreen screen(width, height);
+        shot.arrange(screen);
+        support::runFor(0.3);
+        support::settle(screen.window);
+        const std::string file = directory + "/" + shot.name + suffix + ".png";
+        std::printf("%s %s\n", support::savePng(screen.window, file) ? "wrote" : "failed", file.c_str());
+    }
+}
+
+}
