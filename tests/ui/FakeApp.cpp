@@ -2,13 +2,32 @@
 #include <app.h>
 #include <app_control.h>
 
+#include <cstring>
+#include <map>
 #include <string>
 
+#include "FakeApp.h"
 #include "fakes/Fakes.h"
 
 using fakes::calls;
 
-struct app_control_s { };
+struct app_control_s {
+    std::map<std::string, std::string> extras;
+};
+
+namespace ui {
+
+std::vector<Launch> launches;
+
+void answer(const Launch& launch, app_control_result_e result, const std::map<std::string, std::string>& extras)
+{
+    app_control_s request;
+    app_control_s reply{extras};
+    if (launch.callback)
+        launch.callback(&request, &reply, result, launch.userData);
+}
+
+}
 
 namespace {
 
@@ -54,5 +73,28 @@ int app_control_set_launch_mode(app_control_h, app_control_launch_mode_e mode)
 {
     return calls.record(__func__, std::to_string(mode));
 }
-int app_control_send_launch_request(app_control_h, app_control_reply_cb, void*) { return calls.record(__func__); }
+int app_control_set_uri(app_control_h, const char* uri) { return calls.record(__func__, uri); }
+int app_control_set_operation(app_control_h, const char* operation) { return calls.record(__func__, operation); }
+int app_control_add_extra_data_array(app_control_h, const char* key, const char* values[], int count)
+{
+    std::string all = std::string(key) + "=";
+    for (int i = 0; i < count; ++i)
+        all += std::string(i > 0 ? "," : "") + values[i];
+    return calls.record(__func__, all);
+}
+int app_control_get_extra_data(app_control_h control, const char* key, char** value)
+{
+    const auto found = control->extras.find(key);
+    if (found == control->extras.end())
+        return APP_CONTROL_ERROR_KEY_NOT_FOUND;
+    *value = ::strdup(found->second.c_str());
+    return APP_CONTROL_ERROR_NONE;
+}
+int app_control_enable_app_started_result_event(app_control_h) { return calls.record(__func__); }
+int app_control_send_terminate_request(app_control_h) { return calls.record(__func__); }
+int app_control_send_launch_request(app_control_h, app_control_reply_cb callback, void* data)
+{
+    ui::launches.push_back({callback, data});
+    return calls.record(__func__);
+}
 }

@@ -1,0 +1,254 @@
+// The recordings list: deleting and moving recordings.
+#include "MwRecordingsContentViewController.h"
+
+#include <utility>
+
+#include <Elementary.h>
+
+#include <notification.h>
+
+#include "MwFileDeleter.h"
+#include "MwFileOperationPopup.h"
+#include "MwFileOperator.h"
+#include "MwLog.h"
+#include "MwPlayer.h"
+#include "MwStorageRoots.h"
+#include "MwSystemMgr.h"
+#include "MwText.h"
+
+namespace {
+
+std::string fileName(const std::string& path) { return path.substr(path.rfind('/') + 1); }
+
+void replacePlaceholder(std::string& text, const std::string& placeholder, const std::string& value)
+{
+    if (const size_t place = text.find(placeholder); place != std::string::npos)
+        text.replace(place, placeholder.size(), value);
+}
+
+// What comes from a translation is never used as a format.
+std::string movedText(MwFileOperator::Type type, size_t count)
+{
+    if (type == MwFileOperator::MOVE_TO_PRIVATE)
+        return count == 1 ? mwTranslate("IDS_GALLERY_TPOP_1_ITEM_MOVED_TO_PRIVATE")
+                          : mwTranslateNumber("IDS_GALLERY_TPOP_PD_ITEMS_MOVED_TO_PRIVATE", count);
+    const std::string folder
+        = mwFormat("%s/%s", mwTranslate("IDS_VIDEO_SBODY_DEVICE_STORAGE").c_str(), RECORDINGS_DIRECTORY);
+    std::string text = mwTranslate(count == 1 ? "IDS_GALLERY_TPOP_1_ITEM_REMOVED_FROM_PRIVATE_AND_MOVED_TO_PS"
+                                              : "IDS_GALLERY_TPOP_PD_ITEMS_REMOVED_FROM_PRIVATE_AND_MOVED_TO_PS");
+    replacePlaceholder(text, "%1$d", std::to_string(count));
+    replacePlaceholder(text, "%d", std::to_string(count));
+    replacePlaceholder(text, "%2$s", folder);
+    replacePlaceholder(text, "%s", folder);
+    return text;
+}
+
+}
+
+std::unique_ptr<MwFileOperator> MwRecordingsContentViewController::_createFileOperator(
+    int type, const std::vector<std::string>& pathList)
+{
+    std::vector<MwFileOperator::Source> sources;
+    for (const std::string& path : pathList) {
+        const MwFileInfo* info = getModel()->getRecordedFileInfoByPath(path);
+        sources.push_back({path, info ? info->mediaId : std::string()});
+    }
+    if (type == MwFileOperator::DELETE)
+        return std::make_unique<MwFileOperator>(MwFileOperator::DELETE, std::move(sources),
+            MwFileOperator::Callbacks{nullptr, nullptr, [this] { _onDeleteFiles(); }});
+    return std::make_unique<MwFileOperator>(static_cast<MwFileOperator::Type>(type), std::move(sources),
+        MwFileOperator::Callbacks{[this] { _updateMovePopup(); },
+            [this](const std::string& path) { _createDuplicationPopupController(path); }, [this] { _moveFinished(); }});
+}
+
+void MwRecordingsContentViewController::_clickDeleteButton(const std::vector<std::string>& pathList)
+{
+    if (pathList.empty()) {
+        MW_LOGE("pathList size is 0");
+        return;
+    }
+    if (_fileOperator) {
+        MW_LOGE("file operator is working");
+        return;
+    }
+    _fileOperator = _createFileOperator(MwFileOperator::DELETE, pathList);
+    _fileOperationPopup = std::make_unique<MwFileOperationPopup>(getWindow());
+    _fileOperationPopup->showDeleting([this] { _cancelDeleting(); });
+    _fileOperator->start();
+}
+
+void MwRecordingsContentViewController::_cancelDeleting()
+{
+    if (!_fileOperator->hasBegun()) {
+        _deleteFileOperator();
+        return;
+    }
+    _fileOperator->cancelAndWait();
+    _onDeleteFiles();
+}
+
+void MwRecordingsContentViewController::_onDeleteFiles()
+{
+    for (const std::string& path : _fileOperator->donePaths())
+        getModel()->removeRecordedFile(path);
+    if (_fileOperator->hasFailed())
+        mwPost("IDS_MW_TPOP_SOME_RECORDINGS_NOT_DELETED");
+    _catalogueShrank();
+    _deleteFileOperator();
+    _viewType = NORMAL;
+    _update();
+}
+
+void MwRecordingsContentViewController::_catalogueShrank()
+{
+    if (getModel()->getRecordedFileList().empty())
+        _reloadNeeded = true;
+    if (!getModel()->updateLastRecordedFileNumber())
+        MW_LOGE("updateLastRecordedFileNumber failed!");
+}
+
+void MwRecordingsContentViewController::_deletePlayingFile()
+{
+    const std::string path = getModel()->getCurrentPlayPath();
+    const MwFileInfo* info = getModel()->getRecordedFileInfoByPath(path);
+    MwFileDeleter deleter;
+    deleter.remove(path, info ? info->mediaId : std::string());
+    if (deleter.finish().empty()) {
+        mwPost("IDS_MW_TPOP_SOME_RECORDINGS_NOT_DELETED");
+        return;
+    }
+    getModel()->removeRecordedFile(path);
+    getModel()->setCurrentPlayPath("");
+    _catalogueShrank();
+    if (getModel()->getPlayerState() == 0)
+        _update();
+    else if (!getAppController()->dispatchCommand(MwAppController::STOP_PLAYING))
+        MW_LOGE("play stop failed!");
+}
+
+void MwRecordingsContentViewController::_clickMoveDoneButton(const std::vector<std::string>& pathList)
+{
+    if (pathList.empty()) {
+        MW_LOGE("pathList is empty");
+        return;
+    }
+    if (_fileOperator) {
+        MW_LOGE("file operator is working");
+        return;
+    }
+    _fileOperator = _createFileOperator(
+        _viewType == MOVE_TO_PRIVATE ? MwFileOperator::MOVE_TO_PRIVATE : MwFileOperator::REMOVE_FROM_PRIVATE, pathList);
+    if (!_requestPrivateModeAppControl(true)) {
+        mwPost("IDS_MW_TPOP_PRIVATE_STORAGE_NOT_AVAILABLE");
+        _deleteFileOperator();
+    }
+}
+
+void MwRecordingsContentViewController::_moveStart()
+{
+    // The user may have left the selection while the storage was made available.
+    if (_viewType != MOVE_TO_PRIVATE && _viewType != REMOVE_FROM_PRIVATE) {
+        _deleteFileOperator();
+        return;
+    }
+    _fileOperationPopup = std::make_unique<MwFileOperationPopup>(getWindow());
+    _createMovingingPopupController();
+    _fileOperator->start();
+}
+
+void MwRecordingsContentViewController::_createMovingingPopupController()
+{
+    _fileOperationPopup->showMoving(_fileOperator->progress(), [this] { _cancelMoving(); });
+}
+
+void MwRecordingsContentViewController::_cancelMoving()
+{
+    if (_fileOperator->isFinished())
+        return; // it only shows the full bar
+    if (_fileOperator->hasBegun())
+        _fileOperator->requestCancel();
+    else
+        _onMoveFiles();
+}
+
+void MwRecordingsContentViewController::_updateMovePopup()
+{
+    if (_fileOperator && _fileOperationPopup)
+        _fileOperationPopup->update(_fileOperator->progress());
+}
+
+void MwRecordingsContentViewController::_createDuplicationPopupController(const std::string& path)
+{
+    _fileOperationPopup->showClash(fileName(path),
+        {[this](MwClashAction action) { _onSelectedDuplicationPopupButton(static_cast<int>(action)); },
+            [this](bool on) { _fileOperator->setApplyToAll(on); }});
+}
+
+void MwRecordingsContentViewController::_onSelectedDuplicationPopupButton(int action)
+{
+    MW_LOGW("BEGIN - action : [%d]", action);
+    _createMovingingPopupController();
+    _fileOperator->answer(static_cast<MwClashAction>(action));
+}
+
+void MwRecordingsContentViewController::_updateDuplicationPopup()
+{
+    if (_fileOperator && _fileOperationPopup)
+        _fileOperationPopup->setClashName(fileName(_fileOperator->currentPath()));
+}
+
+// The worker has ended. Only a full bar is looked at before the popup goes: a cancelled or stopped move never fills it.
+void MwRecordingsContentViewController::_moveFinished()
+{
+    const bool isFull = !_fileOperator->isCancelRequested() && !_fileOperator->hasFailed();
+    _updateMovePopup();
+    if (isFull && _fileOperationPopup)
+        _fileOperationPopup->complete([this] { _onMoveFiles(); });
+    else
+        _onMoveFiles();
+}
+
+void MwRecordingsContentViewController::_onMoveFiles()
+{
+    _deleteFileOperator();
+    _viewType = NORMAL;
+    if (!MwSystemMgr::getInstance()->isPrivateModeEnabledByApp()) {
+        getModel()->createRecordedFileList();
+        _reloadNeeded = true;
+    }
+    _update();
+}
+
+void MwRecordingsContentViewController::_deleteFileOperator()
+{
+    if (!_fileOperator) {
+        MW_LOGE("_fileOperator is nullptr");
+        return;
+    }
+    const auto popup = std::exchange(_fileOperationPopup, nullptr);
+    if (popup)
+        popup->close();
+    const auto fileOperator = std::exchange(_fileOperator, nullptr);
+    fileOperator->cancelAndWait();
+    if (fileOperator->type() != MwFileOperator::DELETE)
+        _moveEnded(*fileOperator);
+}
+
+// However a move ended: tells what was moved, and hands the private storage back.
+void MwRecordingsContentViewController::_moveEnded(const MwFileOperator& fileOperator)
+{
+    for (const auto& [from, to] : fileOperator.moved()) {
+        if (from == getModel()->getCurrentPlayPath())
+            getModel()->setCurrentPlayPath(to);
+    }
+    if (MwSystemMgr::getInstance()->isPrivateModeEnabledByApp())
+        return;
+    if (fileOperator.moved().empty())
+        MW_LOGW("moved file is 0");
+    else
+        notification_status_message_post(movedText(fileOperator.type(), fileOperator.moved().size()).c_str());
+    if (fileOperator.hasFailed())
+        mwPost("IDS_MW_TPOP_SOME_RECORDINGS_NOT_MOVED");
+    if (std::exchange(_privateStorageOpen, false))
+        _requestPrivateModeAppControl(false);
+}

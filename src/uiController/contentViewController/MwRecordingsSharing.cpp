@@ -1,0 +1,263 @@
+// The recordings list: sharing, the private storage's service, and renaming.
+#include "MwRecordingsContentViewController.h"
+
+#include <map>
+#include <utility>
+
+#include <unistd.h>
+
+#include <media_content.h>
+
+#include "MwFileOperator.h"
+#include "MwFiles.h"
+#include "MwLog.h"
+#include "MwMediaRow.h"
+#include "MwRenamePopupController.h"
+#include "MwText.h"
+
+namespace {
+
+constexpr auto PRIVATE_STORAGE_APP_ID = "com.tovanic.setting.private";
+
+using FilesLock = MwHandle<files_lock_h, media_content_unlock_files>;
+
+// A reply may come when its request, and even the screen, are long gone: what travels with it is a number.
+struct ReplyHandler {
+    std::weak_ptr<void> alive;
+    std::function<void(app_control_h reply, app_control_result_e result)> handle;
+};
+
+std::map<uintptr_t, ReplyHandler>& replyHandlers()
+{
+    static std::map<uintptr_t, ReplyHandler> handlers;
+    return handlers;
+}
+
+void* expectReply(ReplyHandler handler)
+{
+    static uintptr_t last = 0;
+    std::erase_if(replyHandlers(), [](const auto& entry) { return entry.second.alive.expired(); });
+    replyHandlers()[++last] = std::move(handler);
+    return reinterpret_cast<void*>(last); // NOLINT(performance-no-int-to-ptr): a number
+}
+
+void replyCb(app_control_h, app_control_h reply, app_control_result_e result, void* userData)
+{
+    MW_LOGW("BEGIN - result : [%d], data : [%p]", result, userData);
+    if (!userData) {
+        MW_LOGE("user_data == nullptr");
+        return;
+    }
+    const auto found = replyHandlers().find(reinterpret_cast<uintptr_t>(userData));
+    if (found == replyHandlers().end())
+        return;
+    const ReplyHandler handler = found->second;
+    if (result != APP_CONTROL_RESULT_APP_STARTED || handler.alive.expired())
+        replyHandlers().erase(found);
+    if (!handler.alive.expired())
+        handler.handle(reply, result);
+}
+
+std::string extraOf(app_control_h reply, const char* key)
+{
+    char* value = nullptr;
+    return reply && app_control_get_extra_data(reply, key, &value) == 0 ? mwAdopt(value) : std::string();
+}
+
+void destroyRequest(MwHandle<app_control_h, app_control_destroy>& request, bool terminate)
+{
+    if (!request)
+        return;
+    if (terminate)
+        MW_CALL(app_control_send_terminate_request, request.get());
+    if (const int result = request.close(); result != 0)
+        MW_LOGE("app_control_destroy failed : [%d]!!!", result);
+}
+
+bool fillShareRequest(app_control_h request, const std::vector<std::string>& pathList)
+{
+    if (!MW_CALL(app_control_set_uri, request, pathList.front().c_str()))
+        return false;
+    if (pathList.size() == 1)
+        return MW_CALL(app_control_set_operation, request, APP_CONTROL_OPERATION_SHARE);
+    std::vector<const char*> paths;
+    paths.reserve(pathList.size());
+    for (const std::string& path : pathList)
+        paths.push_back(path.c_str());
+    return MW_CALL(app_control_add_extra_data_array, request, APP_CONTROL_DATA_PATH, paths.data(),
+               static_cast<int>(paths.size()))
+        && MW_CALL(app_control_add_extra_data, request, "launch-type", "mewlo")
+        && MW_CALL(app_control_set_operation, request, APP_CONTROL_OPERATION_MULTI_SHARE);
+}
+
+// Hidden files are not catalogued, and a slash would lead elsewhere.
+bool isFileName(const std::string& name)
+{
+    return !name.empty() && name.front() != '.' && name.find('/') == std::string::npos;
+}
+
+enum class Rename { DONE, TAKEN, FAILED };
+
+Rename renameFile(const std::string& from, const std::string& to)
+{
+    FilesLock lock;
+    MW_CALL(media_content_lock_files, lock.out());
+    const auto moved = MwFiles::moveWithoutOverwriting(from, to);
+    if (moved != MwFiles::Move::DONE)
+        return moved == MwFiles::Move::EXISTS ? Rename::TAKEN : Rename::FAILED;
+    MwFiles::flushDirectoryOf(to);
+    const auto row = MwMediaRow::move(from, to);
+    if (row == MwMediaRow::Move::DONE)
+        return Rename::DONE;
+    if (row == MwMediaRow::Move::UNKNOWN && MW_CALL(media_content_scan_file, to.c_str()))
+        return Rename::DONE;
+    (void)MwFiles::moveWithoutOverwriting(to, from);
+    return Rename::FAILED;
+}
+
+}
+
+bool MwRecordingsContentViewController::_clickShareDoneButton(const std::vector<std::string>& pathList)
+{
+    if (pathList.empty()) {
+        MW_LOGE("pathList is empty");
+        return false;
+    }
+    if (_shareRequest) {
+        MW_LOGW("destroy share app control : [%p]", static_cast<void*>(_shareRequest.get()));
+        _destroyShareRequest(false);
+    }
+    Request request;
+    void* answer = expectReply({token(), [this](app_control_h, app_control_result_e result) { _shareReply(result); }});
+    if (!MW_CALL(app_control_create, request.out()) || !fillShareRequest(request.get(), pathList)
+        || !MW_CALL(app_control_set_launch_mode, request.get(), APP_CONTROL_LAUNCH_MODE_GROUP)
+        || !MW_CALL(app_control_enable_app_started_result_event, request.get())
+        || !MW_CALL(app_control_send_launch_request, request.get(), replyCb, answer)) {
+        mwPost("IDS_MW_TPOP_NOTHING_TO_SHARE_WITH");
+        return false;
+    }
+    _shareRequest = std::move(request);
+    MW_LOGI("share app control data : [%p]", static_cast<void*>(_shareRequest.get()));
+    return true;
+}
+
+void MwRecordingsContentViewController::_shareReply(int result)
+{
+    if (result != APP_CONTROL_RESULT_APP_STARTED)
+        return;
+    _viewType = NORMAL;
+    _update();
+    _destroyShareRequest(false);
+}
+
+void MwRecordingsContentViewController::_destroyShareRequest(bool terminate)
+{
+    destroyRequest(_shareRequest, terminate);
+}
+
+void MwRecordingsContentViewController::_destroyPrivateModeRequest(bool terminate)
+{
+    destroyRequest(_privateModeRequest, terminate);
+}
+
+// Makes the private storage available for a move, or hands it back; nobody waits for the latter.
+bool MwRecordingsContentViewController::_requestPrivateModeAppControl(bool mount)
+{
+    Request request;
+    if (!MW_CALL(app_control_create, request.out())
+        || !MW_CALL(app_control_set_app_id, request.get(), PRIVATE_STORAGE_APP_ID)
+        || !MW_CALL(app_control_add_extra_data, request.get(), "type", "move_to_private")
+        || !MW_CALL(app_control_add_extra_data, request.get(), "pid", std::to_string(::getpid()).c_str())
+        || !MW_CALL(app_control_add_extra_data, request.get(), "value", mount ? "on" : "off")
+        || !MW_CALL(app_control_set_launch_mode, request.get(), APP_CONTROL_LAUNCH_MODE_GROUP))
+        return false;
+    if (!mount)
+        return MW_CALL(app_control_send_launch_request, request.get(), nullptr, nullptr);
+    void* answer = expectReply(
+        {token(), [this](app_control_h reply, app_control_result_e result) { _privateModeReply(reply, result); }});
+    if (!MW_CALL(app_control_send_launch_request, request.get(), replyCb, answer))
+        return false;
+    _privateModeRequest = std::move(request);
+    return true;
+}
+
+void MwRecordingsContentViewController::_privateModeReply(app_control_h reply, int result)
+{
+    MW_LOGW("result : [%d]", result);
+    _destroyPrivateModeRequest(true);
+    if (!_fileOperator)
+        return;
+    _privateStorageOpen = result == APP_CONTROL_RESULT_SUCCEEDED && extraOf(reply, "result") == "Success";
+    if (_privateStorageOpen) {
+        _moveStart();
+        return;
+    }
+    mwPost("IDS_MW_TPOP_PRIVATE_STORAGE_NOT_AVAILABLE");
+    _deleteFileOperator();
+}
+
+void MwRecordingsContentViewController::_openRenamePopup(const std::string& path)
+{
+    const MwFileInfo* info = getModel()->getRecordedFileInfoByPath(path);
+    if (!info) {
+        MW_LOGE("get file info failed!!!");
+        return;
+    }
+    if (_renamePopup) {
+        MW_LOGW("rename popup already show");
+        _closeRenamePopup();
+    }
+    _renameTarget = path;
+    _renamePopup
+        = std::make_unique<MwRenamePopupController>(info->displayName.substr(0, info->displayName.rfind('.')).c_str());
+    _renamePopup->setResponseCb(
+        [this](void*, const char* text, int response) { _renameResponseCb(text, response); }, this);
+    if (!_renamePopup->create(getWindow(), nullptr))
+        _renamePopup.reset();
+}
+
+// Gone after the callback that is still running in it.
+void MwRecordingsContentViewController::_closeRenamePopup()
+{
+    const auto popup = std::exchange(_renamePopup, nullptr);
+    if (popup)
+        popup->destory();
+}
+
+void MwRecordingsContentViewController::_renameResponseCb(const char* text, int response)
+{
+    if (response != MwRenamePopupController::RESPONSE_RENAME || !text || _renameRecording(text))
+        _closeRenamePopup();
+}
+
+// True closes the popup.
+bool MwRecordingsContentViewController::_renameRecording(const std::string& name)
+{
+    if (!isFileName(name)) {
+        mwPost("IDS_MW_POP_INVALID_FILE_NAME");
+        return false;
+    }
+    const std::string path = _renameTarget;
+    if (!getModel()->getRecordedFileInfoByPath(path))
+        return true;
+    const size_t nameStart = path.rfind('/') + 1;
+    const size_t dot = path.find('.', nameStart) != std::string::npos ? path.rfind('.') : path.size();
+    const std::string newDisplayName = name + path.substr(dot);
+    const std::string newPath = path.substr(0, nameStart) + newDisplayName;
+    switch (renameFile(path, newPath)) {
+    case Rename::TAKEN:
+        mwPost("IDS_MW_POP_RENAMEALREADYUSED");
+        return false;
+    case Rename::FAILED:
+        mwPost("IDS_MW_POP_INVALID_FILE_NAME");
+        return false;
+    case Rename::DONE:
+        break;
+    }
+    getModel()->renameRecordedFile(path, newPath, newDisplayName);
+    if (getModel()->getCurrentPlayPath() == path)
+        getModel()->setCurrentPlayPath(newPath);
+    _viewType = NORMAL;
+    _update();
+    return true;
+}
