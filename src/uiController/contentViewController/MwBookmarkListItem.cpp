@@ -6,6 +6,7 @@
 #include <string_view>
 #include <utility>
 
+#include "MwDisplayText.h"
 #include "MwLog.h"
 #include "MwText.h"
 
@@ -20,8 +21,6 @@ constexpr auto CHOICE_PART = "elm.icon.2";
 constexpr auto CHOICE_STYLE = "mewlo";
 constexpr auto INNER_PART = "elm.swallow.content";
 constexpr auto RADIO_KEY = "radio";
-
-std::string markup(const std::string& text) { return mwAdopt(elm_entry_utf8_to_markup(text.c_str())); }
 
 }
 
@@ -50,9 +49,9 @@ const char* MwBookmarkListItem::getStyle() const { return isSelectAll() ? SELECT
 std::string MwBookmarkListItem::getText(const char* part)
 {
     if (isSelectAll())
-        return part == SELECT_ALL_PART ? markup(mwTranslate("IDS_ST_BODY_SELECT_ALL")) : std::string();
+        return part == SELECT_ALL_PART ? mwDisplayMarkup(mwTranslate("IDS_ST_BODY_SELECT_ALL")) : std::string();
     if (part == NAME_PART)
-        return markup(_bookmark->name);
+        return mwDisplayMarkup(_bookmark->name);
     if (part == TIME_PART)
         return timeText(_bookmark->markedTime);
     return {};

@@ -7,6 +7,7 @@
 #include <string_view>
 
 #include "MwDetailsTexts.h"
+#include "MwDisplayText.h"
 #include "MwICU.h"
 #include "MwLog.h"
 #include "MwModel.h"
@@ -40,9 +41,9 @@ const char* MwDetailsListItem::getStyle() const { return ROW_STYLE; }
 std::string MwDetailsListItem::getText(const char* part)
 {
     if (part == TITLE_PART)
-        return mwAdopt(elm_entry_utf8_to_markup(_getTitle().c_str()));
+        return mwDisplayMarkup(_getTitle());
     if (part == VALUE_PART)
-        return mwAdopt(elm_entry_utf8_to_markup(_getValue().c_str()));
+        return mwDisplayMarkup(_getValue());
     return {};
 }
 
