@@ -1,0 +1,225 @@
+// What the recordings list does to files: deleting, moving, sharing, renaming, as a user does them.
+#include <gtest/gtest.h>
+
+#include <Elementary.h>
+
+#include <panekit/WPopupController.h>
+#include <storage.h>
+#include <vconf.h>
+
+#include "FakeApp.h"
+#include "RecordingsScreen.h"
+#include "RenameWindow.h"
+#include "fakes/Fakes.h"
+#include "support/Recordings.h"
+#include "support/RunUntil.h"
+#include "support/Screen.h"
+
+using fakes::calls;
+using panekit::WPopupController;
+using support::runUntil;
+using ui::RecordingsScreen;
+using Names = std::vector<std::string>;
+
+namespace {
+
+namespace fs = std::filesystem;
+
+std::string privatePath(const std::string& name)
+{
+    return std::string(storage_private_root()) + "/Sounds/Mewlo/" + name;
+}
+
+std::string popupName()
+{
+    const auto* popup = WPopupController::topmost();
+    return popup ? evas_object_name_get(popup->getEvasObject()) : "";
+}
+
+Evas_Object* popupContent() { return elm_object_content_get(WPopupController::topmost()->getEvasObject()); }
+
+class RecordingsOperationsTest : public ::testing::Test {
+protected:
+    void SetUp() override
+    {
+        ui::forgetRecordings();
+        ui::launches.clear();
+        vconf_set_int("db/setting/personal_unlock_method", 1);
+        _screen = std::make_unique<RecordingsScreen>();
+        for (const char* name : {"a.m4a", "b.m4a", "c.m4a"})
+            _ids[name] = support::addRecording(name, name);
+        _screen->open();
+        calls.clear();
+    }
+    // Enters a mode by its menu entry, checks the recordings and presses Done or Delete.
+    void select(const std::string& entry, const Names& names)
+    {
+        _screen->chooseMenu(entry);
+        for (const std::string& name : names)
+            _screen->tap(name);
+        _screen->pressTitle("title_right_btn");
+    }
+    [[nodiscard]] bool hasEnded() const
+    {
+        return runUntil([this] { return WPopupController::topmost() == nullptr && _screen->names().size() < 4; }, 10);
+    }
+    [[nodiscard]] bool isNormal() const { return _screen->hasRecordButton(); }
+    // Moves the files as far as the popup.
+    void startMove(const Names& names)
+    {
+        select("Move to private", names);
+        ASSERT_EQ(1U, ui::launches.size());
+        ui::answer(ui::launches[0], APP_CONTROL_RESULT_SUCCEEDED, {{"result", "Success"}});
+        ASSERT_EQ("movePopup", popupName());
+    }
+    static bool waitForClash()
+    {
+        return runUntil([] { return popupName() == "duplicationPopup"; }, 5);
+    }
+    std::unique_ptr<RecordingsScreen> _screen;
+    std::map<std::string, std::string> _ids;
+};
+
+TEST_F(RecordingsOperationsTest, DeletesWhatIsCheckedBehindAPopup)
+{
+    select("Delete", {"a.m4a", "c.m4a"});
+    EXPECT_EQ("deletePopup", popupName());
+    EXPECT_EQ("Deleting…", support::text(popupContent(), "elm.text"));
+    ASSERT_TRUE(hasEnded());
+    EXPECT_EQ(Names{"b.m4a"}, _screen->names());
+    EXPECT_FALSE(fs::exists(ui::recordingPath("a.m4a")));
+    EXPECT_TRUE(fs::exists(ui::recordingPath("b.m4a")));
+    EXPECT_TRUE(isNormal());
+
+    select("Delete", {"b.m4a"});
+    _screen->back(); // before it begins
+    EXPECT_EQ("", popupName());
+    support::runFor(0.5);
+    EXPECT_TRUE(fs::exists(ui::recordingPath("b.m4a")));
+    _screen->pressTitle("title_right_btn");
+    ASSERT_TRUE(runUntil([this] { return _screen->list() == nullptr; }));
+    EXPECT_FALSE(fs::exists(ui::recordingPath("b.m4a")));
+}
+
+TEST_F(RecordingsOperationsTest, DeletesThePlayingRecordingAfterAsking)
+{
+    _screen->tap("b.m4a");
+    ASSERT_EQ(ui::recordingPath("b.m4a"), _screen->model.getCurrentPlayPath());
+    _screen->chooseMenu("Delete");
+    WPopupController::topmost()->press(1);
+    support::settle(_screen->window);
+    EXPECT_FALSE(fs::exists(ui::recordingPath("b.m4a")));
+    EXPECT_EQ("", _screen->model.getCurrentPlayPath());
+    EXPECT_EQ(2U, _screen->names().size());
+    EXPECT_TRUE(isNormal());
+}
+
+TEST_F(RecordingsOperationsTest, MovesToPrivateAndAnswersAClash)
+{
+    support::writeFile(privatePath("b.m4a"), "old");
+    select("Move to private", {"a.m4a", "b.m4a"});
+    EXPECT_TRUE(calls.has("app_control_set_app_id com.tovanic.setting.private"));
+    EXPECT_TRUE(calls.has("app_control_add_extra_data value=on"));
+    EXPECT_EQ("", popupName()) << "not before the storage is available";
+    ui::answer(ui::launches.at(0), APP_CONTROL_RESULT_SUCCEEDED, {{"result", "Success"}});
+    EXPECT_EQ("movePopup", popupName());
+    EXPECT_EQ("0/2", support::text(popupContent(), "elm.text.left"));
+    ASSERT_TRUE(waitForClash());
+    EXPECT_NE(std::string::npos, support::text(popupContent(), "elm.text").find("b.m4a"));
+    WPopupController::topmost()->press(2);
+    EXPECT_EQ("movePopup", popupName());
+    ASSERT_TRUE(runUntil([] { return popupName().empty(); }, 10));
+    EXPECT_EQ("old", support::readFile(privatePath("b.m4a")));
+    EXPECT_EQ("b.m4a", support::readFile(privatePath("b_001.m4a")));
+    EXPECT_EQ("2 items moved to private.", fakes::desktop.lastMessage);
+    EXPECT_TRUE(calls.has("app_control_add_extra_data value=off"));
+    EXPECT_TRUE(isNormal());
+    EXPECT_NE(nullptr, _screen->row("b_001.m4a"));
+}
+
+TEST_F(RecordingsOperationsTest, AMoveEndsByItselfHoweverItStops)
+{
+    startMove({"a.m4a", "b.m4a"});
+    fs::remove(ui::recordingPath("a.m4a")); // fails
+    fs::remove(ui::recordingPath("b.m4a"));
+    ASSERT_TRUE(runUntil([] { return popupName().empty(); }, 10));
+    EXPECT_EQ("Some recordings could not be moved and are where they were.", fakes::desktop.lastMessage);
+    EXPECT_TRUE(isNormal());
+
+    ui::launches.clear();
+    select("Move to private", {"c.m4a"});
+    ui::answer(ui::launches.at(0), APP_CONTROL_RESULT_FAILED);
+    EXPECT_EQ("The private storage is not available.", fakes::desktop.lastMessage);
+    EXPECT_EQ("", popupName());
+    ui::launches.clear();
+    _screen->pressTitle("title_right_btn"); // again
+    ui::answer(ui::launches.at(0), APP_CONTROL_RESULT_SUCCEEDED, {{"result", "Success"}});
+    WPopupController::topmost()->press(0); // cancelled before it begins
+    support::runFor(0.5);
+    EXPECT_TRUE(fs::exists(ui::recordingPath("c.m4a")));
+    EXPECT_TRUE(isNormal());
+}
+
+TEST_F(RecordingsOperationsTest, AScreenLeftInAClashAndLateRepliesDoNoHarm)
+{
+    support::writeFile(privatePath("a.m4a"), "old");
+    startMove({"a.m4a"});
+    ASSERT_TRUE(waitForClash());
+    const ui::Launch launch = ui::launches[0];
+    _screen.reset();
+    EXPECT_EQ("", popupName());
+    ui::answer(launch, APP_CONTROL_RESULT_SUCCEEDED, {{"result", "Success"}});
+    EXPECT_EQ("a.m4a", support::readFile(ui::recordingPath("a.m4a")));
+    EXPECT_EQ("old", support::readFile(privatePath("a.m4a")));
+}
+
+TEST_F(RecordingsOperationsTest, SharesOneOrSeveral)
+{
+    select("Share", {"b.m4a"});
+    EXPECT_TRUE(calls.has("app_control_set_uri " + ui::recordingPath("b.m4a")));
+    EXPECT_TRUE(calls.has(std::string("app_control_set_operation ") + APP_CONTROL_OPERATION_SHARE));
+    EXPECT_FALSE(calls.has("app_control_add_extra_data_array"));
+    EXPECT_TRUE(calls.has("app_control_set_launch_mode 1"));
+    EXPECT_FALSE(isNormal());
+    ui::answer(ui::launches.at(0), APP_CONTROL_RESULT_APP_STARTED);
+    EXPECT_TRUE(isNormal());
+
+    calls.clear();
+    select("Share", {"a.m4a", "c.m4a"});
+    EXPECT_TRUE(calls.has(std::string("app_control_set_operation ") + APP_CONTROL_OPERATION_MULTI_SHARE));
+    EXPECT_TRUE(calls.has("app_control_add_extra_data launch-type=mewlo"));
+    const auto arrays = calls.matching("app_control_add_extra_data_array");
+    ASSERT_EQ(1U, arrays.size());
+    EXPECT_NE(std::string::npos, arrays[0].find(ui::recordingPath("a.m4a")));
+    EXPECT_NE(std::string::npos, arrays[0].find(ui::recordingPath("c.m4a")));
+    calls.failWith("app_control_send_launch_request", APP_CONTROL_ERROR_APP_NOT_FOUND);
+    _screen->pressTitle("title_right_btn");
+    EXPECT_EQ("There is no application to share with.", fakes::desktop.lastMessage);
+    EXPECT_FALSE(isNormal());
+}
+
+TEST_F(RecordingsOperationsTest, RenamesWhatIsFreeAndKeepsPlaying)
+{
+    _screen->tap("b.m4a");
+    _screen->chooseMenu("Rename");
+    Evas_Object* window = ui::renameWindow(_screen->window);
+    ASSERT_NE(nullptr, window);
+    for (const auto& [name, message] :
+        std::map<std::string, std::string>{{"a", "This name is already used."}, {".b", "This name cannot be used."}}) {
+        ui::answerRename(window, name);
+        EXPECT_EQ(message, fakes::desktop.lastMessage);
+        EXPECT_EQ(window, ui::renameWindow(_screen->window)) << "stays open";
+    }
+    ui::answerRename(window, "Talk");
+    EXPECT_EQ(nullptr, ui::renameWindow(_screen->window));
+    EXPECT_EQ("b.m4a", support::readFile(ui::recordingPath("Talk.m4a")));
+    EXPECT_EQ("a.m4a", support::readFile(ui::recordingPath("a.m4a")));
+    EXPECT_EQ(ui::recordingPath("Talk.m4a"), _screen->model.getCurrentPlayPath());
+    EXPECT_TRUE(_screen->hasPlayer());
+    const MwFileInfo* info = _screen->model.getRecordedFileInfoByPath(ui::recordingPath("Talk.m4a"));
+    ASSERT_NE(nullptr, info);
+    EXPECT_EQ(_ids["b.m4a"], info->mediaId);
+    EXPECT_NE(nullptr, _screen->row("Talk.m4a"));
+}
+
+}
