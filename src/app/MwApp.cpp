@@ -2,7 +2,6 @@
 
 #include <Elementary.h>
 #include <media_content.h>
-#include <notification.h>
 #include <panekit/WLanguage.h>
 #include <panekit/WNaviframeController.h>
 #include <panekit/WPopupController.h>
@@ -22,6 +21,7 @@
 #include "MwRecorder.h"
 #include "MwRecorderContentViewController.h"
 #include "MwRecordingRescue.h"
+#include "MwRecordingsContentViewController.h"
 #include "MwRequestParser.h"
 #include "MwResourceMgr.h"
 #include "MwSignalMgr.h"
@@ -32,7 +32,6 @@ namespace {
 
 constexpr auto TEXT_DOMAIN = "mewlo-lite";
 constexpr auto WINDOW_NAME = "com.tovanic.mewlo-lite";
-constexpr auto FILE_MANAGER_APP_ID = "com.tovanic.setting.storage";
 constexpr int WINDOW_TYPE = 1;
 constexpr double BASE_SCALE = 2.6;
 constexpr int INDICATOR_SHOWN = 2, INDICATOR_TRANSPARENT = 3;
@@ -42,22 +41,6 @@ constexpr int SMALLEST_REFUSED_LIMIT = 2; // kilobytes
 constexpr int LOWEST_ALLOWED_BATTERY = 2;
 constexpr std::array<const char*, 7> THEME_EXTENSIONS = {"edje/MwGenlist.edj", "edje/MwButton.edj", "edje/MwSlider.edj",
     "edje/MwDetailsRows.edj", "edje/MwBookmarkRows.edj", "edje/MwPopupParts.edj", "edje/MwRecordingsRows.edj"};
-
-void showFolder(const std::string& directory)
-{
-    MwHandle<app_control_h, app_control_destroy> request;
-    if (!MW_CALL(app_control_create, request.out()))
-        return;
-    MW_CALL(app_control_set_app_id, request.get(), FILE_MANAGER_APP_ID);
-    MW_CALL(app_control_set_uri, request.get(), ("file://" + directory).c_str());
-    MW_CALL(app_control_set_launch_mode, request.get(), APP_CONTROL_LAUNCH_MODE_GROUP);
-    if (MW_CALL(app_control_send_launch_request, request.get(), nullptr, nullptr))
-        return;
-    std::string message = mwTranslate("IDS_MW_TPOP_RECORDINGS_ARE_IN_PS");
-    if (const size_t place = message.find("%s"); place != std::string::npos)
-        message.replace(place, 2, directory);
-    notification_status_message_post(message.c_str());
-}
 
 template <typename Apply>
 void forEachThemeExtension(Apply apply)
@@ -266,28 +249,12 @@ void MwApp::_launchFirst()
     _watchesStopRequests = MW_CALL(preference_set_changed_cb, STOP_PREFERENCE, _recordingStopRequestCb, this);
 }
 
-// The one place that says what opens after a stop and for the recordings button. After a stop the recorder is ready for
-// the next recording and says what it saved (a request is answered instead); the button shows the recordings in the
-// desktop's file manager.
+// After a stop and for the recordings button. A list that is open already follows by itself.
 void MwApp::_openRecordings()
 {
-    const std::string saved = _appController->getLastSavedPath();
-    if (saved == _shownPath) {
-        showFolder(_model->getRecordingsDirectory());
-        return;
-    }
-    _shownPath = saved;
-    if (_model->isRequestMode() && !saved.empty()) {
-        _appController->replyAndExit();
-        return;
-    }
-    if (!saved.empty()) {
-        const std::string name = saved.substr(saved.rfind('/') + 1);
-        notification_status_message_post(
-            mwFormat("%s %s", name.substr(0, name.rfind('.')).c_str(), mwTranslate("IDS_MW_POP_SAVED").c_str())
-                .c_str());
-    }
-    _appController->getRecorderUpdatedSignal().emit();
+    panekit::WNaviframeController* naviframe = getWindow()->getBaseViewController();
+    if (dynamic_cast<MwRecordingsContentViewController*>(naviframe->getTop()) == nullptr)
+        naviframe->push(new MwRecordingsContentViewController(_model.get(), _appController.get()));
 }
 
 bool MwApp::_lastItemPopped()

@@ -61,5 +61,4 @@ private:
     panekit::WPopupController* _mainAppRecordingPopup = nullptr;
     std::unique_ptr<MwRecordingRescue> _rescue;
     bool _watchesStopRequests = false;
-    std::string _shownPath; // the recording last told of as saved
 };

@@ -262,9 +262,12 @@ void MwRecordingsContentViewController::_createRecordController()
 
 void MwRecordingsContentViewController::_clickRecordButton()
 {
-    const auto finished = [](MwAppController::Command, MwAppController::Result result, void*) {
+    const auto alive = token();
+    const auto finished = [this, alive](MwAppController::Command, MwAppController::Result result, void*) {
         if (result != MwAppController::SUCCESS)
             MW_LOGE("START_RECORDING failed");
+        else if (!alive.expired() && isTop())
+            popOut(); // to the screen of the recorder
     };
     if (!getAppController()->dispatchCommandAsync(MwAppController::START_RECORDING, finished, nullptr))
         MW_LOGE("START_RECORDING failed");
