@@ -133,6 +133,10 @@ TEST_F(BookmarksScreenTest, ListsByTimeAndJumps)
     tap(1);
     EXPECT_EQ(Commands{MwAppController::SET_PLAYER_POSITION}, _screen.takeCommands());
     EXPECT_EQ(65000U, _screen.model.getCurrentPlayPosition());
+    support::key(_screen.window, "Right");
+    EXPECT_EQ(70000U, _screen.model.getCurrentPlayPosition());
+    support::key(_screen.window, "space", " ");
+    EXPECT_EQ(MwPlayer::PLAY_STATE_PLAYING, _screen.model.getPlayerState());
 }
 
 TEST_F(BookmarksScreenTest, DeletesWhatIsChecked)

@@ -255,14 +255,15 @@ TEST_F(PlayPanelTest, SliderObeysTheFingerAlone)
 TEST_F(PlayPanelTest, KeysSeekWithinTheRecording)
 {
     open(20000, State::PLAY_STATE_PAUSED, 12000);
-    _screen.panel->seekBy(5000);
+    EXPECT_TRUE(_screen.panel->takeKey("Right"));
     _screen.panel->seekBy(5000);
     _screen.panel->seekBy(-30000);
     EXPECT_EQ((std::vector<unsigned int>{17000, 20000, 0}), _screen.soughtTo);
     EXPECT_EQ(0.0, _screen.sliderValue());
     elm_object_focus_set(_screen.content("slider"), EINA_TRUE);
     support::key(_screen.window, "Right");
-    EXPECT_TRUE(waitForSeeks(4)) << "nobody lets go of a knob that a key moved";
+    ASSERT_TRUE(waitForSeeks(4)) << "nobody lets go of a knob that a key moved";
+    EXPECT_NEAR(5000, _screen.soughtTo.back(), 1);
     _screen.load(FILE_NAME, State::PLAY_STATE_NONE, 12000);
     _screen.takeCommands();
     _screen.panel->seekBy(1000);

@@ -4,6 +4,8 @@
 #include <string>
 #include <vector>
 
+#include <Evas.h>
+
 #include <panekit/WTimer.h>
 
 #include "MwBookmarkListItem.h"
@@ -44,6 +46,7 @@ private:
     // List
     void _createList();
     void _loadListItems();
+    static void _listKeyCb(void* data, Evas* canvas, Evas_Object* list, void* info);
     void _reloadList();
     [[nodiscard]] std::vector<MwBookmarkListItem*> _rows() const;
     [[nodiscard]] int _checkedCount() const;

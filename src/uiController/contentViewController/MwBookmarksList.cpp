@@ -32,6 +32,18 @@ void MwBookmarksContentViewController::_createList()
     elm_genlist_mode_set(_genlist, ELM_LIST_COMPRESS);
     elm_object_part_content_set(getEvasObject(), LIST_PART, _genlist);
     evas_object_show(_genlist);
+    // What has the keyboard when the list is focused is its inner object; the list would scroll by Left and Right.
+    evas_object_event_callback_priority_add(
+        elm_layout_edje_get(_genlist), EVAS_CALLBACK_KEY_DOWN, EVAS_CALLBACK_PRIORITY_BEFORE, _listKeyCb, this);
+    elm_object_focus_set(_genlist, EINA_TRUE);
+}
+
+void MwBookmarksContentViewController::_listKeyCb(void* data, Evas*, Evas_Object*, void* info)
+{
+    const auto* self = static_cast<MwBookmarksContentViewController*>(data);
+    auto* event = static_cast<Evas_Event_Key_Down*>(info);
+    if (self->_playView && self->_playView->takeKey(event->key))
+        event->event_flags = static_cast<Evas_Event_Flags>(event->event_flags | EVAS_EVENT_FLAG_ON_HOLD);
 }
 
 void MwBookmarksContentViewController::_loadListItems()

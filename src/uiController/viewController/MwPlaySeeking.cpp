@@ -66,6 +66,9 @@ void MwPlayViewController::_refreshSlider(Draw draw)
     if (_isSliding)
         return;
     Evas_Object* slider = elm_object_part_content_get(getEvasObject(), SLIDER_PART);
+    // Its own keys and the wheel move as far as the keys of the list.
+    if (draw == Draw::Everything)
+        elm_slider_step_set(slider, mwPlayRatio(KEY_STEP, _duration));
     const double value = mwPlayRatio(_model->getCurrentPlayPosition(), _duration);
     if (draw == Draw::Everything || movesByAPixel(slider, value))
         elm_slider_value_set(slider, value);
@@ -156,6 +159,17 @@ void MwPlayViewController::seekBy(int milliseconds)
 {
     if (!_model->getCurrentPlayPath().empty() && !_isSliding)
         _seekTo(mwSoughtPosition(_model->getCurrentPlayPosition(), milliseconds, _duration));
+}
+
+bool MwPlayViewController::takeKey(const std::string& key)
+{
+    if (key == "Left" || key == "Right")
+        seekBy(key == "Left" ? -KEY_STEP : KEY_STEP);
+    else if (key == "space")
+        togglePlay();
+    else
+        return false;
+    return true;
 }
 
 void MwPlayViewController::_pressRewButton() { _press(_rewind); }

@@ -38,6 +38,8 @@ public:
     // What keys do while the list has the keyboard. Moves by milliseconds (negative: back) within the recording.
     void seekBy(int milliseconds);
     void togglePlay();
+    // Left, Right and Space; answers whether it was one of them.
+    bool takeKey(const std::string& key);
 
 protected:
     ~MwPlayViewController() override;
