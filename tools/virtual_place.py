@@ -63,6 +63,13 @@ class Place:
         self.wait_for("the sound server", lambda: "Server Name" in self.call("pactl", "info"))
         self.call("pactl", "set-default-source", "micsrc")
 
+    def start_bus(self):
+        """A session bus of this run alone, for what is started from now on."""
+        address = f"unix:path={self.env['XDG_RUNTIME_DIR']}/bus"
+        self.start("dbus-daemon", "--session", "--nofork", f"--address={address}")
+        self.wait_for("the session bus", lambda: os.path.exists(self.env["XDG_RUNTIME_DIR"] + "/bus"))
+        self.env["DBUS_SESSION_BUS_ADDRESS"] = address
+
     def make_noise(self, seconds):
         """Plays noise into the microphone for that long."""
         noise = os.path.join(self.dir, "noise.wav")

@@ -2,6 +2,7 @@
 """smoke_test.py ROOT BIN CASE: drives the real recorder in a real window on a virtual display, as its user would."""
 import glob
 import os
+import shutil
 import signal
 import subprocess
 import sys
@@ -117,10 +118,60 @@ def request_once(place, end):
         place.call("xdotool", "windowminimize", place.window())
     else:
         place.call("xdotool", "key", "Return")
+        place.wait_for("the row", lambda: recordings(place))
+        time.sleep(1)
+        place.click(900, 40)  # done, with the recording just made selected
     path = request.communicate(timeout=20)[0].strip()
     check(request.returncode == 0, "status 0")
     check(path.endswith(".amr") and decoded_ms(path) > 1000, path)
     place.wait_for("the end of the window", lambda: place.window() is None)
+
+
+def control(place, *words):
+    return place.call("playerctl", "--player=mewlo_lite", *words).strip()
+
+
+def trash(place):
+    return os.listdir(place.env["XDG_DATA_HOME"] + "/Trash/files")
+
+
+def find_play_bookmark_rename_delete(place):
+    place.start_bus()
+    start_recorder(place)
+    place.make_noise(20)
+    start_recording(place)
+    time.sleep(5)
+    place.call("xdotool", "key", "Return")
+    place.wait_for("the row", lambda: recordings(place))
+    time.sleep(1)
+    place.click(500, 120)  # the first row of the list that opened
+    place.wait_for("playback", lambda: control(place, "status") == "Playing")
+    check(control(place, "metadata", "title") == "Voice 001", "its title")
+    place.call("xdotool", "key", "space")
+    place.wait_for("the pause", lambda: control(place, "status") == "Paused")
+    control(place, "position", "3")
+    place.wait_for("the other place", lambda: abs(float(control(place, "position")) - 3) < 0.1)
+    place.click(115, 911)  # bookmark
+    place.wait_for("the bookmark", lambda: recordings(place)[0][2] == 1)
+
+    place.call("xdotool", "key", "F2")
+    time.sleep(1)
+    place.call("xdotool", "type", "Harbour")
+    place.call("xdotool", "key", "Return")
+    place.wait_for("the new name", lambda: recordings(place)[0][0].endswith("/Harbour.m4a"))
+    path, duration, bookmarks = recordings(place)[0]
+    check(os.path.exists(path) and bookmarks == 1, "the file and its bookmark")
+    check(abs(decoded_ms(path) - duration) < 100, "the whole of it")
+
+    shutil.copy(path, os.path.dirname(path) + "/From outside.m4a")
+    place.wait_for("the foreign file", lambda: len(recordings(place)) == 2, 2)
+    time.sleep(2)  # until the list follows; that closes an open question
+    place.call("xdotool", "key", "Delete")
+    time.sleep(1)
+    place.call("xdotool", "key", "Tab", "Return")  # from cancel to delete
+    place.wait_for("the end of the file", lambda: not os.path.exists(path))
+    place.wait_for("the row that is left", lambda: len(recordings(place)) == 1)
+    check(trash(place) == ["Harbour.m4a"], "it lies in the trash")
 
 
 def request_returns_a_path(place):
