@@ -229,6 +229,34 @@ TEST_F(BookmarksScreenTest, FollowsThePanelAndTheDatabase)
     EXPECT_FALSE(isOnTop());
 }
 
+TEST_F(BookmarksScreenTest, AddingABookmarkLeavesTheListInPlace)
+{
+    for (unsigned int second = 10; second < 40; ++second)
+        media_bookmark_insert_to_db(_mediaId.c_str(), second, "x");
+    Evas_Object* panel = elm_object_part_content_get(_view, "elm.swallow.controller");
+    const auto add = [&](unsigned int position) {
+        _screen.model.setCurrentPlayPosition(position);
+        _screen.announce();
+        support::settle(_screen.window);
+        support::click(elm_object_part_content_get(panel, "bookmark_btn"));
+        support::settle(_screen.window);
+    };
+    const auto top = [this] {
+        int x = 0;
+        int y = 0;
+        int offset = 0;
+        evas_object_geometry_get(_list, &x, &y, nullptr, nullptr);
+        return elm_genlist_item_index_get(elm_genlist_at_xy_item_get(_list, x + 50, y + 1, &offset));
+    };
+    add(100000);
+    ASSERT_EQ(34U, elm_genlist_items_count(_list));
+    elm_genlist_item_show(row(12), ELM_GENLIST_ITEM_SCROLLTO_TOP);
+    support::settle(_screen.window);
+    ASSERT_EQ(13, top());
+    add(200000);
+    EXPECT_EQ(13, top());
+}
+
 TEST_F(BookmarksScreenTest, AnotherFileOrTrimmingEndsIt)
 {
     Evas_Object* panel = elm_object_part_content_get(_view, "elm.swallow.controller");

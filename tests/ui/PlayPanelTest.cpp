@@ -329,6 +329,15 @@ TEST_F(PlayPanelTest, TrimNeedsALongEnoughRecordingOfItsKind)
     EXPECT_EQ(Events{Panel::TRIM_REQUESTED}, _screen.events);
 }
 
+TEST_F(PlayPanelTest, TrimIsOfferedOnlyByModelsThatCan)
+{
+    ::setenv("MEWLO_MODEL", "QX-A110H", 1);
+    open(MINUTE, State::PLAY_STATE_PAUSED);
+    EXPECT_EQ(nullptr, _screen.content("trim_btn"));
+    EXPECT_NE(nullptr, _screen.content("bookmark_btn"));
+    ::unsetenv("MEWLO_MODEL");
+}
+
 TEST_F(PlayPanelTest, WorkingForAnotherApplicationItMarksNothing)
 {
     _screen.model.setRequestMode(true);

@@ -57,11 +57,19 @@ void MwBookmarksContentViewController::_loadListItems()
     }
 }
 
+// The row on top stays there.
 void MwBookmarksContentViewController::_reloadList()
 {
+    Eina_Rectangle area;
+    evas_object_geometry_get(_genlist, &area.x, &area.y, &area.w, &area.h);
+    Elm_Object_Item* top = elm_genlist_at_xy_item_get(_genlist, area.x + area.w / 2, area.y + 1, nullptr);
+    const int index = top ? elm_genlist_item_index_get(top) : 1;
     _selectAllItem = nullptr;
     elm_genlist_clear(_genlist);
     _loadListItems();
+    if (index > 1)
+        elm_genlist_item_show(
+            elm_genlist_nth_item_get(_genlist, static_cast<unsigned int>(index - 1)), ELM_GENLIST_ITEM_SCROLLTO_TOP);
     _updateMoreButton();
 }
 

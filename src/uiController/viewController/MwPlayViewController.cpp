@@ -69,13 +69,17 @@ void MwPlayViewController::onDestroy()
 {
     _stopListening();
     _eventSignal.removeAll();
-    _stopPlayerTimer();
-    for (const WTimer::Weak& timer : {_rewind.timer, _fastForward.timer, _sliderJob})
-        WTimer::destroy(timer);
+    _stopTimers();
     _removeBookmarkWidget();
 }
 
-// On TERMINATE at the latest: afterwards the signals are gone, while the panel waits for its window.
+void MwPlayViewController::_stopTimers()
+{
+    for (const WTimer::Weak& timer : {_playerTimer, _rewind.timer, _fastForward.timer, _sliderJob})
+        WTimer::destroy(timer);
+}
+
+// On TERMINATE at the latest: afterwards signals, controller and model are gone, while the panel waits for its window.
 void MwPlayViewController::_stopListening()
 {
     if (MwSignalMgr* signals = MwSignalMgr::existing(); signals)
@@ -93,6 +97,7 @@ void MwPlayViewController::_lifeCycleChanged(MwSignalMgr::LifeCycle lifeCycle)
         return _stopPlayerTimer();
     case MwSignalMgr::TERMINATE:
         MW_LOGW("not used life cycle signal!");
+        _stopTimers();
         return _stopListening();
     }
     MW_LOGW("not used life cycle signal!");

@@ -85,6 +85,7 @@ private:
     void _update();
     void _startPlayerTimer();
     void _stopPlayerTimer();
+    void _stopTimers();
     [[nodiscard]] bool _isPlaying() const;
     // Answers whether the command succeeded and the panel is still there.
     bool _send(MwAppController::Command command, const char* failure);
