@@ -1,11 +1,8 @@
-// The player panel: its slider, the buttons that seek while they are held, and seeking by keys.
+// The player panel: buttons that seek while they are held, and seeking by keys.
 #include "MwPlayViewController.h"
 
 #include <Elementary.h>
 
-#include <cmath>
-
-#include <panekit/WAccessibility.h>
 #include <uxt_theme.h>
 
 #include "MwModel.h"
@@ -16,10 +13,6 @@ using panekit::WTimer;
 
 namespace {
 
-constexpr auto SLIDER_PART = "slider";
-constexpr auto SLIDER_STYLE = "mewlo/player";
-constexpr auto POSITION_PART = "slider_text_playing";
-constexpr auto TOTAL_PART = "slider_text_total";
 constexpr auto ICON_PART = "elm.icon.normal";
 constexpr auto COLOR = "AO024";
 constexpr auto PRESSED_COLOR = "AO024P";
@@ -27,21 +20,6 @@ constexpr double FIRST_INTERVAL = 0.3; // seconds
 constexpr double NEXT_INTERVAL = 0.5;
 constexpr unsigned int STEP_GROWTH = 3000; // milliseconds
 constexpr double CLICK_AFTER_RELEASE = 0.1; // seconds
-
-// Texts change once a second; the panel looks fifty times.
-void showText(Evas_Object* view, const char* part, const std::string& text)
-{
-    const char* shown = elm_object_part_text_get(view, part);
-    if (!shown || text != shown)
-        elm_object_part_text_set(view, part, text.c_str());
-}
-
-bool movesByAPixel(Evas_Object* slider, double value)
-{
-    int width = 0;
-    evas_object_geometry_get(slider, nullptr, nullptr, &width, nullptr);
-    return std::abs(value - elm_slider_value_get(slider)) * width >= 1.0;
-}
 
 void tint(Evas_Object* view, const char* part, const char* color)
 {
@@ -57,89 +35,6 @@ bool contains(Evas_Object* object, const Evas_Coord_Point& point)
     return eina_rectangle_coords_inside(&area, point.x, point.y);
 }
 
-}
-
-void MwPlayViewController::_refreshSlider(Draw draw)
-{
-    if (!elm_object_part_content_get(getEvasObject(), SLIDER_PART))
-        _createSlider();
-    if (_isSliding)
-        return;
-    Evas_Object* slider = elm_object_part_content_get(getEvasObject(), SLIDER_PART);
-    // Its own keys and the wheel move as far as the keys of the list.
-    if (draw == Draw::Everything)
-        elm_slider_step_set(slider, mwPlayRatio(KEY_STEP, _duration));
-    const double value = mwPlayRatio(_model->getCurrentPlayPosition(), _duration);
-    if (draw == Draw::Everything || movesByAPixel(slider, value))
-        elm_slider_value_set(slider, value);
-}
-
-void MwPlayViewController::_refreshTimes()
-{
-    showText(getEvasObject(), TOTAL_PART, mwPlayTotalText(_duration));
-    if (!_isSliding)
-        _refreshPosition();
-}
-
-void MwPlayViewController::_refreshPosition()
-{
-    showText(getEvasObject(), POSITION_PART, mwPlayPositionText(_model->getCurrentPlayPosition(), _duration));
-}
-
-void MwPlayViewController::_createSlider()
-{
-    Evas_Object* slider = elm_slider_add(getEvasObject());
-    elm_object_style_set(slider, SLIDER_STYLE);
-    evas_object_size_hint_weight_set(slider, EVAS_HINT_EXPAND, 0.0);
-    evas_object_size_hint_align_set(slider, EVAS_HINT_FILL, 0.5);
-    elm_slider_min_max_set(slider, 0.0, 1.0);
-    panekit::setAccessibleName(slider, "IDS_MW_BODY_POSITION");
-    elm_object_focus_move_policy_set(slider, ELM_FOCUS_MOVE_POLICY_KEY_ONLY);
-    using Self = MwPlayViewController;
-    evas_object_smart_callback_add(slider, "changed", _smartCb<&Self::_sliderChanged>, this);
-    evas_object_event_callback_add(slider, EVAS_CALLBACK_MOUSE_DOWN, _eventCb<&Self::_sliderPressed>, this);
-    evas_object_event_callback_add(slider, EVAS_CALLBACK_MOUSE_UP, _eventCb<&Self::_sliderReleased>, this);
-    elm_object_part_content_set(getEvasObject(), SLIDER_PART, slider);
-    evas_object_show(slider);
-}
-
-void MwPlayViewController::_takeSliderPosition()
-{
-    const Evas_Object* slider = elm_object_part_content_get(getEvasObject(), SLIDER_PART);
-    _model->setCurrentPlayPosition(static_cast<unsigned int>(elm_slider_value_get(slider) * _duration));
-}
-
-// A tap on the line moves the knob before it is reported as pressed. What is still not held a moment later was moved by
-// a key or the wheel, and nobody will let it go.
-void MwPlayViewController::_sliderChanged()
-{
-    _takeSliderPosition();
-    _refreshPosition();
-    if (_isSliding || !_sliderJob.expired())
-        return;
-    const unsigned int position = _model->getCurrentPlayPosition();
-    _sliderJob = WTimer::addJob([this, position](void*) {
-        if (!_isSliding)
-            _seekTo(position);
-    });
-}
-
-void MwPlayViewController::_sliderPressed()
-{
-    _isSliding = true;
-    _stopPlayerTimer();
-    _refreshPosition();
-}
-
-void MwPlayViewController::_sliderReleased()
-{
-    if (!std::exchange(_isSliding, false))
-        return;
-    _takeSliderPosition();
-    const std::weak_ptr<void> panel = _token;
-    (void)_send(MwAppController::SET_PLAYER_POSITION, "set play position failed!");
-    if (!panel.expired())
-        _update();
 }
 
 // While nothing is loaded into the player, the position waits for the play button.

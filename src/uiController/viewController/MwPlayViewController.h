@@ -18,8 +18,8 @@ class MwModel;
 // The player panel docked below a list: slider with times, play or pause, previous and next (held: seeking), bookmark
 // markers, the bookmark and trim buttons. Drives nothing itself: every action is a command to the controller, and every
 // report of the controller redraws the panel from the model. Its sources are split by concern:
-// MwPlayViewController.cpp (life and refresh), MwPlayButtons.cpp, MwPlaySeeking.cpp (slider, held buttons, keys),
-// MwPlayBookmarks.cpp. Model and controller are borrowed. Main loop only.
+// MwPlayViewController.cpp (life and refresh), MwPlayButtons.cpp, MwPlaySlider.cpp, MwPlaySeeking.cpp (held buttons,
+// keys), MwPlayBookmarks.cpp. Model and controller are borrowed. Main loop only.
 class MwPlayViewController : public panekit::WViewController {
 public:
     enum eventType : int { BOOKMARK_ADDED, FILE_CHANGED, TRIM_REQUESTED };
