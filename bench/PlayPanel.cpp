@@ -1,6 +1,7 @@
 // Prints what the player panel costs, in percent of a core: "paused PERCENT" and "playing PERCENT", the latter with the
 // position of a short recording moving as fast as the player reports it. Drawn by the toolkit's buffer engine; nothing
 // is played.
+#include <Efreet.h>
 #include <Elementary.h>
 #include <gst/gst.h>
 #include <media_content.h>
@@ -103,6 +104,8 @@ int main(int argc, char** argv)
 {
     ::setenv("ELM_ENGINE", "buffer", 1);
     gst_init(&argc, &argv);
+    efreet_cache_disable();
+    ecore_app_no_system_modules();
     elm_init(argc, argv);
     bench::Engines engines;
     const std::string file = makeRecording(engines.model.getRecordingsDirectory());
