@@ -15,6 +15,7 @@ int state(const Arguments& arguments);
 int preference(const Arguments& arguments);
 int locks(const Arguments& arguments);
 int usage(const Arguments& arguments);
+int privateStorage(const Arguments& arguments);
 int doctor(const Arguments& arguments);
 
 constexpr int OK = 0, FAILED = 1, WRONG_USE = 2;

@@ -13,7 +13,7 @@ struct Command {
     int (*run)(const tool::Arguments& arguments);
 };
 
-constexpr std::array<Command, 8> COMMANDS = {{
+constexpr std::array<Command, 9> COMMANDS = {{
     {"record", "SECONDS [--format m4a|amr]", "record without a window and print the path", tool::record},
     {"request", "[--mime TYPE] [--max-kb N]", "let the user record once in a window of its own and print the path",
         tool::request},
@@ -21,6 +21,8 @@ constexpr std::array<Command, 8> COMMANDS = {{
     {"state", "get KEY | set KEY VALUE | pin KEY VALUE | unpin KEY | watch [KEY...]",
         "read, write and follow state keys", tool::state},
     {"pref", "get KEY | set KEY VALUE", "read and write preferences", tool::preference},
+    {"private", "setup | forget", "offer the private storage in the recorder, or no longer; its recordings stay",
+        tool::privateStorage},
     {"locks", "", "print the power locks that are held", tool::locks},
     {"usage", "", "print the usage log", tool::usage},
     {"doctor", "", "print which services were found and what stands in for the others", tool::doctor},

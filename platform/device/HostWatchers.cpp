@@ -10,6 +10,7 @@
 #include "host/PulseWatch.h"
 #include "host/ScreenSaverWatch.h"
 #include "host/TimeWatch.h"
+#include "preference.h"
 #include "state/Keys.h"
 #include "state/Log.h"
 #include "state/Trees.h"
@@ -41,6 +42,14 @@ namespace {
             sink(VCONFKEY_SYSMAN_EARJACK, now.isHeadsetPlugged ? "1" : "0");
     }
 
+    // State keys end with the session; this fact does not.
+    void tellPrivateStorage()
+    {
+        int method = 0;
+        if (preference_get_int(PREFERENCE_PRIVATE_METHOD, &method) == 0)
+            sink(KEY_PRIVATE_METHOD, std::to_string(method));
+    }
+
     class HostWatchers {
     public:
         HostWatchers()
@@ -54,6 +63,8 @@ namespace {
             startIfWanted("calls", _calls);
             startIfWanted("locale", _locale);
             startIfWanted("display", _display);
+            if (isWanted("private"))
+                tellPrivateStorage();
             if (isWanted("earjack"))
                 _earjackListener = host::PulseWatch::instance().addListener(reportEarjack);
             _recorderWatch = stateTree().watch(KEY_RECORDER_STATE, [this](const std::string&) { _updateBusy(); });

@@ -4,7 +4,7 @@
 namespace platform {
 
 // MEWLO_HOST=none|all|<name>,... chooses; all by default. Names: lock, battery, mounts, portal, time, calls, locale,
-// display, earjack.
+// display, earjack, private.
 void startHostWatchers();
 void stopHostWatchers();
 

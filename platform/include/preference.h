@@ -10,6 +10,9 @@ enum preference_error_e {
 };
 typedef void (*preference_changed_cb)(const char* key, void* user_data);
 
+// Whether, and how, the user has set up the private storage: 0 not at all. Told to every session as a state key.
+#define PREFERENCE_PRIVATE_METHOD "PrivateStorageMethod"
+
 extern "C" {
 int preference_get_int(const char* key, int* value);
 int preference_set_int(const char* key, int value);

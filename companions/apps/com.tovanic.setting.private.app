@@ -1,0 +1,4 @@
+[Application]
+Name=Private storage of the voice recorder
+Exec=mewlo-private-storage
+Reply=protocol
