@@ -6,6 +6,7 @@
 
 #include "support/PrivateBus.h"
 #include "support/RunUntil.h"
+#include "support/XServer.h"
 
 #include <gtest/gtest.h>
 
@@ -23,22 +24,14 @@ class X11Test : public testing::Test {
 protected:
     void SetUp() override
     {
-        const std::string number = _directory.file("number");
-        _server = std::make_unique<Program>(
-            std::vector<std::string>{"Xvfb", "-displayfd", "1", "-screen", "0", "640x480x24"}, number);
-        const auto isReady = [&] { return support::readFile(number).ends_with('\n') || !_server->isRunning(); };
-        if (!runUntil(isReady, 30) || !_server->isRunning())
+        if (!_server.isUp())
             GTEST_SKIP() << "Xvfb is missing";
-        std::string name = ":" + support::readFile(number);
-        name.pop_back();
-        ::setenv("DISPLAY", name.c_str(), 1);
-        ASSERT_EQ(1, ecore_x_init(name.c_str()));
+        ASSERT_EQ(1, ecore_x_init(_server.name().c_str()));
     }
     void TearDown() override
     {
         if (ecore_x_display_get() != nullptr)
             ecore_x_shutdown();
-        ::unsetenv("DISPLAY");
     }
     static bool xdotool(const std::vector<std::string>& words)
     {
@@ -48,8 +41,7 @@ protected:
         return runUntil([&] { return !program.isRunning(); }, 30);
     }
 
-    support::TempDir _directory;
-    std::unique_ptr<Program> _server;
+    support::XServer _server;
 };
 
 TEST_F(X11Test, MediaKeysArriveOnceWithoutFocusWhileReserved)

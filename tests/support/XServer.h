@@ -1,0 +1,40 @@
+#pragma once
+
+#include "support/PrivateBus.h"
+#include "support/RunUntil.h"
+
+#include <cstdlib>
+#include <memory>
+#include <string>
+
+namespace support {
+
+// A virtual X server of its own; while it lives, DISPLAY names it.
+class XServer {
+public:
+    XServer()
+    {
+        const std::string number = _directory.file("number");
+        _server = std::make_unique<Program>(
+            std::vector<std::string>{"Xvfb", "-displayfd", "1", "-screen", "0", "640x480x24"}, number);
+        runUntil([&] { return readFile(number).ends_with('\n') || !_server->isRunning(); }, 30);
+        _name = ":" + readFile(number);
+        _name.pop_back();
+        if (isUp())
+            ::setenv("DISPLAY", _name.c_str(), 1);
+    }
+    ~XServer() { ::unsetenv("DISPLAY"); }
+    XServer(const XServer&) = delete;
+    XServer& operator=(const XServer&) = delete;
+
+    // False where Xvfb is missing.
+    [[nodiscard]] bool isUp() const { return _server->isRunning() && _name.size() > 1; }
+    [[nodiscard]] const std::string& name() const { return _name; }
+
+private:
+    TempDir _directory;
+    std::unique_ptr<Program> _server;
+    std::string _name;
+};
+
+}
