@@ -264,6 +264,10 @@ TEST_F(PlayPanelTest, KeysSeekWithinTheRecording)
     support::key(_screen.window, "Right");
     ASSERT_TRUE(waitForSeeks(4)) << "nobody lets go of a knob that a key moved";
     EXPECT_NEAR(5000, _screen.soughtTo.back(), 1);
+    for (int i = 0; i < 50; ++i)
+        support::key(_screen.window, i % 5 == 4 ? "Left" : "Right");
+    support::runFor(0.05);
+    EXPECT_NEAR(15000, _screen.soughtTo.back(), 1) << "a burst ends where its last key asked";
     _screen.load(FILE_NAME, State::PLAY_STATE_NONE, 12000);
     _screen.takeCommands();
     _screen.panel->seekBy(1000);

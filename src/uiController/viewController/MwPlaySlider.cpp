@@ -93,7 +93,8 @@ void MwPlayViewController::_sliderChanged()
 {
     _takeSliderPosition();
     _refreshPosition();
-    if (_isSliding || !_sliderJob.expired())
+    WTimer::destroy(_sliderJob);
+    if (_isSliding)
         return;
     const unsigned int position = _model->getCurrentPlayPosition();
     _sliderJob = WTimer::addJob([this, position](void*) {
