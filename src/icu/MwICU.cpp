@@ -38,7 +38,7 @@ std::string readRegion()
 {
     char* text = vconf_get_str(REGION_KEY);
     if (text == nullptr)
-        MW_LOGE("Cannot get region format.");
+        MW_LOGW("Cannot get region format.");
     const std::string region = withoutTail(mwAdopt(text));
     return region.empty() ? FALLBACK_REGION : region;
 }
