@@ -13,6 +13,7 @@
 #include "MwLog.h"
 #include "MwModel.h"
 #include "MwRecordingNotes.h"
+#include "MwStagedFile.h"
 #include "MwStorageRoots.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
@@ -163,7 +164,9 @@ std::vector<std::string> MwRecordingRescue::run(MwModel& model)
         if (const int found = recorder_rescue_leftovers(temporary.c_str(), leftoverCb, &work); found < 0)
             MW_LOGE("recorder_rescue_leftovers failed : [%d]!!!", found);
         catalogueWaitingNotes(directoryOf(root));
+        MwStagedFile::sweep(directoryOf(root));
     }
+    MwStagedFile::sweep(directoryOf(mwPrivateRoot()));
     MW_CALL(media_content_scan_all);
     if (!work.rescued.empty())
         notification_status_message_post(tellRescued(work.rescued).c_str());

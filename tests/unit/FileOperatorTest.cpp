@@ -254,6 +254,48 @@ TEST_F(FileOperatorTest, HostileNamesTouchNothingElse)
     EXPECT_EQ((Files{{"memo.m4a", "other"}}), filesIn(support::recordingsDirectory()));
 }
 
+TEST_F(FileOperatorTest, KilledAtAnyTimeEveryFileIsWholeAndKeepsItsBookmark)
+{
+    std::map<std::string, std::string> ids;
+    for (int i = 0; i < 100; ++i) {
+        const std::string name = std::to_string(i) + ".m4a";
+        ids[name] = support::addRecording(name, name);
+        media_bookmark_insert_to_db(ids[name].c_str(), 1, "Bookmark 1");
+    }
+    media_content_disconnect(); // a connection does not survive a fork
+    int killed = 0;
+    for (int round = 0; round < 10; ++round) {
+        const pid_t child = ::fork();
+        if (child == 0) {
+            media_content_connect();
+            const std::atomic<bool> cancelled = false;
+            MwFileMover mover(
+                privateDirectory(), 0, cancelled, [](const std::string&) { return MwClashAction::REPLACE; },
+                [](uint64_t) {});
+            std::string destination;
+            for (const auto& [name, id] : ids)
+                (void)mover.move(recordingPath(name), destination);
+            ::_exit(0);
+        }
+        ::usleep(static_cast<useconds_t>(4000 + 1000 * round)); // somewhere in the middle
+        ::kill(child, SIGKILL);
+        int status = 0;
+        ::waitpid(child, &status, 0);
+        killed += WIFSIGNALED(status) ? 1 : 0;
+    }
+    EXPECT_GT(killed, 3);
+    media_content_connect();
+    MwStagedFile::sweep(privateDirectory());
+    media_content_scan_all();
+    Files all = filesIn(privateDirectory());
+    all.merge(filesIn(support::recordingsDirectory()));
+    EXPECT_EQ(ids.size(), all.size());
+    for (const auto& [name, id] : ids) {
+        EXPECT_EQ(name, all[name]);
+        EXPECT_EQ(1, bookmarksOf(id)) << name;
+    }
+}
+
 // Moves between file systems: from the temporary directory to one in memory.
 class TwoFileSystemsTest : public FileOperatorTest {
 protected:
