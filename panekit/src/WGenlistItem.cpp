@@ -62,33 +62,40 @@ WGenlistItem::~WGenlistItem() = default;
 
 Evas_Object* WGenlistItem::append(Evas_Object* genlist, Evas_Object* after)
 {
-    if (!genlist || _item)
+    const Elm_Genlist_Item_Class* itemClass = _prepare(genlist);
+    if (!itemClass)
         return nullptr;
-    const Elm_Genlist_Item_Class* itemClass = Callbacks::itemClass(getStyle());
     if (after)
-        return _adopt(genlist,
-            elm_genlist_item_insert_after(
-                genlist, itemClass, this, nullptr, after, ELM_GENLIST_ITEM_NONE, Callbacks::selected, this));
-    return _adopt(genlist,
+        return _adopt(elm_genlist_item_insert_after(
+            genlist, itemClass, this, nullptr, after, ELM_GENLIST_ITEM_NONE, Callbacks::selected, this));
+    return _adopt(
         elm_genlist_item_append(genlist, itemClass, this, nullptr, ELM_GENLIST_ITEM_NONE, Callbacks::selected, this));
 }
 
 Evas_Object* WGenlistItem::prepend(Evas_Object* genlist)
 {
-    if (!genlist || _item)
+    const Elm_Genlist_Item_Class* itemClass = _prepare(genlist);
+    if (!itemClass)
         return nullptr;
-    return _adopt(genlist,
-        elm_genlist_item_prepend(genlist, Callbacks::itemClass(getStyle()), this, nullptr, ELM_GENLIST_ITEM_NONE,
-            Callbacks::selected, this));
+    return _adopt(
+        elm_genlist_item_prepend(genlist, itemClass, this, nullptr, ELM_GENLIST_ITEM_NONE, Callbacks::selected, this));
 }
 
-Evas_Object* WGenlistItem::_adopt(Evas_Object* genlist, Evas_Object* item)
+// The toolkit may ask for the texts of a row before it answers its item.
+const Elm_Genlist_Item_Class* WGenlistItem::_prepare(Evas_Object* genlist)
 {
-    if (!item)
+    if (!genlist || _item)
         return nullptr;
-    _item = item;
     _genlist = genlist;
     Callbacks::watchRealized(genlist);
+    return Callbacks::itemClass(getStyle());
+}
+
+Evas_Object* WGenlistItem::_adopt(Evas_Object* item)
+{
+    _item = item;
+    if (!item)
+        _genlist = nullptr;
     return item;
 }
 

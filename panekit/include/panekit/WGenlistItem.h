@@ -4,6 +4,7 @@
 
 typedef struct _Eo_Opaque Eo;
 typedef Eo Evas_Object;
+struct _Elm_Gen_Item_Class;
 
 namespace panekit {
 
@@ -35,7 +36,8 @@ protected:
 private:
     struct Callbacks;
     friend struct Callbacks;
-    Evas_Object* _adopt(Evas_Object* genlist, Evas_Object* item);
+    const _Elm_Gen_Item_Class* _prepare(Evas_Object* genlist);
+    Evas_Object* _adopt(Evas_Object* item);
     Evas_Object* _item = nullptr;
     Evas_Object* _genlist = nullptr;
 };
