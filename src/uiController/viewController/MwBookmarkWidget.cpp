@@ -92,7 +92,8 @@ MwBookmarkWidget::Point MwBookmarkWidget::place(
     const Eina_Rectangle& area, int size, unsigned int second, unsigned int duration)
 {
     const double ratio = duration > 0 ? second * 1000.0 / duration : 0.0;
-    return {static_cast<int>((area.x - size / 2) + area.w * ratio), area.y + (area.h + size) / 2 - size};
+    const int first = area.x - size / 2;
+    return {static_cast<int>(first + area.w * ratio), area.y + (area.h + size) / 2 - size};
 }
 
 void MwBookmarkWidget::_addCb(Evas_Object* widget) { evas_object_smart_data_set(widget, new Data); }

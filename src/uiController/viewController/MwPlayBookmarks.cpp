@@ -30,6 +30,7 @@ void readingFailed(const char* call, int code) { MW_LOGE("%s failed : [%d]!!!", 
 std::vector<std::string> namesOf(const std::vector<MwSavedBookmark>& bookmarks)
 {
     std::vector<std::string> names;
+    names.reserve(bookmarks.size());
     for (const MwSavedBookmark& bookmark : bookmarks)
         names.push_back(bookmark.name);
     return names;
