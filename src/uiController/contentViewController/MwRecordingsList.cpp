@@ -32,7 +32,6 @@ constexpr auto RECORD_PART = "record_button";
 constexpr auto RADIO_KEY = "radio";
 constexpr auto ICU_KEY = "icu";
 constexpr int NO_CHOICE_VALUE = -1;
-constexpr int KEPT_POSITION = 120; // design units below the list's upper edge
 
 std::string edjePath(const char* file)
 {
@@ -82,6 +81,7 @@ void MwRecordingsContentViewController::_update()
     if (std::exchange(_reloadNeeded, false))
         _loadContents();
     if (_genlist) {
+        const MwRecordingsRows::Place place = _rows->getPlace();
         _rows->show(mwRecordingsMode(_viewType).files);
         if (playsHere && getModel()->getCurrentPlayPath().empty()) {
             _removeSelectAllItem();
@@ -91,6 +91,7 @@ void MwRecordingsContentViewController::_update()
         } else if (_getListType() == MwRecordingsListItem::MULTIPLE_CHOICE) {
             _loadSelectAllItem();
         }
+        _rows->restore(place);
         _refreshRealizedItems();
     }
     _loadTitle(_checkedCount());
@@ -199,20 +200,7 @@ Evas_Object* MwRecordingsContentViewController::_radioGroup() const
     return group;
 }
 
-// The rows that the user looks at stay in view.
-void MwRecordingsContentViewController::_loadSelectAllItem()
-{
-    if (_rows->getSelectAll())
-        return;
-    int x = 0;
-    int y = 0;
-    evas_object_geometry_get(_genlist, &x, &y, nullptr, nullptr);
-    int where = 0;
-    Elm_Object_Item* kept = elm_genlist_at_xy_item_get(_genlist, x + 1, y + ELM_SCALE_SIZE(KEPT_POSITION), &where);
-    _rows->addSelectAll();
-    if (kept)
-        elm_genlist_item_show(kept, ELM_GENLIST_ITEM_SCROLLTO_IN);
-}
+void MwRecordingsContentViewController::_loadSelectAllItem() { _rows->addSelectAll(); }
 
 void MwRecordingsContentViewController::_removeSelectAllItem() { _rows->removeSelectAll(); }
 

@@ -227,6 +227,13 @@ void MwRecordingsListItem::setChecked(bool checked)
         elm_layout_signal_emit(check, checked ? "elm,activate,check,on" : "elm,activate,check,off", "elm");
 }
 
+void MwRecordingsListItem::takeOver(const MwRecordingsListItem& former)
+{
+    _checked = former._checked;
+    _highlighted = former._highlighted;
+    _bookmarked = former._bookmarked;
+}
+
 void MwRecordingsListItem::refresh()
 {
     elm_genlist_item_fields_update(getItem(), "elm.text.*", ELM_GENLIST_ITEM_FIELD_TEXT);

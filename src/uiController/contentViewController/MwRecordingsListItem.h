@@ -39,6 +39,8 @@ public:
     [[nodiscard]] bool isChecked() const { return _checked; }
     // Also shows it, when the row is on screen.
     void setChecked(bool checked);
+    // Check and mark of a row whose place this one takes.
+    void takeOver(const MwRecordingsListItem& former);
     // The mark of the row that the keyboard acts on.
     void setHighlighted(bool highlighted);
     [[nodiscard]] bool isHighlighted() const { return _highlighted; }

@@ -11,12 +11,39 @@
 #include "MwModel.h"
 #include "MwStorageRoots.h"
 
+using panekit::WTimer;
+
 namespace {
 
 // Enough for the tallest window; the rest comes while the first rows can be seen and used already.
 constexpr size_t FIRST_ROWS = 64;
+constexpr double FIRST_FRAME_SECONDS = 0.03;
 constexpr double SLICE_SECONDS = 0.004;
+constexpr int SELECT_ALL_HEIGHT = 112; // design units, as in its layout
 constexpr size_t ROWS_BETWEEN_LOOKS_AT_THE_CLOCK = 32;
+
+struct Box {
+    int y = 0;
+    int height = 0;
+};
+
+Box boxOf(Evas_Object* object)
+{
+    Box box;
+    evas_object_geometry_get(object, nullptr, &box.y, nullptr, &box.height);
+    return box;
+}
+
+// Of a row on screen.
+Box boxOfRow(Elm_Object_Item* item)
+{
+    Evas_Object* rectangle = elm_object_item_track(item);
+    if (!rectangle)
+        return {};
+    const Box box = boxOf(rectangle);
+    elm_object_item_untrack(item);
+    return box;
+}
 
 }
 
@@ -27,7 +54,7 @@ MwRecordingsRows::MwRecordingsRows(Evas_Object* genlist, const Item::Context& co
 {
 }
 
-MwRecordingsRows::~MwRecordingsRows() { panekit::WTimer::destroy(_loader); }
+MwRecordingsRows::~MwRecordingsRows() { WTimer::destroy(_loader); }
 
 const std::vector<MwFileInfo>& MwRecordingsRows::_catalogue() const { return _context.model->getRecordedFileList(); }
 
@@ -58,14 +85,15 @@ void MwRecordingsRows::show(Files files)
     const unsigned int revision = _context.model->getCatalogueRevision();
     if (files == _files && revision == _revision)
         return;
-    const Place place = _place();
     _files = files;
     _revision = revision;
     _removeVanished();
     _followCatalogue();
-    _restore(place);
     if (_loaded < _catalogue().size() && _loader.expired())
-        _loader = panekit::WTimer::addIdler([this](void*) { return _loadSlice(SLICE_SECONDS); });
+        _loader = WTimer::addTimer(FIRST_FRAME_SECONDS, [this](void*) {
+            _loader = WTimer::addIdler([this](void*) { return _loadSlice(SLICE_SECONDS); });
+            return false;
+        });
 }
 
 void MwRecordingsRows::finish()
@@ -76,17 +104,34 @@ void MwRecordingsRows::finish()
 
 void MwRecordingsRows::_removeVanished()
 {
+    if (!_first())
+        return;
     std::unordered_set<std::string_view> kept;
     for (const MwFileInfo& info : _catalogue()) {
         if (_accepts(info))
             kept.insert(info.path);
     }
+    bool removed = false;
     for (Item* row = _first(); row;) {
         Item* next = _next(row);
-        if (!kept.contains(row->getPath()))
+        if (!kept.contains(row->getPath())) {
             elm_object_item_del(row->getItem());
+            removed = true;
+        }
         row = next;
     }
+    if (removed)
+        _closeGaps();
+}
+
+// Where rows went out of sight the list keeps their room until a row comes; so its last one comes again.
+void MwRecordingsRows::_closeGaps()
+{
+    Item* last = Item::from(elm_genlist_last_item_get(_genlist));
+    if (!last || last->isSelectAll())
+        return;
+    Item* above = Item::from(elm_genlist_item_prev_get(last->getItem()));
+    _insert(MwFileInfo(*last->getFileInfo()), above, last);
 }
 
 std::unordered_map<std::string, MwRecordingsListItem*> MwRecordingsRows::_rowsByPath() const
@@ -125,9 +170,10 @@ MwRecordingsListItem* MwRecordingsRows::_insert(const MwFileInfo& info, Item* ab
 {
     auto* row = new Item(_context, info, former ? former->getIndex() : ++_lastIndex);
     if (former) {
-        row->setChecked(former->isChecked());
+        row->takeOver(*former);
         elm_object_item_del(former->getItem());
     }
+    _moved = true;
     if (above)
         row->append(_genlist, above->getItem());
     else
@@ -155,12 +201,16 @@ void MwRecordingsRows::addSelectAll()
     if (getSelectAll())
         return;
     (new Item(_context))->prepend(_genlist);
+    _moved = true;
 }
 
 void MwRecordingsRows::removeSelectAll()
 {
-    if (const Item* row = getSelectAll(); row)
-        elm_object_item_del(row->getItem());
+    const Item* row = getSelectAll();
+    if (!row)
+        return;
+    elm_object_item_del(row->getItem());
+    _closeGaps();
 }
 
 void MwRecordingsRows::forEach(const std::function<bool(Item&)>& function)
@@ -297,6 +347,54 @@ void MwRecordingsRows::forEachRealized(const std::function<void(Item&)>& functio
     }
 }
 
-MwRecordingsRows::Place MwRecordingsRows::_place() const { return {}; }
+MwRecordingsRows::Place MwRecordingsRows::getPlace() const
+{
+    int scrolled = 0;
+    elm_scroller_region_get(_genlist, nullptr, &scrolled, nullptr, nullptr);
+    const Item* row = scrolled > 0 ? _onTop() : nullptr;
+    if (!row)
+        return {};
+    const Box box = boxOfRow(row->getItem());
+    Place place{{}, box.y - boxOf(_genlist).y, box.height};
+    if (row->isSelectAll()) {
+        place.top += box.height;
+        row = _next(row);
+        place.rowHeight = row ? boxOfRow(row->getItem()).height : 0;
+    }
+    for (; row && place.paths.size() < FIRST_ROWS; row = _next(row))
+        place.paths.push_back(row->getPath());
+    return place;
+}
 
-void MwRecordingsRows::_restore(const Place&) { }
+// Where a row begins within all rows; -1 for one that is not there.
+int MwRecordingsRows::_yOf(const std::string& path, int rowHeight) const
+{
+    int y = getSelectAll() ? ELM_SCALE_SIZE(SELECT_ALL_HEIGHT) : 0;
+    bool found = false;
+    forEachLoaded([&](const Item& row) {
+        found = row.getPath() == path;
+        y += found ? 0 : rowHeight;
+        return !found;
+    });
+    return found ? y : -1;
+}
+
+// The list itself keeps what is seen in its place, but its scroller goes on counting from where it was, and the next
+// scrolling would jump.
+void MwRecordingsRows::restore(const Place& place)
+{
+    if (!std::exchange(_moved, false))
+        return;
+    int y = 0;
+    for (size_t i = 0; i < place.paths.size(); ++i) {
+        const int top = _yOf(place.paths[i], place.rowHeight);
+        if (top < 0)
+            continue;
+        y = std::max(0, top - place.top - static_cast<int>(i) * place.rowHeight);
+        break;
+    }
+    int height = 0;
+    evas_object_geometry_get(_genlist, nullptr, nullptr, nullptr, &height);
+    evas_smart_objects_calculate(evas_object_evas_get(_genlist)); // with all rows there are now
+    elm_scroller_region_show(_genlist, 0, y, 1, height);
+}

@@ -21,6 +21,17 @@ public:
     MwRecordingsRows(const MwRecordingsRows&) = delete;
     MwRecordingsRows& operator=(const MwRecordingsRows&) = delete;
 
+    // What can be seen: rows from the top, with the pixels from the list's upper edge to their own. Empty while the
+    // list shows its beginning, which it then goes on doing.
+    struct Place {
+        std::vector<std::string> paths;
+        int top = 0;
+        int rowHeight = 0;
+    };
+    [[nodiscard]] Place getPlace() const;
+    // Scrolls so that the first of these rows that is left is where it was, if rows came or went.
+    void restore(const Place& place);
+
     // Shows these files of the catalogue; costs nothing when that is what is shown.
     void show(Files files);
     // Loads what is missing. Whatever needs all rows does it by itself.
@@ -51,10 +62,6 @@ public:
 
 private:
     using Item = MwRecordingsListItem;
-    struct Place {
-        std::string path; // of the row on top; empty while the list shows its beginning
-        int offset = 0; // pixels of it that have been scrolled out
-    };
 
     [[nodiscard]] bool _accepts(const MwFileInfo& info) const;
     [[nodiscard]] const std::vector<MwFileInfo>& _catalogue() const;
@@ -62,13 +69,13 @@ private:
     [[nodiscard]] static Item* _next(const Item* row);
     [[nodiscard]] std::unordered_map<std::string, Item*> _rowsByPath() const;
     void _removeVanished();
+    void _closeGaps();
     void _followCatalogue();
     Item* _insert(const MwFileInfo& info, Item* after, Item* former);
     bool _loadSlice(double seconds);
     [[nodiscard]] Item* _highlightStart() const;
     [[nodiscard]] Item* _onTop() const;
-    [[nodiscard]] Place _place() const;
-    void _restore(const Place& place);
+    [[nodiscard]] int _yOf(const std::string& path, int rowHeight) const;
 
     Evas_Object* _genlist;
     const Item::Context& _context;
@@ -77,5 +84,6 @@ private:
     unsigned int _revision = 0; // of the catalogue that is shown, 0 for none
     size_t _loaded = 0; // records of the catalogue that have been looked at
     int _lastIndex = 0;
+    bool _moved = false; // rows came since the place was restored
     panekit::WTimer::Weak _loader;
 };
