@@ -45,7 +45,7 @@ void MwPlayViewController::_refreshSlider(Draw draw)
         return;
     Evas_Object* slider = elm_object_part_content_get(getEvasObject(), SLIDER_PART);
     // Its own keys and the wheel move as far as the keys of the list.
-    if (draw == Draw::Everything)
+    if (draw == Draw::Everything && _duration > 0)
         elm_slider_step_set(slider, mwPlayRatio(KEY_STEP, _duration));
     const double value = mwPlayRatio(_model->getCurrentPlayPosition(), _duration);
     if (draw == Draw::Everything || movesByAPixel(slider, value))
