@@ -70,11 +70,13 @@ protected:
     void enterMode(int entry)
     {
         _screen.more();
-        support::runFor(0.3);
+        ASSERT_TRUE(support::runUntil([this] { return _top->hasAttachedPopup(); }));
+        support::runFor(0.3); // until it has the keyboard
         for (int i = 0; i < entry; ++i)
             support::key(_screen.window, "Tab");
         support::key(_screen.window, "Return");
-        support::runFor(0.4);
+        ASSERT_TRUE(support::runUntil([this] { return title() == "Select bookmarks"; }));
+        support::settle(_screen.window);
     }
     std::string title() const
     {
@@ -110,8 +112,9 @@ protected:
         evas_key_modifier_off(evas_object_evas_get(window), "Control");
         for (const char letter : name)
             support::key(window, std::string(1, letter).c_str(), std::string(1, letter).c_str());
+        fakes::desktop.lastMessage.clear();
         support::key(window, "Return");
-        support::runFor(0.1);
+        support::runUntil([this] { return !fakes::desktop.lastMessage.empty() || !renameWindow(); }, 1.0);
     }
     bool hasPanel() const { return elm_object_part_content_get(_view, "elm.swallow.controller") != nullptr; }
     bool isOnTop() const { return _screen.naviframe->getTop() == _top; }
@@ -259,11 +262,19 @@ TEST_F(BookmarksScreenTest, AddingABookmarkLeavesTheListInPlace)
 
 TEST_F(BookmarksScreenTest, AnotherFileOrTrimmingEndsIt)
 {
-    Evas_Object* panel = elm_object_part_content_get(_view, "elm.swallow.controller");
-    support::settle(_screen.window);
-    support::click(elm_object_part_content_get(panel, "trim_btn"));
-    EXPECT_TRUE(_screen.model.isTrimMode());
+    const auto press = [this](const char* part) {
+        Evas_Object* panel = elm_object_part_content_get(_view, "elm.swallow.controller");
+        support::settle(_screen.window);
+        support::click(elm_object_part_content_get(panel, part));
+        support::runFor(0.05);
+    };
+    press("ff_btn");
     EXPECT_FALSE(isOnTop());
+    _top = new MwBookmarksContentViewController(&_screen.model, _screen.controller(), _mediaId);
+    _view = _screen.push(_top);
+    press("trim_btn");
+    EXPECT_FALSE(isOnTop());
+    EXPECT_TRUE(_screen.model.isTrimMode());
 }
 
 }

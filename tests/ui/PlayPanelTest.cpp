@@ -122,18 +122,18 @@ TEST_F(PlayPanelTest, TimesHaveOneShape)
 TEST_F(PlayPanelTest, FollowsThePositionOnlyWhilePlayingInTheForeground)
 {
     open(4 * MINUTE, State::PLAY_STATE_PLAYING);
-    const auto shows = [this](unsigned int position) {
+    const auto shows = [this](unsigned int position, double limit = 3.0) {
         _screen.model.setCurrentPlayPosition(position);
-        return support::runUntil([&] { return std::abs(_screen.sliderValue() * 4 * MINUTE - position) < 1000; }, 0.3);
+        return support::runUntil([&] { return std::abs(_screen.sliderValue() * 4 * MINUTE - position) < 1000; }, limit);
     };
     EXPECT_TRUE(shows(60000));
     EXPECT_EQ("01:00", _screen.text("slider_text_playing"));
     MwSignalMgr::getInstance()->getLifeCycleSignal().emit(MwSignalMgr::PAUSE);
-    EXPECT_FALSE(shows(90000));
+    EXPECT_FALSE(shows(90000, 0.3));
     MwSignalMgr::getInstance()->getLifeCycleSignal().emit(MwSignalMgr::RESUME);
     EXPECT_TRUE(shows(120000));
     _screen.load(FILE_NAME, State::PLAY_STATE_PAUSED, 120000);
-    EXPECT_FALSE(shows(180000));
+    EXPECT_FALSE(shows(180000, 0.3));
     _screen.model.setCurrentPlayPath("");
     _screen.announce();
     EXPECT_EQ("02:00", _screen.text("slider_text_playing")) << "nothing is loaded: nothing is drawn";
@@ -157,12 +157,14 @@ TEST_F(PlayPanelTest, PlayButtonStartsPausesAndResumes)
 TEST_F(PlayPanelTest, HeldNextSeeksFurtherAndFurther)
 {
     open(MINUTE, State::PLAY_STATE_PAUSED);
-    const double start = ecore_time_get();
     hold("ff_btn");
+    const double start = ecore_time_get();
     ASSERT_TRUE(waitForSeeks(1));
-    EXPECT_NEAR(0.3, ecore_time_get() - start, 0.15);
+    const double first = ecore_time_get() - start;
+    EXPECT_GT(first, 0.2);
+    EXPECT_LT(first, 0.8);
     ASSERT_TRUE(waitForSeeks(2));
-    EXPECT_NEAR(0.8, ecore_time_get() - start, 0.2);
+    EXPECT_GT(ecore_time_get() - start - first, 0.4);
     letGo();
     EXPECT_EQ((std::vector<unsigned int>{3000, 9000}), _screen.soughtTo);
     EXPECT_NEAR(0.15, _screen.sliderValue(), 0.001);
