@@ -115,6 +115,7 @@ protected:
         fakes::desktop.lastMessage.clear();
         support::key(window, "Return");
         support::runUntil([this] { return !fakes::desktop.lastMessage.empty() || !renameWindow(); }, 1.0);
+        support::settle(_screen.window);
     }
     bool hasPanel() const { return elm_object_part_content_get(_view, "elm.swallow.controller") != nullptr; }
     bool isOnTop() const { return _screen.naviframe->getTop() == _top; }
