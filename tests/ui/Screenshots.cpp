@@ -9,6 +9,7 @@
 #include <storage.h>
 #include <vconf.h>
 
+#include "ListShots.h"
 #include "MwRenamePopupController.h"
 #include "MwSignalMgr.h"
 #include "PanelShots.h"
@@ -138,6 +139,7 @@ int main(int argc, char** argv)
                 continue;
             take(directory, shot, dark ? "-dark" : "-light", width, height);
         }
+        ui::takeListShots(directory, dark ? "-dark" : "-light", argc > 2 ? argv[2] : "", width, height);
         ui::takePanelShots(directory, dark ? "-dark" : "-light", argc > 2 ? argv[2] : "", width, height);
         takeRename(directory, dark ? "-dark" : "-light");
         if (argc == 2)
