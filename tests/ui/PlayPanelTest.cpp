@@ -275,6 +275,11 @@ TEST_F(PlayPanelTest, KeysSeekWithinTheRecording)
     _screen.panel->seekBy(1000);
     EXPECT_EQ(Commands{}, _screen.takeCommands()) << "waits for the play button";
     EXPECT_EQ("00:13", _screen.text("slider_text_playing"));
+    _screen.addRecording("b.m4a", 0);
+    _screen.load("b.m4a", State::PLAY_STATE_PAUSED, 8000);
+    _screen.panel->seekBy(5000);
+    EXPECT_EQ(8000U, _screen.model.getCurrentPlayPosition()) << "nobody knows how long it is";
+    EXPECT_TRUE(elm_object_disabled_get(_screen.content("slider")));
 }
 
 TEST_F(PlayPanelTest, BookmarksAreStoredAndMarked)

@@ -140,7 +140,6 @@ private:
     void _deleteHighlighted();
     void _renameHighlighted();
     void _tapHighlighted();
-    void _seek(int milliseconds);
     std::string _highlightedPath() const;
 
     // File operations (MwRecordingsFileOperations.cpp). At most one runs at a time; while it runs, a change of the

@@ -27,7 +27,6 @@ using panekit::WPopupController;
 
 namespace {
 
-constexpr int SEEK_STEP = 5000; // milliseconds
 constexpr int ALL_ROWS = 1 << 30;
 
 int bookmarkCount(const std::string& mediaId)
@@ -280,12 +279,9 @@ bool MwRecordingsContentViewController::_keyPressed(const std::string& key)
 
 bool MwRecordingsContentViewController::_listKeyPressed(const std::string& key)
 {
-    const bool loaded = !getModel()->getCurrentPlayPath().empty();
-    if (loaded && key == "space")
-        _toggleCurrent();
-    else if (loaded && (key == "Left" || key == "Right"))
-        _seek(key == "Left" ? -SEEK_STEP : SEEK_STEP);
-    else if (key == "space" || key == "Return" || key == "KP_Enter")
+    if (_playView && _playView->takeKey(key))
+        return true;
+    if (key == "space" || key == "Return" || key == "KP_Enter")
         _tapHighlighted();
     else if (const int rows = rowsOfKey(key, _rows->getPage()); rows != 0)
         _rows->moveHighlight(rows);
@@ -324,16 +320,4 @@ void MwRecordingsContentViewController::_renameHighlighted()
 {
     if (const std::string path = _highlightedPath(); !path.empty())
         _openRenamePopup(path);
-}
-
-void MwRecordingsContentViewController::_seek(int milliseconds)
-{
-    const long long position = static_cast<long long>(getModel()->getCurrentPlayPosition()) + milliseconds;
-    const auto end = static_cast<long long>(getModel()->getCurrentPlayDuration());
-    getModel()->setCurrentPlayPosition(static_cast<unsigned int>(std::clamp(position, 0LL, end)));
-    if (!getAppController()->dispatchCommand(MwAppController::SET_PLAYER_POSITION)) {
-        MW_LOGE("set play position failed!");
-        return;
-    }
-    getAppController()->getPlayerUpdatedSignal().emit();
 }

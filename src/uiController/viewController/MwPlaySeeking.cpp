@@ -52,7 +52,7 @@ void MwPlayViewController::_seekTo(unsigned int position)
 
 void MwPlayViewController::seekBy(int milliseconds)
 {
-    if (!_model->getCurrentPlayPath().empty() && !_isSliding)
+    if (!_model->getCurrentPlayPath().empty() && _duration > 0 && !_isSliding)
         _seekTo(mwSoughtPosition(_model->getCurrentPlayPosition(), milliseconds, _duration));
 }
 

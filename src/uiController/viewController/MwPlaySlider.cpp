@@ -44,12 +44,19 @@ void MwPlayViewController::_refreshSlider(Draw draw)
     if (_isSliding)
         return;
     Evas_Object* slider = elm_object_part_content_get(getEvasObject(), SLIDER_PART);
-    // Its own keys and the wheel move as far as the keys of the list.
-    if (draw == Draw::Everything && _duration > 0)
-        elm_slider_step_set(slider, mwPlayRatio(KEY_STEP, _duration));
+    if (draw == Draw::Everything)
+        _adaptSlider(slider);
     const double value = mwPlayRatio(_model->getCurrentPlayPosition(), _duration);
     if (draw == Draw::Everything || movesByAPixel(slider, value))
         elm_slider_value_set(slider, value);
+}
+
+// Its own keys and the wheel move as far as the keys of the list; nothing moves in a recording of unknown length.
+void MwPlayViewController::_adaptSlider(Evas_Object* slider) const
+{
+    elm_object_disabled_set(slider, _duration == 0);
+    if (_duration > 0)
+        elm_slider_step_set(slider, mwPlayRatio(KEY_STEP, _duration));
 }
 
 void MwPlayViewController::_refreshTimes()

@@ -110,6 +110,7 @@ private:
     void _refreshTimes();
     void _refreshPosition();
     void _createSlider();
+    void _adaptSlider(Evas_Object* slider) const;
     void _takeSliderPosition();
     void _sliderChanged();
     void _sliderPressed();
