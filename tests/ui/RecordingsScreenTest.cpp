@@ -3,6 +3,7 @@
 #include <Elementary.h>
 
 #include <media_content.h>
+#include <panekit/WLanguage.h>
 #include <panekit/WPopupController.h>
 #include <vconf.h>
 
@@ -136,6 +137,7 @@ TEST_F(RecordingsScreenTest, ATapPlaysPausesResumesAndSwitches)
     screen.open();
     screen.tap("A.m4a");
     EXPECT_TRUE(screen.hasPlayer());
+    EXPECT_TRUE(screen.model.isPlayViewShown());
     EXPECT_EQ(path, screen.model.getCurrentPlayPath());
     screen.tap("A.m4a");
     screen.tap("A.m4a");
@@ -149,7 +151,39 @@ TEST_F(RecordingsScreenTest, ATapPlaysPausesResumesAndSwitches)
     screen.back();
     EXPECT_EQ("", screen.model.getCurrentPlayPath());
     EXPECT_TRUE(screen.hasRecordButton());
+    EXPECT_FALSE(screen.model.isPlayViewShown());
     EXPECT_EQ("B", screen.text("B.m4a", NAME));
+}
+
+TEST_F(RecordingsScreenTest, TrimmingIsRefusedWithAMessage)
+{
+    ui::enterRecordings({"A.m4a"});
+    RecordingsScreen screen;
+    screen.open();
+    screen.tap("A.m4a");
+    screen.model.setTrimMode(true);
+    screen.playerChanged();
+    EXPECT_FALSE(screen.model.isTrimMode());
+    EXPECT_EQ("Trimming is not available in this version.", fakes::desktop.lastMessage);
+    EXPECT_TRUE(screen.hasPlayer());
+    EXPECT_FALSE(elm_object_disabled_get(screen.list()));
+}
+
+TEST_F(RecordingsScreenTest, TheTitleFollowsTheLanguageNumbersAlike)
+{
+    ui::enterRecordings({"A.m4a", "B.m4a"});
+    RecordingsScreen screen;
+    screen.open();
+    screen.chooseMenu("Delete");
+    screen.tap("A.m4a");
+    panekit::WLanguage::use("de");
+    support::settle(screen.window);
+    EXPECT_EQ("1 ausgewählt", screen.title());
+    screen.back();
+    EXPECT_EQ("Aufnahmen", screen.title());
+    panekit::WLanguage::use("en");
+    support::settle(screen.window);
+    EXPECT_EQ("Recordings", screen.title());
 }
 
 TEST_F(RecordingsScreenTest, ACommandThatFailsLeavesTheListAsItIs)

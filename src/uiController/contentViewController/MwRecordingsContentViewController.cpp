@@ -127,6 +127,8 @@ void MwRecordingsContentViewController::onDestroy()
     _stopListening();
     _cancelBringIn();
     _rows.reset();
+    if (std::exchange(_playView, nullptr))
+        _announcePlayViewClosed();
     _destroyShareRequest(true);
     _destroyPrivateModeRequest(true);
     if (_fileOperator)

@@ -90,6 +90,7 @@ private:
     void _createPlayViewController();
     void _createTrimViewController();
     void _destroyController();
+    void _announcePlayViewClosed();
     void _playViewEvent(int event);
     void _updateLater();
     void _bringInItem();

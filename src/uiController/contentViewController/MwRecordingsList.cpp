@@ -266,6 +266,16 @@ void MwRecordingsContentViewController::_destroyController()
     _playView = nullptr;
     if (Evas_Object* content = elm_object_part_content_unset(getEvasObject(), CONTROLLER_PART); content)
         evas_object_del(content);
+    _announcePlayViewClosed();
+}
+
+void MwRecordingsContentViewController::_announcePlayViewClosed()
+{
+    if (!getModel()->isPlayViewShown())
+        return;
+    getModel()->setPlayViewShown(false);
+    if (MwSignalMgr* signals = MwSignalMgr::existing(); signals)
+        signals->getPlayViewClosedSignal().emit();
 }
 
 void MwRecordingsContentViewController::_createPlayViewController()
@@ -276,7 +286,8 @@ void MwRecordingsContentViewController::_createPlayViewController()
     _playView = new MwPlayViewController(getModel(), getAppController());
     _playView->getEventSignal().addListener([this](MwPlayViewController::eventType type) { _playViewEvent(type); });
     if (!_playView->dock(getEvasObject(), MwPlayViewController::REPORTS_FILE_CHANGES))
-        std::exchange(_playView, nullptr)->destroy();
+        return std::exchange(_playView, nullptr)->destroy();
+    getModel()->setPlayViewShown(true);
 }
 
 // The place where the trim panel docks instead of the player, with its events closed and saved both clearing the flag
@@ -285,6 +296,8 @@ void MwRecordingsContentViewController::_createTrimViewController()
 {
     getModel()->setTrimMode(false);
     mwPost("IDS_MW_TPOP_TRIMMING_IS_NOT_AVAILABLE");
+    // The player has hidden its marks already; this brings them back.
+    getAppController()->getPlayerUpdatedSignal().emit();
 }
 
 void MwRecordingsContentViewController::_playViewEvent(int event)

@@ -222,10 +222,6 @@ void MwRecordingsContentViewController::_clickBackKey()
         _reloadNeeded = true;
     _viewType = _restingViewType();
     getModel()->setTrimMode(false);
-    if (getModel()->isPlayViewShown()) {
-        getModel()->setPlayViewShown(false);
-        MwSignalMgr::getInstance()->getPlayViewClosedSignal().emit();
-    }
     _update();
 }
 
