@@ -91,8 +91,10 @@ TEST_F(RecordingsOperationsTest, DeletesWhatIsCheckedBehindAPopup)
     EXPECT_TRUE(fs::exists(ui::recordingPath("b.m4a")));
     EXPECT_TRUE(isNormal());
 
-    select("Delete", {"b.m4a"});
-    _screen->back(); // before it begins
+    _screen->chooseMenu("Delete");
+    _screen->tap("b.m4a");
+    support::click(_screen->titleButton("title_right_btn"));
+    support::key(_screen->window, "Escape"); // before it begins
     EXPECT_EQ("", popupName());
     support::runFor(0.5);
     EXPECT_TRUE(fs::exists(ui::recordingPath("b.m4a")));
