@@ -19,14 +19,13 @@ namespace {
 
 using FilesLock = MwHandle<files_lock_h, media_content_unlock_files>;
 
-// A file that is where it should go must not be taken for a clash with itself.
-bool isInside(const std::string& path, const std::string& directory)
+// Links are not followed, but for directories with a slash at the end.
+bool isSameFile(const std::string& path, const std::string& other)
 {
     struct stat own { };
-    struct stat other { };
-    const std::string folder = path.substr(0, path.rfind('/') + 1);
-    return ::stat(folder.c_str(), &own) == 0 && ::stat(directory.c_str(), &other) == 0 && own.st_dev == other.st_dev
-        && own.st_ino == other.st_ino;
+    struct stat others { };
+    return ::lstat(path.c_str(), &own) == 0 && ::lstat(other.c_str(), &others) == 0 && own.st_dev == others.st_dev
+        && own.st_ino == others.st_ino;
 }
 
 }
@@ -51,7 +50,11 @@ MwFileMover::Outcome MwFileMover::move(const std::string& source, std::string& d
         MW_LOGE("file is not existed!!!");
         return Outcome::FAILED;
     }
-    const auto place = isInside(source, _directory) ? std::nullopt : _choosePlace(source, false);
+    // A file that is where it should go is no clash with itself.
+    const bool isThere = isSameFile(source.substr(0, source.rfind('/') + 1), _directory + "/");
+    if (!isThere && isSameFile(source, MwFilePlaces::destinationOf(source, _directory)))
+        return _endInterrupted(source, destination);
+    const auto place = isThere ? std::nullopt : _choosePlace(source, false);
     if (!place) {
         _report(MwFilePlaces::sizeOf(source));
         return Outcome::SKIPPED;
@@ -59,6 +62,19 @@ MwFileMover::Outcome MwFileMover::move(const std::string& source, std::string& d
     if (!MwFiles::makeDirectories(_directory))
         return Outcome::FAILED;
     return _stageAndPublish(source, *place, destination);
+}
+
+// A move was killed when the file had both names. The look at the folders gives the row to the one that stays.
+MwFileMover::Outcome MwFileMover::_endInterrupted(const std::string& source, std::string& destination)
+{
+    destination = MwFilePlaces::destinationOf(source, _directory);
+    _report(MwFilePlaces::sizeOf(source));
+    if (::unlink(source.c_str()) != 0) {
+        MW_LOGE("remove failed.");
+        return Outcome::FAILED;
+    }
+    MW_CALL(media_content_scan_all);
+    return Outcome::MOVED;
 }
 
 // The path to use, after asking if it is taken; nothing when the file is to stay. A clash found late is one, too.

@@ -30,6 +30,7 @@ private:
         bool replace = false;
     };
 
+    Outcome _endInterrupted(const std::string& source, std::string& destination);
     std::optional<Place> _choosePlace(const std::string& source, bool late);
     Outcome _stageAndPublish(const std::string& source, Place place, std::string& destination);
     bool _moveRow(const std::string& source, const Place& place, bool sourceLeft);

@@ -14,7 +14,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include "MwFilePlaces.h"
+#include "MwMediaRow.h"
 #include "MwStagedFile.h"
 #include "MwStorageRoots.h"
 #include "support/Recordings.h"
@@ -293,6 +293,28 @@ TEST_F(FileOperatorTest, KilledAtAnyTimeEveryFileIsWholeAndKeepsItsBookmark)
     for (const auto& [name, id] : ids) {
         EXPECT_EQ(name, all[name]);
         EXPECT_EQ(1, bookmarksOf(id)) << name;
+    }
+}
+
+TEST_F(FileOperatorTest, InterruptedMoveIsEndedByTheNextOne)
+{
+    fs::create_directories(privateDirectory());
+    for (const bool rowHasFollowed : {false, true}) {
+        SCOPED_TRACE(rowHasFollowed);
+        const std::string name = rowHasFollowed ? "a.m4a" : "b.m4a";
+        const std::string id = support::addRecording(name, name);
+        media_bookmark_insert_to_db(id.c_str(), 1, "Bookmark 1");
+        fs::create_hard_link(recordingPath(name), privatePath(name));
+        if (rowHasFollowed) {
+            ASSERT_EQ(MwMediaRow::Move::DONE, MwMediaRow::move(recordingPath(name), privatePath(name)));
+            media_content_scan_file(recordingPath(name).c_str()); // found again, without bookmarks
+        }
+        ASSERT_TRUE(run(MwFileOperator::MOVE_TO_PRIVATE, {recordingPath(name)}));
+        EXPECT_TRUE(_clashes.empty());
+        EXPECT_FALSE(fs::exists(recordingPath(name)));
+        EXPECT_EQ(name, readFile(privatePath(name)));
+        EXPECT_EQ(id, rows()[privatePath(name)]);
+        EXPECT_EQ(1, bookmarksOf(id));
     }
 }
 
