@@ -142,8 +142,10 @@ int main(int argc, char** argv)
         ui::takeListShots(directory, dark ? "-dark" : "-light", argc > 2 ? argv[2] : "", width, height);
         ui::takePanelShots(directory, dark ? "-dark" : "-light", argc > 2 ? argv[2] : "", width, height);
         takeRename(directory, dark ? "-dark" : "-light");
-        if (argc == 2)
-            take(directory, shots()[2], dark ? "-wide-dark" : "-wide-light", width * 3, height);
+        if (argc > 2)
+            continue;
+        take(directory, shots()[2], dark ? "-wide-dark" : "-wide-light", width * 3, height);
+        ui::takeListShots(directory, dark ? "-wide-dark" : "-wide-light", "list-playing", width * 5 / 2, height);
     }
     return 0;
 }
