@@ -56,7 +56,7 @@ MwFileMover::Outcome MwFileMover::move(const std::string& source, std::string& d
         return _endInterrupted(source, destination);
     const auto place = isThere ? std::nullopt : _choosePlace(source, false);
     if (!place) {
-        _report(MwFilePlaces::sizeOf(source));
+        _report(MwFilePlaces::_get_file_size(source));
         return Outcome::SKIPPED;
     }
     if (!MwFiles::makeDirectories(_directory))
@@ -68,7 +68,7 @@ MwFileMover::Outcome MwFileMover::move(const std::string& source, std::string& d
 MwFileMover::Outcome MwFileMover::_endInterrupted(const std::string& source, std::string& destination)
 {
     destination = MwFilePlaces::destinationOf(source, _directory);
-    _report(MwFilePlaces::sizeOf(source));
+    _report(MwFilePlaces::_get_file_size(source));
     if (::unlink(source.c_str()) != 0) {
         MW_LOGE("remove failed.");
         return Outcome::FAILED;

@@ -23,7 +23,7 @@ uint64_t sizeOfAll(MwFileOperator::Type type, const std::vector<MwFileOperator::
     if (type == MwFileOperator::DELETE)
         return 0;
     const uint64_t size = std::accumulate(sources.begin(), sources.end(), uint64_t{0},
-        [](uint64_t sum, const auto& source) { return sum + MwFilePlaces::sizeOf(source.path); });
+        [](uint64_t sum, const auto& source) { return sum + MwFilePlaces::_get_file_size(source.path); });
     MW_LOGW("totalSize :%lld", static_cast<long long>(size));
     return size;
 }
@@ -120,10 +120,10 @@ void MwFileOperator::_pipeCb(void* data, void* buffer, unsigned int size)
 {
     auto* self = static_cast<MwFileOperator*>(data);
     // A callback may delete the operator, and this function with it: nothing follows.
-    self->_received(buffer != nullptr ? std::string(static_cast<char*>(buffer), size) : std::string());
+    self->_onMoveFilePipe(buffer != nullptr ? std::string(static_cast<char*>(buffer), size) : std::string());
 }
 
-void MwFileOperator::_received(const std::string& message)
+void MwFileOperator::_onMoveFilePipe(const std::string& message)
 {
     if (_finished)
         return;

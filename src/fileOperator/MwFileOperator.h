@@ -77,7 +77,7 @@ public:
 
 private:
     static void _pipeCb(void* data, void* buffer, unsigned int size);
-    void _received(const std::string& message);
+    void _onMoveFilePipe(const std::string& message);
     void _begin();
     void _join();
 

@@ -58,7 +58,7 @@ bool isTaken(const std::string& path)
     return ::lstat(path.c_str(), &status) == 0;
 }
 
-uint64_t sizeOf(const std::string& path)
+uint64_t _get_file_size(const std::string& path)
 {
     struct stat status { };
     return ::stat(path.c_str(), &status) == 0 ? static_cast<uint64_t>(status.st_size) : 0;

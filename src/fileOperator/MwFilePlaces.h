@@ -17,7 +17,7 @@ std::string freePath(const std::string& source, const std::string& directory);
 // Whether anything has that name, a link that leads nowhere included.
 bool isTaken(const std::string& path);
 // Bytes; 0 when there is no such file.
-uint64_t sizeOf(const std::string& path);
+uint64_t _get_file_size(const std::string& path);
 // After how many chunks the progress is reported, so that the messages stay few.
 unsigned int chunksPerReport(uint64_t totalBytes);
 

@@ -50,7 +50,7 @@ private:
     void _reloadList();
     [[nodiscard]] std::vector<MwBookmarkListItem*> _rows() const;
     [[nodiscard]] int _checkedCount() const;
-    void _itemSelected(MwBookmarkListItem& item);
+    void _itemListenerCb(MwBookmarkListItem& item);
     void _jumpTo(const MwBookmarkListItem& item);
     void _toggle(MwBookmarkListItem& item);
     void _toggleAll();

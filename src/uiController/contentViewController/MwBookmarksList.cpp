@@ -51,7 +51,7 @@ void MwBookmarksContentViewController::_loadListItems()
     int index = 0;
     for (MwSavedBookmark& bookmark : mwReadBookmarks(_mediaId, readingFailed)) {
         auto* row = new MwBookmarkListItem(
-            std::move(bookmark), ++index, [this](MwBookmarkListItem& item) { _itemSelected(item); });
+            std::move(bookmark), ++index, [this](MwBookmarkListItem& item) { _itemListenerCb(item); });
         if (!row->append(_genlist))
             delete row;
     }
@@ -90,7 +90,7 @@ int MwBookmarksContentViewController::_checkedCount() const
     return static_cast<int>(std::count_if(rows.begin(), rows.end(), [](const auto* row) { return row->isChecked(); }));
 }
 
-void MwBookmarksContentViewController::_itemSelected(MwBookmarkListItem& item)
+void MwBookmarksContentViewController::_itemListenerCb(MwBookmarkListItem& item)
 {
     switch (_mode) {
     case MwBookmarkListItem::NORMAL:

@@ -70,7 +70,7 @@ void MwBookmarksContentViewController::_appendSelectAllItem()
     evas_object_geometry_get(_genlist, &x, &y, nullptr, nullptr);
     const auto below = static_cast<int>(FIRST_ROW_MIDDLE * elm_config_scale_get() / elm_app_base_scale_get());
     Elm_Object_Item* first = elm_genlist_at_xy_item_get(_genlist, x + 1, y + below, nullptr);
-    auto* row = new MwBookmarkListItem([this](MwBookmarkListItem& item) { _itemSelected(item); });
+    auto* row = new MwBookmarkListItem([this](MwBookmarkListItem& item) { _itemListenerCb(item); });
     if (!row->prepend(_genlist)) {
         delete row;
         return;
