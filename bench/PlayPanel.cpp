@@ -83,8 +83,7 @@ Evas_Object* openWindow()
     elm_app_base_scale_set(2.6);
     elm_config_scale_set(1.3);
     MwResourceMgr::getInstance()->initialize();
-    for (const char* name : {"edje/MwButton.edj", "edje/MwSlider.edj"})
-        elm_theme_extension_add(nullptr, resource(name).c_str());
+    elm_theme_extension_add(nullptr, resource("edje/MwButton.edj").c_str());
     uxt_theme_set_color_table(
         uxt_theme_add_color_table(resource("tables/com.tovanic.mewlo-lite_ChangeableColorInfo.xml").c_str()));
     Evas_Object* window = elm_win_util_standard_add("bench", "bench");

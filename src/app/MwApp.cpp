@@ -39,8 +39,7 @@ constexpr auto STATE_PREFERENCE = "MainRecordingState";
 constexpr auto STOP_PREFERENCE = "MainRecordingStopRequest";
 constexpr int SMALLEST_REFUSED_LIMIT = 2; // kilobytes
 constexpr int LOWEST_ALLOWED_BATTERY = 2;
-constexpr std::array<const char*, 7> THEME_EXTENSIONS = {"edje/MwGenlist.edj", "edje/MwButton.edj", "edje/MwSlider.edj",
-    "edje/MwDetailsRows.edj", "edje/MwBookmarkRows.edj", "edje/MwPopupParts.edj", "edje/MwRecordingsRows.edj"};
+constexpr std::array<const char*, 2> THEME_EXTENSIONS = {"edje/MwGenlist.edj", "edje/MwButton.edj"};
 
 template <typename Apply>
 void forEachThemeExtension(Apply apply)

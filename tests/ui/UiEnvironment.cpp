@@ -37,9 +37,7 @@ namespace {
     {
         const std::string directory = resources();
         elm_theme_overlay_add(nullptr, (directory + "edje/MwTheme.edj").c_str());
-        for (const char* file :
-            {"edje/MwGenlist.edj", "edje/MwButton.edj", "edje/MwSlider.edj", "edje/MwDetailsRows.edj",
-                "edje/MwBookmarkRows.edj", "edje/MwPopupParts.edj", "edje/MwRecordingsRows.edj"})
+        for (const char* file : {"edje/MwGenlist.edj", "edje/MwButton.edj"})
             elm_theme_extension_add(nullptr, (directory + file).c_str());
         const std::string table = directory + "tables/com.tovanic.mewlo-lite_Changeable";
         uxt_theme_set_color_table(uxt_theme_add_color_table((table + "ColorInfo.xml").c_str()));
