@@ -169,7 +169,7 @@ TEST_F(MwAppControllerTest, ChosenNamesAreUsedOnceAndNeverOverwrite)
         startRecording();
         EXPECT_EQ("", _model.getRenameString());
         _model.updateNextRecordingFileName(); // the screen does, when it comes back from the background
-        fakes::recorder.onCommit = [&] { support::writeFile(fakes::recorder.fileName, expected); };
+        fakes::recorder.onCommit = [expected] { support::writeFile(fakes::recorder.fileName, expected); };
         EXPECT_TRUE(dispatch(MwAppController::STOP_RECORDING));
         EXPECT_EQ(expected, support::readFile(support::recordingPath(expected)));
         EXPECT_EQ("Talk", _model.getCurrentRecordingFileName());
