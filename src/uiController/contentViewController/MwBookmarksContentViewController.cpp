@@ -47,13 +47,7 @@ Evas_Object* MwBookmarksContentViewController::onCreateView(Evas_Object* parent,
 
 void MwBookmarksContentViewController::onCreated()
 {
-    MwSignalMgr* signals = MwSignalMgr::getInstance();
-    _systemInfoListener = signals->getSystemInfoSignal().addListener(
-        [this](MwSignalMgr::SystemInfo info) { _systemInfoChanged(info); });
-    _lifeCycleListener = signals->getLifeCycleSignal().addListener([this](MwSignalMgr::LifeCycle lifeCycle) {
-        if (lifeCycle == MwSignalMgr::TERMINATE)
-            _stopListening();
-    });
+    listenToSystemInfo([this](MwSignalMgr::SystemInfo info) { _systemInfoChanged(info); });
     setBackKeyHandler([this] { _backKeyClicked(); });
     _createList();
     _loadListItems();
@@ -69,20 +63,9 @@ void MwBookmarksContentViewController::onPushed(Evas_Object*)
 
 void MwBookmarksContentViewController::onDestroy()
 {
-    _stopListening();
     WTimer::destroy(_popJob);
     _renamePopup.reset();
     _playView = nullptr;
-}
-
-// On TERMINATE at the latest: afterwards the signals are gone, while the screen waits for its window.
-void MwBookmarksContentViewController::_stopListening()
-{
-    MwSignalMgr* signals = MwSignalMgr::existing();
-    if (!signals)
-        return;
-    mwForget(signals->getSystemInfoSignal(), _systemInfoListener);
-    mwForget(signals->getLifeCycleSignal(), _lifeCycleListener);
 }
 
 void MwBookmarksContentViewController::_createPlayView()

@@ -35,7 +35,6 @@ protected:
     void onPushed(Evas_Object* item) override;
 
 private:
-    void _stopListening();
     void _systemInfoChanged(MwSignalMgr::SystemInfo info);
     void _mediaDBUpdated();
     void _createPlayView();
@@ -81,7 +80,5 @@ private:
     Evas_Object* _radio = nullptr; // the group of the rename mode
     MwBookmarkListItem* _selectAllItem = nullptr; // in the delete mode
     Mode _mode = MwBookmarkListItem::NORMAL;
-    unsigned int _systemInfoListener = 0;
-    unsigned int _lifeCycleListener = 0;
     panekit::WTimer::Weak _popJob;
 };

@@ -94,10 +94,7 @@ void MwBookmarksContentViewController::_updateTitle()
     const int count = _mode == MwBookmarkListItem::DELETE ? _checkedCount() : 0;
     if (count == 0)
         return setTitle("IDS_MW_HEADER_SELECT_BOOKMARKS");
-    Elm_Object_Item* item = getNaviItem();
-    elm_object_item_domain_part_text_translatable_set(item, nullptr, textdomain(nullptr), EINA_FALSE);
-    elm_object_item_text_set(
-        item, mwTranslateNumber("IDS_MW_HEADER_PD_SELECTED_ABB", static_cast<size_t>(count)).c_str());
+    setCountTitle(static_cast<size_t>(count));
 }
 
 void MwBookmarksContentViewController::_updateNaviButton()

@@ -1,5 +1,6 @@
 #include "MwContentViewController.h"
 
+#include <libintl.h>
 #include <utility>
 
 #include <Elementary.h>
@@ -7,6 +8,7 @@
 #include <eext_event.h>
 
 #include "MwLog.h"
+#include "MwText.h"
 
 namespace {
 
@@ -28,7 +30,7 @@ MwContentViewController::MwContentViewController(MwModel* model, MwAppController
 {
 }
 
-MwContentViewController::~MwContentViewController() = default;
+MwContentViewController::~MwContentViewController() { _stopListening(); }
 
 const char* MwContentViewController::getClassName() const { return "MwContentViewController"; }
 
@@ -38,6 +40,33 @@ void MwContentViewController::setBackKeyHandler(std::function<void()> handler)
     _backKeyHandler = std::move(handler);
     if (_backKeyHandler && !wasRegistered)
         eext_object_event_callback_add(getEvasObject(), EEXT_CALLBACK_BACK, _backKeyCb, this);
+}
+
+void MwContentViewController::listenToSystemInfo(std::function<void(MwSignalMgr::SystemInfo)> listener)
+{
+    _stopListening();
+    MwSignalMgr* signals = MwSignalMgr::getInstance();
+    _systemInfoListener = signals->getSystemInfoSignal().addListener(std::move(listener));
+    _lifeCycleListener = signals->getLifeCycleSignal().addListener([this](MwSignalMgr::LifeCycle lifeCycle) {
+        if (lifeCycle == MwSignalMgr::TERMINATE)
+            _stopListening();
+    });
+}
+
+void MwContentViewController::_stopListening()
+{
+    MwSignalMgr* signals = MwSignalMgr::existing();
+    if (!signals)
+        return;
+    mwForget(signals->getSystemInfoSignal(), _systemInfoListener);
+    mwForget(signals->getLifeCycleSignal(), _lifeCycleListener);
+}
+
+void MwContentViewController::setCountTitle(size_t count)
+{
+    Elm_Object_Item* item = getNaviItem();
+    elm_object_item_domain_part_text_translatable_set(item, nullptr, textdomain(nullptr), EINA_FALSE);
+    elm_object_item_text_set(item, mwTranslateNumber("IDS_MW_HEADER_PD_SELECTED_ABB", count).c_str());
 }
 
 void MwContentViewController::_backKeyCb(void* data, Evas_Object*, void*)

@@ -6,7 +6,7 @@
 #include <utility>
 
 #include "MwDetailsListItem.h"
-#include "MwICU.h"
+#include "MwListDates.h"
 #include "MwLog.h"
 #include "MwNaviButtons.h"
 
@@ -14,7 +14,6 @@ namespace {
 
 constexpr auto LIST_PART = "elm.swallow.content";
 constexpr auto FILE_INFO_KEY = "file_info";
-constexpr auto ICU_KEY = "icu";
 
 }
 
@@ -41,28 +40,11 @@ void MwDetailsContentViewController::onCreated()
 {
     _createDetailsList();
     _loadListItem();
-    MwSignalMgr* signals = MwSignalMgr::getInstance();
-    _systemInfoListener = signals->getSystemInfoSignal().addListener(
-        [this](MwSignalMgr::SystemInfo info) { _systemInfoChanged(info); });
-    _lifeCycleListener = signals->getLifeCycleSignal().addListener([this](MwSignalMgr::LifeCycle lifeCycle) {
-        if (lifeCycle == MwSignalMgr::TERMINATE)
-            _stopListening();
-    });
+    listenToSystemInfo([this](MwSignalMgr::SystemInfo info) { _systemInfoChanged(info); });
     setBackKeyHandler([this] { popOut(); });
 }
 
 void MwDetailsContentViewController::onPushed(Evas_Object*) { _updateNaviButton(); }
-
-void MwDetailsContentViewController::onDestroy() { _stopListening(); }
-
-void MwDetailsContentViewController::_stopListening()
-{
-    MwSignalMgr* signals = MwSignalMgr::existing();
-    if (!signals)
-        return;
-    mwForget(signals->getSystemInfoSignal(), _systemInfoListener);
-    mwForget(signals->getLifeCycleSignal(), _lifeCycleListener);
-}
 
 void MwDetailsContentViewController::_createDetailsList()
 {
@@ -75,8 +57,7 @@ void MwDetailsContentViewController::_createDetailsList()
     elm_genlist_mode_set(_genlist, ELM_LIST_COMPRESS);
     elm_genlist_select_mode_set(_genlist, ELM_OBJECT_SELECT_MODE_NONE);
     evas_object_data_set(_genlist, FILE_INFO_KEY, &_fileInfo);
-    evas_object_event_callback_add(_genlist, EVAS_CALLBACK_DEL, _deleteDatesCb, nullptr);
-    _renewDates();
+    mwRenewDates(_genlist);
     elm_object_part_content_set(getEvasObject(), LIST_PART, _genlist);
     evas_object_show(_genlist);
 }
@@ -97,18 +78,6 @@ void MwDetailsContentViewController::_updateNaviButton()
     mwSetBackButton(getNaviItem(), clicked, this);
 }
 
-// A formatter keeps the settings it was made with.
-void MwDetailsContentViewController::_renewDates()
-{
-    delete static_cast<MwICU*>(evas_object_data_del(_genlist, ICU_KEY));
-    evas_object_data_set(_genlist, ICU_KEY, new MwICU);
-}
-
-void MwDetailsContentViewController::_deleteDatesCb(void*, Eo*, Evas_Object* genlist, void*)
-{
-    delete static_cast<MwICU*>(evas_object_data_del(genlist, ICU_KEY));
-}
-
 void MwDetailsContentViewController::_systemInfoChanged(MwSignalMgr::SystemInfo info)
 {
     MW_LOGW("BEGIN - system info signal : [%d]", info);
@@ -122,7 +91,7 @@ void MwDetailsContentViewController::_systemInfoChanged(MwSignalMgr::SystemInfo 
         MW_LOGW("Not handled signal : [%d]", info);
         return;
     }
-    _renewDates();
+    mwRenewDates(_genlist);
     elm_genlist_realized_items_update(_genlist);
 }
 

@@ -2,7 +2,6 @@
 
 #include "MwContentViewController.h"
 #include "MwModel.h"
-#include "MwSignalMgr.h"
 
 // Shows name, date, location, length and size of the recording that is loaded for playback. Owned by the naviframe.
 // Main loop only.
@@ -16,21 +15,15 @@ protected:
     ~MwDetailsContentViewController() override;
     Evas_Object* onCreateView(Evas_Object* parent, void* viewParam) override;
     void onCreated() override;
-    void onDestroy() override;
     void onPushed(Evas_Object* item) override;
 
 private:
     void _createDetailsList();
     void _loadListItem();
     void _updateNaviButton();
-    void _renewDates();
-    void _stopListening();
     void _systemInfoChanged(MwSignalMgr::SystemInfo info);
     void _mediaDBUpdated();
-    static void _deleteDatesCb(void* data, Eo* canvas, Evas_Object* genlist, void* info);
 
     MwFileInfo _fileInfo;
     Evas_Object* _genlist = nullptr;
-    unsigned int _systemInfoListener = 0;
-    unsigned int _lifeCycleListener = 0;
 };

@@ -8,7 +8,7 @@
 
 #include "MwDetailsTexts.h"
 #include "MwDisplayText.h"
-#include "MwICU.h"
+#include "MwListDates.h"
 #include "MwLog.h"
 #include "MwModel.h"
 #include "MwText.h"
@@ -77,13 +77,7 @@ std::string MwDetailsListItem::_getValue() const
 
 std::string MwDetailsListItem::_getDateText() const
 {
-    auto* icu = static_cast<MwICU*>(evas_object_data_get(getGenlist(), "icu"));
-    if (!icu) {
-        MW_LOGE("icu == nullptr!!!");
-        return {};
-    }
-    const auto seconds = static_cast<uint32_t>(fileInfoOf(getGenlist())->modifiedTime);
-    return icu->getICUstring(seconds, MwICU::DATE_AND_TIME).value_or("");
+    return mwDateText(getGenlist(), fileInfoOf(getGenlist())->modifiedTime, MwICU::DATE_AND_TIME);
 }
 
 std::string MwDetailsListItem::_getLoactionText() const { return mwLocationText(fileInfoOf(getGenlist())->path); }

@@ -10,7 +10,7 @@
 
 #include "MwFileOperationPopup.h"
 #include "MwFileOperator.h"
-#include "MwICU.h"
+#include "MwListDates.h"
 #include "MwLog.h"
 #include "MwPlayViewController.h"
 #include "MwPlayer.h"
@@ -90,13 +90,7 @@ void MwRecordingsContentViewController::onPushed(Evas_Object*)
 
 void MwRecordingsContentViewController::_listen()
 {
-    MwSignalMgr* signals = MwSignalMgr::getInstance();
-    _systemInfoListener = signals->getSystemInfoSignal().addListener(
-        [this](MwSignalMgr::SystemInfo info) { _onSystemInfoSignal(info); });
-    _lifeCycleListener = signals->getLifeCycleSignal().addListener([this](MwSignalMgr::LifeCycle lifeCycle) {
-        if (lifeCycle == MwSignalMgr::TERMINATE)
-            _stopListening();
-    });
+    listenToSystemInfo([this](MwSignalMgr::SystemInfo info) { _onSystemInfoSignal(info); });
     // Goes with the view, or with the controller when that ends first.
     getAppController()->getPlayerUpdatedSignal().addListener([this] { _onPlayerUpdateSignal(); }, getEvasObject());
     setBackKeyHandler([this] { _clickBackKey(); });
@@ -110,21 +104,9 @@ void MwRecordingsContentViewController::_listen()
     evas_object_smart_callback_add(getEvasObject(), "language,changed", retranslate, this);
 }
 
-// On TERMINATE at the latest: afterwards the controller and the signals are gone, while the screen waits for its
-// window.
-void MwRecordingsContentViewController::_stopListening()
-{
-    MwSignalMgr* signals = MwSignalMgr::existing();
-    if (!signals)
-        return;
-    mwForget(signals->getSystemInfoSignal(), _systemInfoListener);
-    mwForget(signals->getLifeCycleSignal(), _lifeCycleListener);
-}
-
 // What must not outlive the screen. Leaving it and its window's end both come here.
 void MwRecordingsContentViewController::onDestroy()
 {
-    _stopListening();
     _cancelBringIn();
     _rows.reset();
     if (std::exchange(_playView, nullptr))
@@ -250,7 +232,8 @@ void MwRecordingsContentViewController::_forgetVanishedPlayPath()
 void MwRecordingsContentViewController::_formatChanged()
 {
     _loadTitle(_checkedCount());
-    _replaceDateFormatter();
+    if (_genlist)
+        mwRenewDates(_genlist);
     _refreshRealizedItems();
     _updateDuplicationPopup();
 }

@@ -57,7 +57,6 @@ private:
     // Life and signals (MwRecordingsContentViewController.cpp)
     bool _isComplete() const;
     void _listen();
-    void _stopListening();
     void _onPlayerUpdateSignal();
     void _onSystemInfoSignal(MwSignalMgr::SystemInfo info);
     void _mediaDBUpdated();
@@ -79,7 +78,6 @@ private:
     void _colourNoContents();
     void _createList();
     void _focusList();
-    void _replaceDateFormatter();
     void _loadListItems();
     Evas_Object* _radioGroup() const;
     void _loadSelectAllItem();
@@ -194,6 +192,4 @@ private:
     panekit::WPopupController* _saveToPopup = nullptr; // deletes itself
     std::unique_ptr<MwRenamePopupController> _renamePopup;
     std::string _renameTarget; // path
-    unsigned int _lifeCycleListener = 0;
-    unsigned int _systemInfoListener = 0;
 };

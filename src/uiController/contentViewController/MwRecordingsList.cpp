@@ -11,7 +11,7 @@
 #include <panekit/WTimer.h>
 #include <uxt_theme.h>
 
-#include "MwICU.h"
+#include "MwListDates.h"
 #include "MwLog.h"
 #include "MwPlayViewController.h"
 #include "MwRecordingsModes.h"
@@ -30,7 +30,6 @@ constexpr auto LIST_PART = "elm.swallow.list";
 constexpr auto CONTROLLER_PART = "elm.swallow.controller";
 constexpr auto RECORD_PART = "record_button";
 constexpr auto RADIO_KEY = "radio";
-constexpr auto ICU_KEY = "icu";
 constexpr int NO_CHOICE_VALUE = -1;
 
 std::string edjePath(const char* file)
@@ -39,11 +38,6 @@ std::string edjePath(const char* file)
     if (!MwResourceMgr::getInstance()->getEdjPath(file, path) || path.empty())
         MW_LOGE("getEdjPath fail");
     return path;
-}
-
-void deleteFormatterCb(void*, Evas*, Evas_Object* genlist, void*)
-{
-    delete static_cast<MwICU*>(evas_object_data_del(genlist, ICU_KEY));
 }
 
 void setIcon(Evas_Object* button, const char* part, const char* image, const char* color)
@@ -155,8 +149,7 @@ void MwRecordingsContentViewController::_createList()
     elm_genlist_mode_set(_genlist, ELM_LIST_COMPRESS);
     elm_scroller_bounce_set(_genlist, EINA_FALSE, EINA_FALSE);
     elm_scroller_policy_set(_genlist, ELM_SCROLLER_POLICY_OFF, ELM_SCROLLER_POLICY_AUTO);
-    evas_object_event_callback_add(_genlist, EVAS_CALLBACK_DEL, deleteFormatterCb, nullptr);
-    _replaceDateFormatter();
+    mwRenewDates(_genlist);
     _listenToListKeys();
     elm_object_part_content_set(getEvasObject(), LIST_PART, _genlist);
     evas_object_show(_genlist);
@@ -168,15 +161,6 @@ void MwRecordingsContentViewController::_focusList()
 {
     if (_genlist && isTop() && !hasAttachedPopup() && !panekit::WPopupController::topmost())
         elm_object_focus_set(_genlist, EINA_TRUE);
-}
-
-// A formatter reads region and time zone once.
-void MwRecordingsContentViewController::_replaceDateFormatter()
-{
-    if (!_genlist)
-        return;
-    delete static_cast<MwICU*>(evas_object_data_del(_genlist, ICU_KEY));
-    evas_object_data_set(_genlist, ICU_KEY, new MwICU);
 }
 
 void MwRecordingsContentViewController::_loadListItems()

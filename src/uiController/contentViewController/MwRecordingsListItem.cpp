@@ -11,7 +11,7 @@
 #include <uxt_theme.h>
 
 #include "MwDisplayText.h"
-#include "MwICU.h"
+#include "MwListDates.h"
 #include "MwLog.h"
 #include "MwResourceMgr.h"
 #include "MwStorageRoots.h"
@@ -34,7 +34,6 @@ constexpr auto INNER_PART = "elm.swallow.content";
 constexpr auto CURRENT_NAME_COLOR = "ATO003";
 constexpr auto CURRENT_DETAIL_COLOR = "ATO005";
 constexpr auto RADIO_KEY = "radio";
-constexpr auto ICU_KEY = "icu";
 constexpr auto IMAGE_FILE = "edje/MwImages.edj";
 constexpr int MARK_SIZE = 49; // design units
 constexpr int SHORTEST_SHOWN = 1000; // milliseconds
@@ -137,12 +136,7 @@ std::string MwRecordingsListItem::_nameText() const
 
 std::string MwRecordingsListItem::_dateText() const
 {
-    auto* icu = static_cast<MwICU*>(evas_object_data_get(getGenlist(), ICU_KEY));
-    if (!icu) {
-        MW_LOGE("icu == nullptr!!!");
-        return {};
-    }
-    return mwDisplayMarkup(icu->getICUstring(static_cast<uint32_t>(_info->modifiedTime), MwICU::DATE).value_or(""));
+    return mwDisplayMarkup(mwDateText(getGenlist(), _info->modifiedTime, MwICU::DATE));
 }
 
 std::string MwRecordingsListItem::_durationText() const

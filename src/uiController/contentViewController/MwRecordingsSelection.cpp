@@ -12,6 +12,7 @@
 #include <uxt_theme.h>
 
 #include "MwLog.h"
+#include "MwNaviButtons.h"
 #include "MwPlayer.h"
 #include "MwRecordingsModes.h"
 #include "MwRecordingsRows.h"
@@ -26,14 +27,6 @@ constexpr auto MORE_PART = "title_more_btn";
 constexpr auto NORMAL_TITLE = "IDS_MW_HEADER_RECORDINGS_M_VOICE_ABB";
 
 using Screen = MwRecordingsContentViewController;
-
-std::string countTitle(size_t count)
-{
-    std::string title = mwTranslate("IDS_MW_HEADER_PD_SELECTED_ABB");
-    if (const size_t place = title.find("%d"); place != std::string::npos)
-        title.replace(place, 2, std::to_string(count));
-    return title;
-}
 
 }
 
@@ -58,7 +51,7 @@ void MwRecordingsContentViewController::_loadTitle(size_t count)
         titleId = "IDS_MW_HEADER_SELECT_RECORDINGS_ABB2";
     if (titleId)
         return setTitle(titleId);
-    elm_object_item_text_set(getNaviItem(), countTitle(count).c_str());
+    setCountTitle(count);
 }
 
 void MwRecordingsContentViewController::_loadTitleButtons()
@@ -80,23 +73,15 @@ void MwRecordingsContentViewController::_loadTitleButtons()
 void MwRecordingsContentViewController::_setTitleButton(
     const char* part, const char* style, const char* textId, Evas_Smart_Cb clicked)
 {
+    if (!style)
+        return mwRemoveNaviButton(getNaviItem(), part);
     Evas_Object* button = elm_object_item_part_content_get(getNaviItem(), part);
-    if (!style) {
-        if (button)
-            evas_object_del(elm_object_item_part_content_unset(getNaviItem(), part));
-        return;
-    }
-    if (!button) {
-        button = uxt_button_add_with_style(getEvasObject(), style);
-        evas_object_smart_callback_add(button, "clicked", clicked, this);
-        // A click leaves the keyboard with the list.
-        elm_object_focus_move_policy_set(button, ELM_FOCUS_MOVE_POLICY_KEY_ONLY);
-        elm_object_item_part_content_set(getNaviItem(), part, button);
-        evas_object_show(button);
-    }
-    if (textId)
+    if (button && textId)
         elm_object_domain_translatable_part_text_set(button, nullptr, textdomain(nullptr), textId);
-    panekit::setAccessibleName(button, textId ? textId : "IDS_MW_BUTTON_BACK");
+    else if (!button && textId)
+        mwSetTitleButton(getNaviItem(), part, style, textId, clicked, this);
+    else if (!button)
+        mwSetBackButton(getNaviItem(), clicked, this);
 }
 
 // The menu belongs to the list at rest.
