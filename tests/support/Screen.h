@@ -1,9 +1,6 @@
 #pragma once
 
-#include <Ecore_Evas.h>
-#include <Ecore_Evas_Types.h>
 #include <Elementary.h>
-#include <cairo.h>
 
 #include <string>
 
@@ -69,22 +66,6 @@ inline std::string partState(Evas_Object* layout, const char* part)
     edje_object_message_signal_process(edje);
     const char* state = edje_object_part_state_get(edje, part, nullptr);
     return state != nullptr ? state : "";
-}
-
-inline bool savePng(Evas_Object* window, const std::string& file)
-{
-    elm_win_render(window);
-    Evas* canvas = evas_object_evas_get(window);
-    int width = 0;
-    int height = 0;
-    evas_output_size_get(canvas, &width, &height);
-    const auto* pixels
-        = static_cast<const unsigned char*>(ecore_evas_buffer_pixels_get(ecore_evas_ecore_evas_get(canvas)));
-    cairo_surface_t* surface = cairo_image_surface_create_for_data(
-        const_cast<unsigned char*>(pixels), CAIRO_FORMAT_RGB24, width, height, width * 4);
-    const bool saved = cairo_surface_write_to_png(surface, file.c_str()) == CAIRO_STATUS_SUCCESS;
-    cairo_surface_destroy(surface);
-    return saved;
 }
 
 }

@@ -2,7 +2,6 @@
 
 #include <Elementary.h>
 
-#include <cstdio>
 #include <functional>
 
 #include <media_content.h>
@@ -10,6 +9,7 @@
 #include "MwBookmarksContentViewController.h"
 #include "MwDetailsContentViewController.h"
 #include "PanelScreen.h"
+#include "Picture.h"
 #include "support/Recordings.h"
 #include "support/Screen.h"
 
@@ -103,10 +103,7 @@ void takePanelShots(
             continue;
         PanelScreen screen(width, height);
         shot.arrange(screen);
-        support::runFor(0.3);
-        support::settle(screen.window);
-        const std::string file = directory + "/" + shot.name + suffix + ".png";
-        std::printf("%s %s\n", support::savePng(screen.window, file) ? "wrote" : "failed", file.c_str());
+        savePicture(screen.window, directory + "/" + shot.name + suffix + ".png");
     }
 }
 

@@ -3,7 +3,6 @@
 #include <Ecore_Input.h>
 #include <Elementary.h>
 
-#include <cstdio>
 #include <cstdlib>
 #include <functional>
 #include <vector>
@@ -11,6 +10,7 @@
 #include <media_content.h>
 #include <vconf.h>
 
+#include "Picture.h"
 #include "RecordingsScreen.h"
 #include "support/DatabaseRows.h"
 #include "support/Recordings.h"
@@ -159,10 +159,8 @@ void takeListShots(
         RecordingsScreen screen(shot.mode, width, height);
         screen.open();
         shot.arrange(screen);
-        support::runFor(0.5);
-        support::settle(screen.window);
-        const std::string file = directory + "/" + shot.name + suffix + ".png";
-        std::printf("%s %s\n", support::savePng(screen.window, file) ? "wrote" : "failed", file.c_str());
+        support::runFor(0.2);
+        savePicture(screen.window, directory + "/" + shot.name + suffix + ".png");
         vconf_set_int("db/setting/personal_unlock_method", 0);
     }
     forgetRecordings();

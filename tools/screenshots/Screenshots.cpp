@@ -13,6 +13,7 @@
 #include "MwRenamePopupController.h"
 #include "MwSignalMgr.h"
 #include "PanelShots.h"
+#include "Picture.h"
 #include "RecorderScreen.h"
 #include "UiEnvironment.h"
 #include "fakes/Fakes.h"
@@ -101,10 +102,7 @@ void take(const std::string& directory, const Shot& shot, const std::string& suf
     ui::RecorderScreen screen(
         shot.requestMode, shot.requestMode ? 100 : MwModel::NO_SIZE_LIMIT, shot.format, width, height);
     shot.arrange(screen);
-    support::runFor(0.3);
-    support::settle(screen.window);
-    const std::string file = directory + "/" + shot.name + suffix + ".png";
-    std::printf("%s %s\n", support::savePng(screen.window, file) ? "wrote" : "failed", file.c_str());
+    ui::savePicture(screen.window, directory + "/" + shot.name + suffix + ".png");
     vconf_set_int("memory/sysman/mmc", 0);
 }
 
@@ -114,10 +112,8 @@ void takeRename(const std::string& directory, const std::string& suffix)
     ui::RecorderScreen screen;
     MwRenamePopupController popup("Voice 001");
     popup.create(screen.window, nullptr);
-    support::runFor(0.6);
-    support::settle(popup.getWindow());
-    const std::string file = directory + "/rename" + suffix + ".png";
-    std::printf("%s %s\n", support::savePng(popup.getWindow(), file) ? "wrote" : "failed", file.c_str());
+    support::runFor(0.3);
+    ui::savePicture(popup.getWindow(), directory + "/rename" + suffix + ".png");
 }
 
 }
