@@ -1,21 +1,20 @@
-#include "fakes/Fakes.h"
-
+// The process as an application: requests hold what is put into them, launches and exits are recorded only.
 #include <app.h>
 
 #include <cstring>
 
-using fakes::calls;
+#include "fakes/Answer.h"
+#include "ui/FakeApp.h"
 
 struct app_control_s {
     std::string operation;
     std::string mime;
     std::map<std::string, std::string> extras;
 };
-struct bundle_s {
-    std::map<std::string, std::string> values;
-};
 
 namespace {
+
+void* window = nullptr;
 
 int give(const std::string& text, char** result)
 {
@@ -23,6 +22,14 @@ int give(const std::string& text, char** result)
         return APP_CONTROL_ERROR_KEY_NOT_FOUND;
     *result = ::strdup(text.c_str());
     return 0;
+}
+
+std::string listed(const char* key, const char* values[], int count)
+{
+    std::string all = std::string(key) + "=";
+    for (int i = 0; i < count; ++i)
+        all += std::string(i > 0 ? "," : "") + values[i];
+    return all;
 }
 
 }
@@ -39,74 +46,56 @@ app_control_h makeRequest(const char* operation, const char* mime, const char* s
 
 }
 
+namespace ui {
+
+std::vector<Launch> launches;
+
+void answer(const Launch& launch, app_control_result_e result, const std::map<std::string, std::string>& extras)
+{
+    app_control_s request;
+    app_control_s reply{"", "", extras};
+    if (launch.callback)
+        launch.callback(&request, &reply, result, launch.userData);
+}
+
+}
+
 extern "C" {
+
+FAKE(ui_app_main, (int, char**, const ui_app_lifecycle_s*, void*), )
+void ui_app_exit(void) { fakes::answer(__func__); }
+void ui_app_close(void) { fakes::answer(__func__); }
+void ui_app_set_window_visible(bool visible) { fakes::answer(__func__, visible); }
+void ui_app_set_window(void* object) { window = object; }
+void* ui_app_get_window(void) { return window; }
 
 int app_control_create(app_control_h* control)
 {
-    const int result = calls.record(__func__);
-    if (result == 0)
-        *control = new app_control_s;
+    const int result = fakes::answer(__func__);
+    *control = result == 0 ? new app_control_s : nullptr;
     return result;
 }
-int app_control_destroy(app_control_h control)
-{
-    delete control;
-    return 0;
-}
-int app_control_clone(app_control_h* clone, app_control_h control)
-{
-    *clone = new app_control_s(*control);
-    return 0;
-}
+FAKE(app_control_destroy, (app_control_h control), delete control)
+FAKE(app_control_clone, (app_control_h * clone, app_control_h control), *clone = new app_control_s(*control))
 int app_control_get_operation(app_control_h control, char** operation) { return give(control->operation, operation); }
 int app_control_get_mime(app_control_h control, char** mime) { return give(control->mime, mime); }
 int app_control_get_extra_data(app_control_h control, const char* key, char** value)
 {
     return give(control->extras[key], value);
 }
-int app_control_add_extra_data(app_control_h control, const char* key, const char* value)
-{
-    control->extras[key] = value;
-    return 0;
-}
-int app_control_reply_to_launch_request(app_control_h reply, app_control_h, app_control_result_e result)
-{
-    fakes::reply.result = result;
-    fakes::reply.extras = reply->extras;
-    return calls.record(__func__, std::to_string(result));
-}
-void ui_app_exit(void) { calls.record(__func__); }
-void ui_app_close(void) { calls.record(__func__); }
-int ui_app_main(int, char**, const ui_app_lifecycle_s*, void*) { return calls.record(__func__); }
-void ui_app_set_window_visible(bool) { }
-void ui_app_set_window(void*) { }
-void* ui_app_get_window(void) { return nullptr; }
-int app_control_set_app_id(app_control_h, const char* id) { return calls.record(__func__, id); }
-int app_control_set_operation(app_control_h control, const char* operation)
-{
-    control->operation = operation;
-    return 0;
-}
-int app_control_set_launch_mode(app_control_h, app_control_launch_mode_e mode)
-{
-    return calls.record(__func__, std::to_string(mode));
-}
-int app_control_send_launch_request(app_control_h, app_control_reply_cb, void*) { return calls.record(__func__); }
-
-bundle* bundle_create(void) { return calls.record(__func__) == 0 ? new bundle_s : nullptr; }
-int bundle_add_str(bundle* target, const char* key, const char* value)
-{
-    target->values[key] = value;
-    return calls.record(__func__);
-}
-const char* bundle_get_str(const bundle* source, const char* key)
-{
-    const auto found = source->values.find(key);
-    return found != source->values.end() ? found->second.c_str() : nullptr;
-}
-int bundle_free(bundle* target)
-{
-    delete target;
-    return calls.record(__func__);
-}
+FAKE(app_control_set_app_id, (app_control_h, const char* id), , id)
+FAKE(app_control_set_uri, (app_control_h, const char* uri), , uri)
+FAKE(app_control_set_operation, (app_control_h, const char* operation), , operation)
+FAKE(app_control_set_launch_mode, (app_control_h, app_control_launch_mode_e mode), , mode)
+FAKE(app_control_add_extra_data, (app_control_h control, const char* key, const char* value),
+    control->extras[key] = value, std::string(key) + "=" + value)
+FAKE(app_control_add_extra_data_array, (app_control_h, const char* key, const char* values[], int count), ,
+    listed(key, values, count))
+FAKE(app_control_enable_app_started_result_event, (app_control_h), )
+FAKE(app_control_reply_to_launch_request, (app_control_h reply, app_control_h, app_control_result_e given),
+     fakes::reply.result = given;
+     fakes::reply.extras = reply->extras, given)
+FAKE(app_control_send_launch_request, (app_control_h, app_control_reply_cb callback, void* data),
+    ui::launches.push_back({callback, data}))
+FAKE(app_control_send_terminate_request, (app_control_h), )
 }

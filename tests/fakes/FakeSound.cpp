@@ -1,6 +1,5 @@
-#include "fakes/Fakes.h"
+#include "fakes/Answer.h"
 
-using fakes::calls;
 using fakes::sound;
 
 struct sound_multi_session_s { };
@@ -13,31 +12,16 @@ sound_multi_session_s theSession;
 
 extern "C" {
 
-int sound_manager_set_session_type(sound_session_type_e type) { return calls.record(__func__, std::to_string(type)); }
-int sound_manager_set_media_session_option(
-    sound_session_option_starting_e starting, sound_session_option_during_play_e duringPlay)
-{
-    return calls.record(__func__, std::to_string(starting) + " " + std::to_string(duringPlay));
-}
-int sound_manager_set_current_sound_type(sound_type_e type) { return calls.record(__func__, std::to_string(type)); }
-int sound_manager_unset_current_sound_type(void) { return calls.record(__func__); }
+FAKE(sound_manager_set_session_type, (sound_session_type_e type), , type)
+FAKE(sound_manager_set_media_session_option,
+    (sound_session_option_starting_e starting, sound_session_option_during_play_e during), , starting, during)
+FAKE(sound_manager_set_current_sound_type, (sound_type_e type), , type)
+FAKE(sound_manager_unset_current_sound_type, (void), )
 
-int sound_manager_multi_session_create(int type, sound_multi_session_h* session)
-{
-    const int result = calls.record(__func__, std::to_string(type));
-    if (result == 0)
-        *session = &theSession;
-    return result;
-}
-int sound_manager_multi_session_set_option(sound_multi_session_h, int option)
-{
-    return calls.record(__func__, std::to_string(option));
-}
-int sound_manager_multi_session_set_mode(sound_multi_session_h, int mode)
-{
-    return calls.record(__func__, std::to_string(mode));
-}
-int sound_manager_multi_session_destroy(sound_multi_session_h) { return calls.record(__func__); }
+FAKE(sound_manager_multi_session_create, (int type, sound_multi_session_h* session), *session = &theSession, type)
+FAKE(sound_manager_multi_session_set_option, (sound_multi_session_h, int option), , option)
+FAKE(sound_manager_multi_session_set_mode, (sound_multi_session_h, int mode), , mode)
+FAKE(sound_manager_multi_session_destroy, (sound_multi_session_h), )
 
 int sound_manager_get_active_route(sound_device_in_e* in, sound_device_out_e* out)
 {
@@ -45,13 +29,10 @@ int sound_manager_get_active_route(sound_device_in_e* in, sound_device_out_e* ou
         *in = SOUND_DEVICE_IN_MIC;
     if (out != nullptr)
         *out = sound.route;
-    return calls.record(__func__);
+    return fakes::answer(__func__);
 }
-int sound_manager_set_active_device_changed_cb(sound_manager_active_device_changed_cb callback, void* data)
-{
-    sound.deviceChanged = callback;
-    sound.userData = data;
-    return calls.record(__func__);
-}
-int sound_manager_unset_active_device_changed_cb(void) { return calls.record(__func__); }
+FAKE(sound_manager_set_active_device_changed_cb, (sound_manager_active_device_changed_cb callback, void* data),
+     sound.deviceChanged = callback;
+     sound.userData = data)
+FAKE(sound_manager_unset_active_device_changed_cb, (void), )
 }

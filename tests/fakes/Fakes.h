@@ -52,7 +52,6 @@ struct Recorder {
 
     recorder_error_cb error = nullptr;
     recorder_interrupted_cb interrupted = nullptr;
-    recorder_state_changed_cb stateChanged = nullptr;
     recorder_recording_limit_reached_cb limitReached = nullptr;
     recorder_recording_status_cb status = nullptr;
     void* userData = nullptr;
