@@ -223,7 +223,7 @@ TEST_F(RecorderTest, RefusesDuringCallsAndAlarms)
 TEST_F(RecorderTest, CompletesTheFileBeforeItReportsAnInterruption)
 {
     support::writeTone(directory.file("ring.wav"), 20, 0.2);
-    support::ChildProcess ring;
+    support::Program ring;
     struct Case {
         const char* name;
         std::function<void()> happen;

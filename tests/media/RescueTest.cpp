@@ -1,6 +1,5 @@
 #include "RecorderFixture.h"
 
-#include <csignal>
 #include <fstream>
 
 using support::readFile;
@@ -17,10 +16,10 @@ public:
             {"/proc/" + std::to_string(getpid()) + "/exe", "--record", path, format, std::to_string(commitAfterMs)})
     {
     }
-    void kill() { _process.end(SIGKILL); }
+    void kill() { _process.end(); }
 
 private:
-    support::ChildProcess _process;
+    support::Program _process;
 };
 
 bool growsTo(const std::string& path, uint64_t size)

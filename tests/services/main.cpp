@@ -11,11 +11,7 @@ int main(int argc, char** argv)
 {
     testing::InitGoogleTest(&argc, argv);
     const support::TempDir home;
-    for (const char* name : {"HOME", "XDG_RUNTIME_DIR", "XDG_CONFIG_HOME", "XDG_DATA_HOME", "XDG_STATE_HOME"}) {
-        const std::string path = home.file(name);
-        std::filesystem::create_directories(path);
-        ::setenv(name, path.c_str(), 1);
-    }
+    support::useHome(home);
     ::setenv("DBUS_SESSION_BUS_ADDRESS", ("unix:path=" + home.file("no-session-bus")).c_str(), 1);
     ::setenv("DBUS_SYSTEM_BUS_ADDRESS", ("unix:path=" + home.file("no-system-bus")).c_str(), 1);
     for (const char* name : {"MEWLO_DEVICE_ROOT", "MEWLO_CARD_ROOT", "MEWLO_PRIVATE_ROOT", "DISPLAY", "MEWLO_APPS_DIR"})

@@ -1,39 +1,13 @@
 #include "support/PulseServer.h"
 
-#include <fcntl.h>
-#include <spawn.h>
-#include <sys/wait.h>
-#include <unistd.h>
-
-#include <chrono>
 #include <cmath>
-#include <csignal>
 #include <cstdint>
-#include <cstdio>
 #include <cstring>
-#include <functional>
 #include <random>
-#include <thread>
-#include <utility>
-
-extern char** environ;
 
 namespace support {
 
 namespace {
-
-    constexpr auto POLL = std::chrono::milliseconds(20);
-
-    bool pollUntil(double seconds, const std::function<bool()>& condition)
-    {
-        const auto end = std::chrono::steady_clock::now() + std::chrono::duration<double>(seconds);
-        while (!condition()) {
-            if (std::chrono::steady_clock::now() > end)
-                return false;
-            std::this_thread::sleep_for(POLL);
-        }
-        return true;
-    }
 
     void putWord(std::string& out, uint32_t value, int bytes)
     {
@@ -62,78 +36,6 @@ namespace {
 
 }
 
-ChildProcess::ChildProcess(const std::vector<std::string>& command)
-{
-    std::vector<char*> arguments;
-    for (const auto& word : command)
-        arguments.push_back(const_cast<char*>(word.c_str()));
-    arguments.push_back(nullptr);
-    posix_spawn_file_actions_t files;
-    posix_spawn_file_actions_init(&files);
-    posix_spawn_file_actions_addopen(&files, 0, "/dev/null", O_RDONLY, 0);
-    posix_spawn_file_actions_addopen(&files, 1, "/dev/null", O_WRONLY, 0);
-    posix_spawn_file_actions_addopen(&files, 2, "/dev/null", O_WRONLY, 0);
-    if (posix_spawnp(&_pid, arguments[0], &files, nullptr, arguments.data(), environ) != 0)
-        _pid = -1;
-    posix_spawn_file_actions_destroy(&files);
-}
-
-ChildProcess::ChildProcess(ChildProcess&& other) noexcept
-    : _pid(std::exchange(other._pid, -1))
-{
-}
-
-ChildProcess& ChildProcess::operator=(ChildProcess&& other) noexcept
-{
-    std::swap(_pid, other._pid);
-    return *this;
-}
-
-ChildProcess::~ChildProcess()
-{
-    if (_pid < 0)
-        return;
-    ::kill(_pid, SIGTERM);
-    if (!pollUntil(3, [this] { return !isRunning(); }))
-        end(SIGKILL);
-}
-
-bool ChildProcess::isRunning()
-{
-    if (_pid > 0 && waitpid(_pid, nullptr, WNOHANG) != 0)
-        _pid = -1;
-    return _pid > 0;
-}
-
-void ChildProcess::end(int signal)
-{
-    if (_pid < 0)
-        return;
-    ::kill(_pid, signal);
-    wait();
-}
-
-int ChildProcess::wait()
-{
-    int status = -1;
-    if (_pid < 0 || waitpid(std::exchange(_pid, -1), &status, 0) < 0)
-        return -1;
-    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-}
-
-std::string outputOf(const std::string& shellCommand)
-{
-    std::string output;
-    FILE* pipe = popen((shellCommand + " 2>/dev/null </dev/null").c_str(), "re");
-    if (pipe == nullptr)
-        return output;
-    char block[65536];
-    for (size_t count = 0; (count = fread(block, 1, sizeof block, pipe)) > 0;)
-        output.append(block, count);
-    pclose(pipe);
-    return output;
-}
-
 PulseServer::PulseServer()
 {
     const char* previous = getenv("PULSE_SERVER");
@@ -147,7 +49,7 @@ PulseServer::PulseServer()
     setenv("PULSE_COOKIE", _directory.file("state/cookie").c_str(), 1);
     setenv("XDG_RUNTIME_DIR", runtime.c_str(), 1);
     // Without norewinds a null sink works in blocks of two seconds.
-    _daemon = ChildProcess({"pulseaudio", "-n", "--daemonize=no", "--exit-idle-time=-1", "--disallow-exit=yes",
+    _daemon = Program({"pulseaudio", "-n", "--daemonize=no", "--exit-idle-time=-1", "--disallow-exit=yes",
         "--use-pid-file=no", "--log-target=file:" + _directory.file("pa.log"), //
         "-L", "module-native-protocol-unix socket=" + runtime + "/native auth-anonymous=1", //
         "-L", "module-null-sink sink_name=spk norewinds=1", //
@@ -155,7 +57,7 @@ PulseServer::PulseServer()
         "-L", "module-remap-source source_name=micsrc master=mic.monitor", //
         "-L", "module-role-cork trigger_roles=phone,alarm,event,notification cork_roles=music,video"});
     setenv("PULSE_SERVER", address().c_str(), 1);
-    _up = pollUntil(20, [this] { return control("info").find("Server Name") != std::string::npos; });
+    _up = waitFor([this] { return control("info").find("Server Name") != std::string::npos; }, 20);
     (void)control("set-default-sink spk");
     (void)control("set-default-source micsrc");
 }
@@ -170,21 +72,21 @@ PulseServer::~PulseServer()
         setenv("PULSE_SERVER", _previousServer.c_str(), 1);
 }
 
-void PulseServer::kill() { _daemon.end(SIGKILL); }
+void PulseServer::kill() { _daemon.end(); }
 
-ChildProcess PulseServer::speak(const std::string& wav) const
+Program PulseServer::speak(const std::string& wav) const
 {
-    return ChildProcess({"paplay", "--latency-msec=150", "--device=mic", wav});
+    return Program({"paplay", "--latency-msec=150", "--device=mic", wav});
 }
 
-ChildProcess PulseServer::playAs(const std::string& role, const std::string& wav) const
+Program PulseServer::playAs(const std::string& role, const std::string& wav) const
 {
-    return ChildProcess({"paplay", "--latency-msec=20", "--device=spk", "--property=media.role=" + role, wav});
+    return Program({"paplay", "--latency-msec=20", "--device=spk", "--property=media.role=" + role, wav});
 }
 
-ChildProcess PulseServer::recordElsewhere() const
+Program PulseServer::recordElsewhere() const
 {
-    return ChildProcess({"parecord", "--latency-msec=20", "--device=micsrc", "--raw", "/dev/null"});
+    return Program({"parecord", "--latency-msec=20", "--device=micsrc", "--raw", "/dev/null"});
 }
 
 std::string PulseServer::control(const std::string& pactlArguments) const

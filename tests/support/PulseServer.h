@@ -1,36 +1,12 @@
 #pragma once
 
+#include "support/Program.h"
 #include "support/TempDir.h"
-
-#include <sys/types.h>
 
 #include <string>
 #include <vector>
 
 namespace support {
-
-// A program started by a test; ended (SIGTERM, then SIGKILL) and reaped with the object. Its output is discarded.
-class ChildProcess {
-public:
-    ChildProcess() = default;
-    explicit ChildProcess(const std::vector<std::string>& command);
-    ChildProcess(ChildProcess&& other) noexcept;
-    ChildProcess& operator=(ChildProcess&& other) noexcept;
-    ~ChildProcess();
-
-    [[nodiscard]] pid_t pid() const { return _pid; }
-    [[nodiscard]] bool isRunning();
-    // Sends the signal and waits for the end.
-    void end(int signal);
-    // Waits for the program to end by itself; answers its exit status or -1.
-    int wait();
-
-private:
-    pid_t _pid = -1;
-};
-
-// Runs a command to its end; answers its standard output.
-std::string outputOf(const std::string& shellCommand);
 
 // A private PulseAudio daemon with a loudspeaker ("spk"), and a virtual microphone ("micsrc") that hears what is played
 // into the sink "mic". Runs as root or as a user; several can run at once. While it lives, PULSE_SERVER, PULSE_COOKIE
@@ -46,11 +22,11 @@ public:
     [[nodiscard]] std::string address() const { return "unix:" + _directory.path() + "/rt/native"; }
 
     // Plays a sound file into the microphone.
-    [[nodiscard]] ChildProcess speak(const std::string& wav) const;
+    [[nodiscard]] Program speak(const std::string& wav) const;
     // Plays a sound file on the loudspeaker under a media role such as "phone", "alarm" or "notification".
-    [[nodiscard]] ChildProcess playAs(const std::string& role, const std::string& wav) const;
+    [[nodiscard]] Program playAs(const std::string& role, const std::string& wav) const;
     // Another application that records.
-    [[nodiscard]] ChildProcess recordElsewhere() const;
+    [[nodiscard]] Program recordElsewhere() const;
 
     // Answers the module's number, empty when it could not be loaded.
     [[nodiscard]] std::string load(const std::string& moduleAndArguments) const;
@@ -61,7 +37,7 @@ public:
 
 private:
     TempDir _directory;
-    ChildProcess _daemon;
+    Program _daemon;
     std::string _previousServer;
     bool _up = false;
 };

@@ -32,6 +32,17 @@ private:
     std::string _path;
 };
 
+// Gives the process a home of its own, so that keys, preferences and recordings of the user stay untouched.
+inline void useHome(const TempDir& home)
+{
+    for (const char* name : {"HOME", "XDG_RUNTIME_DIR", "XDG_CONFIG_HOME", "XDG_DATA_HOME", "XDG_STATE_HOME",
+             "MEWLO_DEVICE_ROOT", "MEWLO_CARD_ROOT", "MEWLO_PRIVATE_ROOT"}) {
+        std::filesystem::create_directories(home.file(name));
+        std::filesystem::permissions(home.file(name), std::filesystem::perms::owner_all);
+        ::setenv(name, home.file(name).c_str(), 1);
+    }
+}
+
 inline void writeFile(const std::string& path, const std::string& content)
 {
     std::filesystem::create_directories(std::filesystem::path(path).parent_path());

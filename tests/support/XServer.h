@@ -4,7 +4,6 @@
 #include "support/RunUntil.h"
 
 #include <cstdlib>
-#include <memory>
 #include <string>
 
 namespace support {
@@ -15,9 +14,8 @@ public:
     XServer()
     {
         const std::string number = _directory.file("number");
-        _server = std::make_unique<Program>(
-            std::vector<std::string>{"Xvfb", "-displayfd", "1", "-screen", "0", "640x480x24"}, number);
-        runUntil([&] { return readFile(number).ends_with('\n') || !_server->isRunning(); }, 30);
+        _server = Program({"Xvfb", "-displayfd", "1", "-screen", "0", "640x480x24"}, number);
+        runUntil([&] { return readFile(number).ends_with('\n') || !_server.isRunning(); }, 30);
         _name = ":" + readFile(number);
         _name.pop_back();
         if (isUp())
@@ -28,12 +26,12 @@ public:
     XServer& operator=(const XServer&) = delete;
 
     // False where Xvfb is missing.
-    [[nodiscard]] bool isUp() const { return _server->isRunning() && _name.size() > 1; }
+    [[nodiscard]] bool isUp() const { return _server.isRunning() && _name.size() > 1; }
     [[nodiscard]] const std::string& name() const { return _name; }
 
 private:
     TempDir _directory;
-    std::unique_ptr<Program> _server;
+    Program _server;
     std::string _name;
 };
 

@@ -22,17 +22,6 @@ namespace {
         return directory != nullptr ? directory : MEWLO_TEST_RESOURCES;
     }
 
-    void useHome(const support::TempDir& home)
-    {
-        for (const char* name : {"HOME", "XDG_RUNTIME_DIR", "XDG_CONFIG_HOME", "XDG_DATA_HOME", "XDG_STATE_HOME",
-                 "MEWLO_DEVICE_ROOT", "MEWLO_CARD_ROOT", "MEWLO_PRIVATE_ROOT"}) {
-            const std::string path = home.file(name);
-            std::filesystem::create_directories(path);
-            std::filesystem::permissions(path, std::filesystem::perms::owner_all);
-            ::setenv(name, path.c_str(), 1);
-        }
-    }
-
     void useLook()
     {
         const std::string directory = resources();
@@ -52,7 +41,7 @@ namespace {
 
 Environment::Environment(int argc, char** argv)
 {
-    useHome(_home);
+    support::useHome(_home);
     ::setenv("MEWLO_RESOURCE_DIR", resources().c_str(), 1);
     ::setenv("MEWLO_HOST", "none", 1);
     ::setenv("ELM_ENGINE", "buffer", 1);
