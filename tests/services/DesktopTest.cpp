@@ -1,9 +1,6 @@
-#include "app.h"
 #include "bluetooth.h"
-#include "desktop/Toast.h"
 #include "host/BusInLoop.h"
 #include "host/Notifier.h"
-#include "launch/Toolkit.h"
 #include "media_key.h"
 #include "notification.h"
 #include "remote_player.h"
@@ -15,8 +12,6 @@
 #include "support/RunUntil.h"
 
 #include <gtest/gtest.h>
-
-#include <Elementary.h>
 
 #include <cstring>
 #include <thread>
@@ -202,20 +197,6 @@ TEST_F(MprisTest, LosesItsBusWithoutHarm)
     EXPECT_EQ(nullptr, host::sessionBus());
 }
 
-TEST(BluetoothTest, RefusesCallsOutOfOrder)
-{
-    EXPECT_EQ(BT_ERROR_NOT_INITIALIZED, bt_avrcp_target_notify_player_state(BT_AVRCP_PLAYER_STATE_PLAYING));
-    EXPECT_EQ(BT_ERROR_NOT_INITIALIZED, bt_avrcp_target_initialize([](bool, const char*, void*) {}, nullptr));
-    EXPECT_EQ(BT_ERROR_NOT_INITIALIZED, bt_deinitialize());
-    EXPECT_EQ(0, bt_initialize());
-    EXPECT_EQ(BT_ERROR_INVALID_PARAMETER, bt_avrcp_target_initialize(nullptr, nullptr));
-    EXPECT_EQ(0, bt_avrcp_target_initialize([](bool, const char*, void*) {}, nullptr));
-    EXPECT_EQ(BT_ERROR_INVALID_PARAMETER, bt_avrcp_target_notify_player_state(static_cast<bt_avrcp_player_state_e>(3)));
-    EXPECT_EQ(0, bt_avrcp_target_notify_player_state(BT_AVRCP_PLAYER_STATE_STOPPED));
-    EXPECT_EQ(0, bt_avrcp_target_deinitialize());
-    EXPECT_EQ(0, bt_deinitialize());
-}
-
 TEST(NotifierTest, ReplacesItsNotification)
 {
     if (!DbusMock::isInstalled())
@@ -263,24 +244,6 @@ TEST(StatusMessageTest, IsRememberedFromAnyThread)
     EXPECT_STREQ("from a worker", notification_status_message_last());
     EXPECT_EQ(0, notification_status_message_post(""));
     EXPECT_STREQ("", notification_status_message_last());
-}
-
-TEST(ToastTest, NeedsAWindowWithTheLook)
-{
-    ::setenv("ELM_ENGINE", "buffer", 1);
-    ASSERT_TRUE(platform::startToolkit(0, nullptr));
-    EXPECT_FALSE(platform::showToast("no window yet"));
-    Evas_Object* window = elm_win_util_standard_add("toast", "toast");
-    evas_object_resize(window, 360, 640);
-    evas_object_show(window);
-    ui_app_set_window(window);
-    EXPECT_FALSE(platform::showToast("a window without the application's theme"));
-    platform::raiseMainWindow();
-    evas_object_del(window);
-    EXPECT_EQ(nullptr, ui_app_get_window());
-    EXPECT_FALSE(platform::showToast("window gone"));
-    platform::raiseMainWindow();
-    platform::stopToolkit();
 }
 
 class UsageLogTest : public testing::Test {

@@ -2,7 +2,6 @@
 #include "preference.h"
 #include "state/Directories.h"
 #include "state/Trees.h"
-#include "system_info.h"
 #include "system_settings.h"
 #include "vconf.h"
 
@@ -148,18 +147,6 @@ TEST(SystemSettingsTest, TimeZoneComesFromKeyThenEnvironment)
     ASSERT_EQ(0, system_settings_get_value_string(SYSTEM_SETTINGS_KEY_LOCALE_TIMEZONE, &zone));
     EXPECT_EQ("Europe/Berlin", taken(zone));
     EXPECT_EQ(0, system_settings_unset_changed_cb(SYSTEM_SETTINGS_KEY_TIME_CHANGED));
-}
-
-TEST(SystemInfoTest, ModelOfTheEnvironmentWins)
-{
-    char* model = nullptr;
-    ::setenv("MEWLO_MODEL", "QX-A110H", 1);
-    ASSERT_EQ(0, system_info_get_platform_string(SYSTEM_INFO_KEY_MODEL, &model));
-    EXPECT_EQ("QX-A110H", taken(model));
-    ::unsetenv("MEWLO_MODEL");
-    ASSERT_EQ(0, system_info_get_platform_string(SYSTEM_INFO_KEY_MODEL, &model));
-    EXPECT_NE("", taken(model));
-    EXPECT_NE(0, system_info_get_platform_string("other", &model));
 }
 
 TEST(AppEventTest, LowBatteryIsLowOrCritical)

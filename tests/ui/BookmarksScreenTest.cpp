@@ -10,6 +10,7 @@
 #include "MwBookmarkListItem.h"
 #include "MwBookmarksContentViewController.h"
 #include "PanelScreen.h"
+#include "RenameWindow.h"
 #include "fakes/Fakes.h"
 #include "support/Recordings.h"
 #include "support/Screen.h"
@@ -87,35 +88,26 @@ protected:
     {
         return elm_object_item_part_content_get(_top->getNaviItem(), part);
     }
-    // The window in which a name is asked for, null when there is none.
-    Evas_Object* renameWindow() const
-    {
-        Eina_List* all = ecore_evas_ecore_evas_list_get();
-        void* each = nullptr;
-        Evas_Object* found = nullptr;
-        EINA_LIST_FREE(all, each)
-        {
-            auto* window = static_cast<Evas_Object*>(ecore_evas_data_get(static_cast<Ecore_Evas*>(each), "elm_win"));
-            if (window && window != _screen.window)
-                found = window;
-        }
-        return found;
-    }
-    // Types a name over the one that is there and confirms it.
+    Evas_Object* renameWindow() const { return ui::renameWindow(_screen.window); }
     void answer(const std::string& name)
     {
-        support::runFor(0.2);
-        Evas_Object* window = renameWindow();
-        evas_event_feed_key_down(evas_object_evas_get(window), "Control_L", "Control_L", nullptr, nullptr, 1, nullptr);
-        evas_key_modifier_on(evas_object_evas_get(window), "Control");
-        support::key(window, "a");
-        evas_key_modifier_off(evas_object_evas_get(window), "Control");
-        for (const char letter : name)
-            support::key(window, std::string(1, letter).c_str(), std::string(1, letter).c_str());
         fakes::desktop.lastMessage.clear();
-        support::key(window, "Return");
+        ui::answerRename(renameWindow(), name);
         support::runUntil([this] { return !fakes::desktop.lastMessage.empty() || !renameWindow(); }, 1.0);
         support::settle(_screen.window);
+    }
+    // A button of the player panel at the lower edge.
+    void pressOfPanel(const char* part)
+    {
+        support::settle(_screen.window);
+        support::click(elm_object_part_content_get(elm_object_part_content_get(_view, "elm.swallow.controller"), part));
+        support::settle(_screen.window);
+    }
+    void addBookmarkAt(unsigned int position)
+    {
+        _screen.model.setCurrentPlayPosition(position);
+        _screen.announce();
+        pressOfPanel("bookmark_btn");
     }
     bool hasPanel() const { return elm_object_part_content_get(_view, "elm.swallow.controller") != nullptr; }
     bool isOnTop() const { return _screen.naviframe->getTop() == _top; }
@@ -220,11 +212,7 @@ TEST_F(BookmarksScreenTest, RenamesInPlaceAndRefusesNamesOfOthers)
 
 TEST_F(BookmarksScreenTest, FollowsThePanelAndTheDatabase)
 {
-    _screen.model.setCurrentPlayPosition(100000);
-    _screen.announce();
-    Evas_Object* panel = elm_object_part_content_get(_view, "elm.swallow.controller");
-    support::settle(_screen.window);
-    support::click(elm_object_part_content_get(panel, "bookmark_btn"));
+    addBookmarkAt(100000);
     EXPECT_EQ("one two Bookmark001 three ", rows());
     MwSignalMgr::getInstance()->getSystemInfoSignal().emit(MwSignalMgr::MEDIA_DB_UPDATED);
     EXPECT_TRUE(isOnTop());
@@ -237,14 +225,6 @@ TEST_F(BookmarksScreenTest, AddingABookmarkLeavesTheListInPlace)
 {
     for (unsigned int second = 10; second < 40; ++second)
         media_bookmark_insert_to_db(_mediaId.c_str(), second, "x");
-    Evas_Object* panel = elm_object_part_content_get(_view, "elm.swallow.controller");
-    const auto add = [&](unsigned int position) {
-        _screen.model.setCurrentPlayPosition(position);
-        _screen.announce();
-        support::settle(_screen.window);
-        support::click(elm_object_part_content_get(panel, "bookmark_btn"));
-        support::settle(_screen.window);
-    };
     const auto top = [this] {
         int x = 0;
         int y = 0;
@@ -252,28 +232,22 @@ TEST_F(BookmarksScreenTest, AddingABookmarkLeavesTheListInPlace)
         evas_object_geometry_get(_list, &x, &y, nullptr, nullptr);
         return elm_genlist_item_index_get(elm_genlist_at_xy_item_get(_list, x + 50, y + 1, &offset));
     };
-    add(100000);
+    addBookmarkAt(100000);
     ASSERT_EQ(34U, elm_genlist_items_count(_list));
     elm_genlist_item_show(row(12), ELM_GENLIST_ITEM_SCROLLTO_TOP);
     support::settle(_screen.window);
     ASSERT_EQ(13, top());
-    add(200000);
+    addBookmarkAt(200000);
     EXPECT_EQ(13, top());
 }
 
 TEST_F(BookmarksScreenTest, AnotherFileOrTrimmingEndsIt)
 {
-    const auto press = [this](const char* part) {
-        Evas_Object* panel = elm_object_part_content_get(_view, "elm.swallow.controller");
-        support::settle(_screen.window);
-        support::click(elm_object_part_content_get(panel, part));
-        support::runFor(0.05);
-    };
-    press("ff_btn");
+    pressOfPanel("ff_btn");
     EXPECT_FALSE(isOnTop());
     _top = new MwBookmarksContentViewController(&_screen.model, _screen.controller(), _mediaId);
     _view = _screen.push(_top);
-    press("trim_btn");
+    pressOfPanel("trim_btn");
     EXPECT_FALSE(isOnTop());
     EXPECT_TRUE(_screen.model.isTrimMode());
 }

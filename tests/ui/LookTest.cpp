@@ -119,22 +119,6 @@ TEST_F(TableTest, ListenersHearChangesOnlyAndMayRemoveThemselves)
     EXPECT_NE(0, uxt_theme_remove_changed_callback(count, &changes));
 }
 
-TEST(WidgetTest, AnUnknownButtonStyleFallsBackAndTheEditFieldHasOneLine)
-{
-    Evas_Object* window = elm_win_util_standard_add("test", "test");
-    Evas_Object* plain = uxt_button_add_with_style(window, "no such style");
-    EXPECT_STREQ("default", elm_object_style_get(plain));
-    Evas_Object* known = uxt_button_add_with_style(window, "mewlo/circle_button/small");
-    EXPECT_STREQ("mewlo/circle_button/small", elm_object_style_get(known));
-    EXPECT_EQ(nullptr, uxt_button_add(nullptr));
-    Evas_Object* entry = nullptr;
-    Evas_Object* layout = uxt_edit_field_layout_add(window, 2, &entry);
-    ASSERT_NE(nullptr, entry);
-    EXPECT_TRUE(elm_entry_single_line_get(entry));
-    EXPECT_EQ(entry, elm_object_part_content_get(layout, "elm.swallow.content"));
-    evas_object_del(window);
-}
-
 class LanguageTest : public ::testing::Test {
 protected:
     void TearDown() override

@@ -196,21 +196,6 @@ TEST_F(NaviframeTest, OneAttachedPopupAtATimeThatClosesWithTheScreen)
     EXPECT_EQ(nullptr, WPopupController::topmost());
 }
 
-TEST_F(NaviframeTest, MoreKeyAndMoreButtonCallTheHandler)
-{
-    Events events;
-    Screen* screen = push(events);
-    int more = 0;
-    screen->setMoreButton([&] { ++more; });
-    support::key(_window, "Menu");
-    support::key(_window, "F10");
-    EXPECT_EQ(2, more);
-    // A new handler takes the place of the old one.
-    screen->setMoreButton([&] { more += 10; });
-    support::key(_window, "Menu");
-    EXPECT_EQ(12, more);
-}
-
 class PopupTest : public NaviframeTest { };
 
 TEST_F(PopupTest, ButtonsKeysAndDestructionInItsOwnHandler)
@@ -249,7 +234,9 @@ TEST_F(PopupTest, TheBackHandlerReplacesClosingAndTheMenuKeyStopsHere)
 {
     Events events;
     int more = 0;
-    push(events)->setMoreButton([&] { ++more; });
+    Screen* screen = push(events);
+    screen->setMoreButton([&] { more += 10; });
+    screen->setMoreButton([&] { ++more; }); // takes the place of the first
     int back = 0;
     auto* popup = new WPopupController;
     popup->setOnBack([&](WPopupController*) { ++back; });

@@ -378,19 +378,6 @@ TEST(RecorderScreenTest, BackAsksBeforeDiscarding)
     EXPECT_EQ(nullptr, WPopupController::topmost());
 }
 
-TEST(RecorderScreenTest, BackOnTheReadyScreenLeavesIt)
-{
-    ui::RecorderScreen screen;
-    int asked = 0;
-    screen.naviframe->setOnLastItemPop([&] {
-        ++asked;
-        return false;
-    });
-    screen.back();
-    EXPECT_EQ(1, asked);
-    EXPECT_EQ(screen.view, screen.naviframe->getTop()->getEvasObject());
-}
-
 TEST(RecorderScreenTest, KeysOfTheBigButton)
 {
     ui::RecorderScreen screen;

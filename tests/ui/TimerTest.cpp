@@ -1,6 +1,5 @@
 #include <gtest/gtest.h>
 
-#include <panekit/WSignalIdGenerator.h>
 #include <panekit/WTimer.h>
 
 #include "support/RunUntil.h"
@@ -78,13 +77,6 @@ TEST(WTimerTest, AJobRunsOnceAndMayAddAnother)
     support::runFor(0.02);
     EXPECT_EQ(1, first);
     EXPECT_EQ(1, second);
-}
-
-TEST(WSignalIdGeneratorTest, NeverAnswersTheSameOrNone)
-{
-    const unsigned int first = panekit::WSignalIdGenerator::generate();
-    EXPECT_NE(0U, first);
-    EXPECT_EQ(first + 1, panekit::WSignalIdGenerator::generate());
 }
 
 }

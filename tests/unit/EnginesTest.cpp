@@ -78,27 +78,6 @@ TEST_F(MwRecorderTest, StartUsesTheModelsSettings)
     EXPECT_TRUE(calls.has("recorder_attr_set_audio_samplerate 8000"));
 }
 
-TEST_F(MwRecorderTest, StartTellsWhyItFailed)
-{
-    struct {
-        const char* call;
-        int code;
-        MwRecorder::ErrorType error;
-    } const cases[] = {
-        {"recorder_prepare", RECORDER_ERROR_SOUND_POLICY_BY_CALL, MwRecorder::ERROR_BLOCKED_BY_CALL},
-        {"recorder_prepare", RECORDER_ERROR_SECURITY_RESTRICTED, MwRecorder::ERROR_SECURITY_RESTRICTED},
-        {"recorder_prepare", RECORDER_ERROR_OUT_OF_STORAGE, MwRecorder::ERROR_UNKNOWN},
-        {"recorder_start", RECORDER_ERROR_OUT_OF_STORAGE, MwRecorder::ERROR_OUT_OF_STORAGE},
-        {"recorder_start", RECORDER_ERROR_SOUND_POLICY_BY_CALL, MwRecorder::ERROR_UNKNOWN},
-    };
-    for (const auto& c : cases) {
-        renew();
-        calls.failWith(c.call, c.code);
-        EXPECT_FALSE(start());
-        EXPECT_EQ(c.error, _error) << c.call << c.code;
-    }
-}
-
 TEST_F(MwRecorderTest, GuardsEveryStep)
 {
     EXPECT_FALSE(_recorder.pause());
@@ -140,7 +119,6 @@ TEST_F(MwRecorderTest, StopCommitsAndIsTolerantOnlyForRequests)
 
 TEST_F(MwRecorderTest, DestroyKeepsTheHandleUntilItIsUnwired)
 {
-    calls.failWith("recorder_unset_limit", 0);
     calls.failWith("recorder_unset_recording_status_cb", -1);
     EXPECT_FALSE(_recorder.destroyHandle());
     EXPECT_FALSE(calls.has("recorder_destroy"));
@@ -174,25 +152,15 @@ TEST_F(MwRecorderTest, LevelIsSampledOnEveryTenthStatus)
     EXPECT_EQ(-300.0, _model.getLevel());
 }
 
-TEST_F(MwRecorderTest, NotificationsBecomeSignals)
+TEST_F(MwRecorderTest, ErrorsBecomeSignals)
 {
     std::vector<int> errors;
-    std::vector<int> limits;
-    int interruptions = 0;
     _recorder.errorSignal.addListener([&](MwRecorder::ErrorType type) { errors.push_back(type); });
-    _recorder.limitReachedSignal.addListener([&](MwRecorder::LimitType type) { limits.push_back(type); });
-    _recorder.interruptedSignal.addListener([&] { ++interruptions; });
     for (const int code : std::initializer_list<int>{RECORDER_ERROR_SECURITY_RESTRICTED,
              RECORDER_ERROR_SOUND_POLICY_BY_CALL, RECORDER_ERROR_SOUND_POLICY_BY_ALARM, RECORDER_ERROR_ESD,
              RECORDER_ERROR_OUT_OF_STORAGE, RECORDER_ERROR_DEVICE, 0})
         fakes::recorder.error(code, RECORDER_STATE_RECORDING, fakes::recorder.userData);
     EXPECT_EQ((std::vector<int>{4, 3, 1, 1, 2, 1, 1}), errors);
-    for (int type = 0; type < 4; ++type)
-        fakes::recorder.limitReached(static_cast<recorder_recording_limit_type_e>(type), fakes::recorder.userData);
-    EXPECT_EQ((std::vector<int>{1, 2, 3, 0}), limits);
-    fakes::recorder.interrupted(
-        RECORDER_POLICY_DEVICE_LOST, RECORDER_STATE_RECORDING, RECORDER_STATE_READY, fakes::recorder.userData);
-    EXPECT_EQ(1, interruptions);
     fakes::recorder.interrupted(RECORDER_POLICY_NONE, RECORDER_STATE_READY, RECORDER_STATE_READY, nullptr);
     EXPECT_TRUE(fakes::log.has("self is nullptr"));
 }

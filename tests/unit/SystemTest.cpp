@@ -6,7 +6,6 @@
 
 #include "MwFeatureChecker.h"
 #include "MwFiles.h"
-#include "MwLoggingMgr.h"
 #include "MwModel.h"
 #include "MwRecordingNotes.h"
 #include "MwRecordingRescue.h"
@@ -174,20 +173,6 @@ TEST(MwFeatureCheckerTest, TrimDependsOnTheModel)
         EXPECT_EQ(trims, MwFeatureChecker::isEnable(0)) << model;
         EXPECT_FALSE(MwFeatureChecker::isEnable(1));
     }
-}
-
-TEST(MwLoggingMgrTest, WritesOnlyWhatThereIs)
-{
-    fakes::reset();
-    MwLoggingMgr log;
-    EXPECT_FALSE(log.insert("BMRK")) << "no client yet";
-    ASSERT_TRUE(log.init());
-    EXPECT_FALSE(log.insert(""));
-    EXPECT_FALSE(calls.has("usage"));
-    EXPECT_TRUE(log.insert("MTPF", "on"));
-    EXPECT_TRUE(calls.has("usage app_id=com.tovanic.mewlo-lite feature=MTPF extra=on value=-"));
-    calls.failWith("usage", -1);
-    EXPECT_FALSE(log.insert("Rena", "StandBy", "v"));
 }
 
 TEST(MwRequestParserTest, ReadsModeFormatAndLimit)
