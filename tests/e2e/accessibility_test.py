@@ -16,11 +16,35 @@ def buttons(bus):
     return sorted(name for _, role, name in bus.controls() if role == "push button")
 
 
+def has_named(bus, expected):
+    """Covered screens are still in the tree, so there may be more; but each has a name."""
+    return all(buttons(bus)) and set(expected) <= set(buttons(bus))
+
+
+def walk_recordings(place, bus):
+    place.click(500, 883)
+    place.wait_for("the list's names", lambda: has_named(bus, ["Back", "More options", "Record"]))
+    tabs = [name for _, role, name in bus.controls() if role == "page tab"]
+    assert "Recordings" in tabs, "the title's name"
+    time.sleep(0.5)
+    place.click(500, 120)
+    panel = ["Back", "Bookmark", "More options", "Next", "Pause", "Previous", "Trim"]
+    place.wait_for("the player's names", lambda: has_named(bus, panel))
+    assert ("slider", "Position") in [(role, name) for _, role, name in bus.controls()], "the slider's name"
+    place.click(50, 40)
+    place.wait_for("the list again", lambda: not has_named(bus, ["Bookmark"]))
+    place.click(50, 40)
+
+
 def walk(place, bus):
     place.wait_for("the window", place.window, 30)
     place.wait_for("the ready recorder", lambda: place.recorder_state() == "1")
     time.sleep(0.5)  # the first frame; before it the window takes no clicks
-    place.wait_for("the ready screen's names", lambda: buttons(bus) == ["More options", "Record", "Recordings"])
+    ready = ["More options", "Record", "Recordings"]
+    place.wait_for("the ready screen's names", lambda: buttons(bus) == ready)
+    walk_recordings(place, bus)
+    place.wait_for("the ready screen again", lambda: buttons(bus) == ready)
+    time.sleep(0.5)
     place.big_button()
     recording = ["Bookmark", "Discard", "More options", "Pause", "Stop"]
     place.wait_for("the recording screen's names", lambda: buttons(bus) == recording)
@@ -41,6 +65,7 @@ def main():
     try:
         place.env.update(DBUS_SESSION_BUS_ADDRESS=session, ELM_ATSPI_MODE="1")
         place.make_noise(60)
+        place.tool("record", "2")
         place.start(os.path.join(BIN, "mewlo-lite"))
         walk(place, bus)
     except (AssertionError, TimeoutError) as error:

@@ -88,7 +88,9 @@ Evas_Object* MwContentViewController::onPushToNaviframe(Evas_Object* naviframe)
         return nullptr;
     }
     Elm_Object_Item* top = elm_naviframe_top_item_get(naviframe);
-    const char* title = getTitle().c_str();
+    // Translated already: a screen reader reads what stands here.
+    const std::string text = getTitle().empty() ? std::string() : mwTranslate(getTitle().c_str());
+    const char* title = text.c_str();
     Elm_Object_Item* item = top
         ? elm_naviframe_item_insert_after(naviframe, top, title, nullptr, nullptr, getEvasObject(), nullptr)
         : elm_naviframe_item_push(naviframe, title, nullptr, nullptr, getEvasObject(), nullptr);
