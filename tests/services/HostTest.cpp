@@ -378,15 +378,14 @@ TEST(HostlessTest, DoctorNamesWhatIsMissing)
 TEST(CallManagerTest, AnswersTheNumberOfCalls)
 {
     cm_client_h client = nullptr;
-    cm_call_status_e status = CM_CALL_STATUS_IDLE;
     ASSERT_EQ(0, cm_init(&client));
-    EXPECT_EQ(0, cm_get_call_status(client, &status));
-    EXPECT_EQ(0, static_cast<int>(status));
-    vconf_set_int(CALLS, 2);
-    EXPECT_EQ(0, cm_get_call_status(client, &status));
-    EXPECT_EQ(2, static_cast<int>(status));
+    for (const int calls : {2, 0}) {
+        cm_call_status_e status = CM_CALL_STATUS_IDLE;
+        vconf_set_int(CALLS, calls);
+        EXPECT_EQ(0, cm_get_call_status(client, &status));
+        EXPECT_EQ(calls, static_cast<int>(status));
+    }
     EXPECT_EQ(0, cm_deinit(client));
-    vconf_set_int(CALLS, 0);
 }
 
 TEST(DisplayTest, TellsTheStateUntilRemoved)

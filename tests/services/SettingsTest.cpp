@@ -56,25 +56,6 @@ TEST(VconfTest, FailsOnMissingAndUnparsableValues)
     }
 }
 
-TEST(VconfTest, CallsBackWithTheNewValueUntilIgnored)
-{
-    std::vector<int> seen;
-    const vconf_callback_fn callback = [](keynode_t* node, void* data) {
-        EXPECT_STREQ(VCONFKEY_IDLE_LOCK_STATE, vconf_keynode_get_name(node));
-        static_cast<std::vector<int>*>(data)->push_back(vconf_keynode_get_int(node));
-    };
-    ASSERT_EQ(0, vconf_notify_key_changed(VCONFKEY_IDLE_LOCK_STATE, callback, &seen));
-    vconf_set_int(VCONFKEY_IDLE_LOCK_STATE, 2);
-    ASSERT_TRUE(runUntil([&] { return seen == std::vector{2}; }));
-    vconf_set_bool(VCONFKEY_IDLE_LOCK_STATE, 1);
-    ASSERT_TRUE(runUntil([&] { return seen == std::vector{2, 1}; }));
-    EXPECT_EQ(0, vconf_ignore_key_changed(VCONFKEY_IDLE_LOCK_STATE, callback));
-    EXPECT_EQ(-1, vconf_ignore_key_changed(VCONFKEY_IDLE_LOCK_STATE, callback));
-    vconf_set_int(VCONFKEY_IDLE_LOCK_STATE, 0);
-    runFor(0.05);
-    EXPECT_EQ(2U, seen.size());
-}
-
 TEST(PreferenceTest, KeepsTypesAndReportsEveryWrite)
 {
     int number = 0;

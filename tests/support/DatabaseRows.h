@@ -16,7 +16,11 @@ struct DatabaseRow {
     long long time = 0; // seconds since the epoch; the newest is listed first
 };
 
-inline std::string databasePath() { return std::string(std::getenv("XDG_DATA_HOME")) + "/mewlo-lite/media.db"; }
+inline std::string databasePath()
+{
+    const char* chosen = std::getenv("MEWLO_MEDIA_DB");
+    return chosen != nullptr ? chosen : std::string(std::getenv("XDG_DATA_HOME")) + "/mewlo-lite/media.db";
+}
 
 // Enters rows past the media interface, thousands in a moment. The identifiers are the paths.
 inline bool enterRows(const std::vector<DatabaseRow>& rows)
@@ -27,6 +31,7 @@ inline bool enterRows(const std::vector<DatabaseRow>& rows)
     sqlite3_stmt* insert = nullptr;
     if (sqlite3_open(databasePath().c_str(), &database) != SQLITE_OK)
         return false;
+    sqlite3_busy_timeout(database, 2000);
     sqlite3_exec(database, "BEGIN", nullptr, nullptr, nullptr);
     const bool prepared
         = sqlite3_prepare_v2(database,

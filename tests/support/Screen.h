@@ -3,6 +3,7 @@
 #include <Elementary.h>
 
 #include <string>
+#include <vector>
 
 #include "support/RunUntil.h"
 
@@ -66,6 +67,32 @@ inline std::string partState(Evas_Object* layout, const char* part)
     edje_object_message_signal_process(edje);
     const char* state = edje_object_part_state_get(edje, part, nullptr);
     return state != nullptr ? state : "";
+}
+
+inline Evas_Object* popupOf(Evas_Object* window)
+{
+    Evas_Object* found = nullptr;
+    for (Evas_Object* each = evas_object_top_get(evas_object_evas_get(window)); each && !found;
+         each = evas_object_below_get(each)) {
+        if (evas_object_smart_type_check(each, "elm_popup") && !evas_object_smart_parent_get(each))
+            found = each;
+    }
+    return found;
+}
+
+// The entries of the menu that is open, none without one.
+inline std::vector<Evas_Object*> menuButtons(Evas_Object* window)
+{
+    Evas_Object* popup = popupOf(window);
+    Evas_Object* box = popup ? elm_object_content_get(popup) : nullptr;
+    std::vector<Evas_Object*> buttons;
+    if (!box || !evas_object_smart_type_check(box, "elm_box"))
+        return buttons;
+    Eina_List* children = elm_box_children_get(box);
+    void* child = nullptr;
+    EINA_LIST_FREE(children, child)
+    buttons.push_back(static_cast<Evas_Object*>(child));
+    return buttons;
 }
 
 }

@@ -10,25 +10,15 @@
 
 namespace {
 
-TEST(EffectMathTest, LevelsBecomeSteps)
+TEST(EffectMathTest, LevelsBecomeStepsAndTargetsEndAtTheClamp)
 {
-    const struct {
-        double level;
-        int step;
-    } cases[] = {{-300.0, 0}, {-45.0, 0}, {-44.99, 2}, {-10.0, 12}, {-9.0, 12}, {0.0, 12}, {-10.01, 11}, {-25.05, 6},
-        {-25.06, 5}};
-    for (const auto& each : cases)
-        EXPECT_EQ(each.step, MwCircleRecordingEffect::stepOf(each.level)) << each.level;
-}
-
-TEST(EffectMathTest, TargetsGrowWithStepAndDrawUpToTheClamp)
-{
-    EXPECT_NEAR(-0.36, MwCircleRecordingEffect::targetOf(0, 0), 1e-9);
+    const std::pair<double, int> steps[]
+        = {{-300.0, 0}, {-45.0, 0}, {-44.99, 2}, {-10.0, 12}, {0.0, 12}, {-10.01, 11}, {-25.05, 6}, {-25.06, 5}};
+    for (const auto& [level, step] : steps)
+        EXPECT_EQ(step, MwCircleRecordingEffect::stepOf(level)) << level;
     EXPECT_NEAR(-1.08, MwCircleRecordingEffect::targetOf(12, 0), 1e-9); // nothing clamps below
     EXPECT_NEAR(0.14 - 0.36, MwCircleRecordingEffect::targetOf(0, 1), 1e-9);
     EXPECT_DOUBLE_EQ(1.8, MwCircleRecordingEffect::targetOf(12, 11));
-    EXPECT_FLOAT_EQ(0.07F, MwCircleRecordingEffect::speedOf(0));
-    EXPECT_FLOAT_EQ(0.31F, MwCircleRecordingEffect::speedOf(12));
 }
 
 class EffectTest : public ::testing::Test {

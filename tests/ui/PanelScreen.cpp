@@ -1,7 +1,6 @@
 #include "PanelScreen.h"
 
 #include <Elementary.h>
-#include <sqlite3.h>
 
 #include <filesystem>
 
@@ -12,6 +11,7 @@
 #include "MwResourceMgr.h"
 #include "MwSystemMgr.h"
 #include "fakes/Fakes.h"
+#include "support/DatabaseRows.h"
 #include "support/Recordings.h"
 #include "support/Screen.h"
 
@@ -69,27 +69,11 @@ PanelScreen::~PanelScreen()
 
 std::string PanelScreen::addRecording(const std::string& file, int duration, const std::string& content)
 {
-    const std::string id = support::addRecording(file, content);
-    _setDuration(support::recordingPath(file), duration);
+    const std::string path = support::recordingPath(file);
+    support::writeFile(path, content);
+    support::enterRows({{path, duration, static_cast<long long>(model.getRecordedFileList().size())}});
     model.createRecordedFileList();
-    return id;
-}
-
-// The database reads durations from files; a row is all these tests need.
-void PanelScreen::_setDuration(const std::string& path, int duration) const
-{
-    sqlite3* database = nullptr;
-    sqlite3_stmt* statement = nullptr;
-    sqlite3_open(_directory.file("media.db").c_str(), &database);
-    sqlite3_busy_timeout(database, 2000);
-    sqlite3_prepare_v2(database, "UPDATE media SET MEDIA_DURATION = ?, MEDIA_TIMELINE = ? WHERE MEDIA_PATH = ?", -1,
-        &statement, nullptr);
-    sqlite3_bind_int(statement, 1, duration);
-    sqlite3_bind_int(statement, 2, static_cast<int>(model.getRecordedFileList().size()));
-    sqlite3_bind_text(statement, 3, path.c_str(), -1, SQLITE_TRANSIENT);
-    sqlite3_step(statement);
-    sqlite3_finalize(statement);
-    sqlite3_close(database);
+    return path;
 }
 
 void PanelScreen::load(const std::string& file, MwPlayer::PlayState state, unsigned int position)

@@ -60,7 +60,6 @@ public:
 private:
     bool _execute(MwAppController::Command command);
     bool _play(const std::string& path);
-    void _setDuration(const std::string& path, int duration) const;
 
     support::TempDir _directory;
     std::unique_ptr<MwAppController> _controller;

@@ -33,31 +33,6 @@ namespace {
         }
     };
 
-    Evas_Object* popupOf(Evas_Object* window)
-    {
-        Evas_Object* found = nullptr;
-        for (Evas_Object* each = evas_object_top_get(evas_object_evas_get(window)); each && !found;
-             each = evas_object_below_get(each)) {
-            if (evas_object_smart_type_check(each, "elm_popup") && !evas_object_smart_parent_get(each))
-                found = each;
-        }
-        return found;
-    }
-
-    std::vector<Evas_Object*> menuButtons(Evas_Object* window)
-    {
-        Evas_Object* popup = popupOf(window);
-        Evas_Object* box = popup ? elm_object_content_get(popup) : nullptr;
-        std::vector<Evas_Object*> buttons;
-        if (!box || !evas_object_smart_type_check(box, "elm_box"))
-            return buttons;
-        Eina_List* children = elm_box_children_get(box);
-        void* child = nullptr;
-        EINA_LIST_FREE(children, child)
-        buttons.push_back(static_cast<Evas_Object*>(child));
-        return buttons;
-    }
-
 }
 
 RecordingsScreen::RecordingsScreen(Mode mode, int width, int height)
@@ -235,7 +210,7 @@ std::vector<std::string> RecordingsScreen::menu()
 {
     key("Menu");
     std::vector<std::string> entries;
-    for (Evas_Object* button : menuButtons(window))
+    for (Evas_Object* button : support::menuButtons(window))
         entries.push_back(support::text(button));
     return entries;
 }
@@ -244,7 +219,7 @@ void RecordingsScreen::chooseMenu(const std::string& entry)
 {
     menu();
     support::runFor(0.3);
-    for (Evas_Object* button : menuButtons(window)) {
+    for (Evas_Object* button : support::menuButtons(window)) {
         if (support::text(button) != entry)
             continue;
         support::click(button);

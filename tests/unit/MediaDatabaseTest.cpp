@@ -31,39 +31,45 @@ protected:
         media_content_disconnect();
         ASSERT_EQ(0, media_content_connect());
     }
-    static std::vector<std::string> names(const char* condition = "1")
+    // Names, or another text, of the rows that fulfil a condition.
+    static std::vector<std::string> names(
+        const std::string& condition = "1", int (*text)(media_info_h, char**) = media_info_get_display_name)
     {
         filter_h filter = nullptr;
         media_filter_create(&filter);
-        media_filter_set_condition(filter, condition, MEDIA_CONTENT_COLLATE_NOCASE);
+        media_filter_set_condition(filter, condition.c_str(), MEDIA_CONTENT_COLLATE_NOCASE);
         media_filter_set_order(filter, MEDIA_CONTENT_ORDER_ASC, "MEDIA_DISPLAY_NAME", MEDIA_CONTENT_COLLATE_DEFAULT);
-        std::vector<std::string> found;
+        std::pair<decltype(text), std::vector<std::string>> found{text, {}};
         const auto collect = [](media_info_h media, void* data) {
-            char* name = nullptr;
-            media_info_get_display_name(media, &name);
-            static_cast<std::vector<std::string>*>(data)->push_back(mwAdopt(name));
+            auto* all = static_cast<decltype(found)*>(data);
+            char* value = nullptr;
+            all->first(media, &value);
+            all->second.push_back(mwAdopt(value));
             return true;
         };
         EXPECT_EQ(0, media_info_foreach_media_from_db(filter, collect, &found));
         media_filter_destroy(filter);
-        return found;
+        return found.second;
     }
     static std::string idOf(const std::string& name)
     {
-        filter_h filter = nullptr;
-        media_filter_create(&filter);
-        media_filter_set_condition(
-            filter, ("MEDIA_DISPLAY_NAME=\"" + name + "\"").c_str(), MEDIA_CONTENT_COLLATE_NOCASE);
-        std::string id;
-        const auto take = [](media_info_h media, void* data) {
-            char* text = nullptr;
-            media_info_get_media_id(media, &text);
-            *static_cast<std::string*>(data) = mwAdopt(text);
-            return false;
-        };
-        media_info_foreach_media_from_db(filter, take, &id);
-        media_filter_destroy(filter);
-        return id;
+        return names("MEDIA_DISPLAY_NAME=\"" + name + "\"", media_info_get_media_id).at(0);
+    }
+    // Changes that were told, and by which process the last one was made.
+    struct Heard {
+        int pid = 0;
+        int count = 0;
+    } _heard;
+    void listen()
+    {
+        _heard = {};
+        const auto callback
+            = [](media_content_error_e, int pid, media_content_db_update_item_type_e, media_content_db_update_type_e,
+                  media_content_type_e, char*, char*, char*, void* data) {
+                  auto* heard = static_cast<Heard*>(data);
+                  *heard = {pid, heard->count + 1};
+              };
+        ASSERT_EQ(0, media_content_set_db_updated_cb(callback, &_heard));
     }
     const support::TempDir _directory;
 };
@@ -149,17 +155,8 @@ TEST(MediaDatabaseWriter, DISABLED_InsertsOneFile)
 
 TEST_F(MediaDatabaseTest, OtherProcessesAreToldOfCommits)
 {
-    struct Heard {
-        int pid = 0;
-        int count = 0;
-    } heard;
-    const auto callback = [](media_content_error_e, int pid, media_content_db_update_item_type_e,
-                              media_content_db_update_type_e, media_content_type_e, char*, char*, char*, void* data) {
-        static_cast<Heard*>(data)->pid = pid;
-        ++static_cast<Heard*>(data)->count;
-    };
     support::writeFile(support::recordingPath("foreign.m4a"), "x");
-    ASSERT_EQ(0, media_content_set_db_updated_cb(callback, &heard));
+    listen();
     // The writer is a fresh process: a database connection must not cross a fork.
     ::setenv("MEWLO_TEST_FOREIGN_FILE", support::recordingPath("foreign.m4a").c_str(), 1);
     const pid_t child = ::fork();
@@ -171,8 +168,8 @@ TEST_F(MediaDatabaseTest, OtherProcessesAreToldOfCommits)
     int status = -1;
     ::waitpid(child, &status, 0);
     ASSERT_EQ(0, status);
-    EXPECT_TRUE(support::runUntil([&] { return heard.count > 0; }));
-    EXPECT_EQ(child, heard.pid);
+    EXPECT_TRUE(support::runUntil([&] { return _heard.count > 0; }));
+    EXPECT_EQ(child, _heard.pid);
     EXPECT_EQ(Names{"foreign.m4a"}, names());
     media_content_unset_db_updated_cb();
 }
@@ -184,13 +181,9 @@ TEST_F(MediaDatabaseTest, IsWatchedFromTheVeryFirstStart)
         // The folder of the database does not exist yet, and the database opens beside the caller.
         ::setenv("MEWLO_MEDIA_DB", _directory.file(std::to_string(i) + "/a/media.db").c_str(), 1);
         ASSERT_EQ(0, media_content_connect());
-        int heard = 0;
-        const auto callback
-            = [](media_content_error_e, int, media_content_db_update_item_type_e, media_content_db_update_type_e,
-                  media_content_type_e, char*, char*, char*, void* data) { ++*static_cast<int*>(data); };
-        ASSERT_EQ(0, media_content_set_db_updated_cb(callback, &heard));
+        listen();
         addRecording("a.m4a");
-        EXPECT_TRUE(support::runUntil([&] { return heard > 0; }));
+        EXPECT_TRUE(support::runUntil([&] { return _heard.count > 0; }));
         media_content_unset_db_updated_cb();
         media_content_disconnect();
     }
@@ -219,11 +212,7 @@ TEST_F(MediaDatabaseTest, ScanningKeepsRowsOfAFolderThatIsAway)
 // What happens in the folders from outside: files come, change, go, and are renamed.
 TEST_F(MediaDatabaseTest, FollowsTheFilesWhileWatched)
 {
-    int heard = 0;
-    const auto callback
-        = [](media_content_error_e, int, media_content_db_update_item_type_e, media_content_db_update_type_e,
-              media_content_type_e, char*, char*, char*, void* data) { ++*static_cast<int*>(data); };
-    ASSERT_EQ(0, media_content_set_db_updated_cb(callback, &heard));
+    listen();
     const auto become
         = [&](const Names& expected) { return support::runUntil([&] { return names() == expected; }, 2.0); };
     std::filesystem::remove_all(support::deviceRoot() + "/Sounds");
@@ -232,7 +221,7 @@ TEST_F(MediaDatabaseTest, FollowsTheFilesWhileWatched)
     support::runFor(0.5);
     support::writeFile(support::recordingPath("a.m4a"), "x");
     EXPECT_TRUE(become({"a.m4a"}));
-    EXPECT_TRUE(support::runUntil([&] { return heard > 0; }));
+    EXPECT_TRUE(support::runUntil([&] { return _heard.count > 0; }));
 
     const std::string id = idOf("a.m4a");
     EXPECT_EQ(0, media_bookmark_insert_to_db(id.c_str(), 7, "Here"));
