@@ -9,7 +9,6 @@
 
 #include "MwContentViewController.h"
 #include "MwResourceMgr.h"
-#include "MwSystemMgr.h"
 #include "fakes/Fakes.h"
 #include "support/DatabaseRows.h"
 #include "support/Recordings.h"
@@ -36,34 +35,18 @@ namespace {
 }
 
 PanelScreen::PanelScreen(int width, int height)
+    : ScreenWindow(width, height)
 {
-    fakes::reset();
-    fakes::controller = {};
-    fakes::controller.onCommand = [this](MwAppController::Command command) { return _execute(command); };
     ::setenv("MEWLO_MEDIA_DB", _directory.file("media.db").c_str(), 1);
     std::filesystem::remove_all(support::deviceRoot() + "/Sounds");
     media_content_connect();
-    model.setAppState(MwModel::APP_STATE_RESUMED);
-    MwSystemMgr::getInstance()->initialize(&model);
-    _controller = std::make_unique<MwAppController>();
-    window = elm_win_util_standard_add("test", "test");
-    evas_object_resize(window, width, height);
-    naviframe = new panekit::WNaviframeController;
-    naviframe->create(window);
-    elm_win_resize_object_add(window, naviframe->getEvasObject());
-    evas_object_show(window);
-    naviframe->push(new EmptyScreen(&model, _controller.get()));
+    naviframe->push(new EmptyScreen(&model, controller()));
 }
 
 PanelScreen::~PanelScreen()
 {
-    MwSignalMgr::getInstance()->getLifeCycleSignal().emit(MwSignalMgr::TERMINATE);
-    evas_object_del(window);
-    support::runFor(0.01);
-    MwSystemMgr::getInstance()->deinitialize();
+    close();
     media_content_disconnect();
-    MwSignalMgr::destroyInstance();
-    MwSystemMgr::destroyInstance();
     ::unsetenv("MEWLO_MEDIA_DB");
 }
 
@@ -84,7 +67,7 @@ void PanelScreen::load(const std::string& file, MwPlayer::PlayState state, unsig
     announce();
 }
 
-void PanelScreen::announce() { _controller->getPlayerUpdatedSignal().emit(); }
+void PanelScreen::announce() { controller()->getPlayerUpdatedSignal().emit(); }
 
 std::vector<MwSavedBookmark> PanelScreen::bookmarksOf(const std::string& mediaId)
 {
@@ -100,7 +83,7 @@ void PanelScreen::dock(MwPlayViewController::ViewType type)
     evas_object_size_hint_weight_set(host, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
     elm_win_resize_object_add(window, host);
     evas_object_show(host);
-    panel = new MwPlayViewController(&model, _controller.get());
+    panel = new MwPlayViewController(&model, controller());
     panel->dock(host, type);
     panelView = panel->getEvasObject();
     panel->getEventSignal().addListener([this](auto event) { events.push_back(event); });
@@ -133,10 +116,6 @@ Evas_Object* PanelScreen::push(panekit::WContentViewController* screen)
     return screen->getEvasObject();
 }
 
-void PanelScreen::back() { support::key(window, "Escape"); }
-
-void PanelScreen::more() { support::key(window, "Menu"); }
-
 bool PanelScreen::_play(const std::string& path)
 {
     model.setCurrentPlayPath(path);
@@ -146,8 +125,7 @@ bool PanelScreen::_play(const std::string& path)
     return true;
 }
 
-// What the controller does to the model.
-bool PanelScreen::_execute(MwAppController::Command command)
+bool PanelScreen::execute(MwAppController::Command command)
 {
     if (command == failing)
         return false;

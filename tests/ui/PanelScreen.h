@@ -1,33 +1,22 @@
 #pragma once
 
-#include <memory>
-#include <string>
 #include <vector>
 
-#include <panekit/WNaviframeController.h>
-
-#include "FakeController.h"
-#include "MwModel.h"
 #include "MwPlayViewController.h"
 #include "MwPlayer.h"
 #include "MwSavedBookmarks.h"
-#include "MwSignalMgr.h"
+#include "ScreenWindow.h"
 #include "support/TempDir.h"
 
 namespace ui {
 
 // A window for the player panel and the screens beside it, over a media database of its own. The controller plays
 // nothing: it moves the model's state and position as the real one does.
-class PanelScreen {
+class PanelScreen : public ScreenWindow {
 public:
     explicit PanelScreen(int width = 360, int height = 640);
-    ~PanelScreen();
-    PanelScreen(const PanelScreen&) = delete;
-    PanelScreen& operator=(const PanelScreen&) = delete;
+    ~PanelScreen() override;
 
-    MwModel model;
-    Evas_Object* window = nullptr;
-    panekit::WNaviframeController* naviframe = nullptr;
     MwPlayViewController* panel = nullptr;
     Evas_Object* panelView = nullptr;
     std::vector<MwPlayViewController::eventType> events; // of the panel
@@ -53,16 +42,14 @@ public:
 
     // Puts a screen on top and waits until it is drawn; answers its view.
     Evas_Object* push(panekit::WContentViewController* screen);
-    [[nodiscard]] MwAppController* controller() const { return _controller.get(); }
-    void back();
-    void more();
+
+protected:
+    bool execute(MwAppController::Command command) override;
 
 private:
-    bool _execute(MwAppController::Command command);
     bool _play(const std::string& path);
 
     support::TempDir _directory;
-    std::unique_ptr<MwAppController> _controller;
 };
 
 }

@@ -11,8 +11,6 @@
 
 #include "MwPlayer.h"
 #include "MwRecordingsContentViewController.h"
-#include "MwSystemMgr.h"
-#include "fakes/Fakes.h"
 #include "support/DatabaseRows.h"
 #include "support/Recordings.h"
 #include "support/Screen.h"
@@ -36,38 +34,22 @@ namespace {
 }
 
 RecordingsScreen::RecordingsScreen(Mode mode, int width, int height)
+    : ScreenWindow(width, height)
 {
-    fakes::reset();
-    fakes::controller = {};
-    fakes::controller.onCommand = [this](MwAppController::Command command) { return _execute(command); };
     model.setRequestMode(mode == Mode::Request);
-    model.setAppState(MwModel::APP_STATE_RESUMED);
     media_content_connect();
-    MwSystemMgr::getInstance()->initialize(&model);
-    _controller = std::make_unique<MwAppController>();
-    window = elm_win_util_standard_add("test", "test");
-    evas_object_resize(window, width, height);
-    naviframe = new panekit::WNaviframeController;
-    naviframe->create(window);
-    elm_win_resize_object_add(window, naviframe->getEvasObject());
-    evas_object_show(window);
     naviframe->push(new BottomScreen);
 }
 
 RecordingsScreen::~RecordingsScreen()
 {
-    MwSignalMgr::getInstance()->getLifeCycleSignal().emit(MwSignalMgr::TERMINATE);
-    evas_object_del(window);
-    support::runFor(0.01);
-    MwSystemMgr::getInstance()->deinitialize();
-    MwSignalMgr::destroyInstance();
-    MwSystemMgr::destroyInstance();
+    close();
     media_content_disconnect();
 }
 
 void RecordingsScreen::open()
 {
-    auto* screen = new MwRecordingsContentViewController(&model, _controller.get());
+    auto* screen = new MwRecordingsContentViewController(&model, controller());
     naviframe->push(screen);
     view = screen->getEvasObject();
     evas_object_event_callback_add(
@@ -76,8 +58,7 @@ void RecordingsScreen::open()
     support::settle(window);
 }
 
-// What the controller does to the model.
-bool RecordingsScreen::_execute(MwAppController::Command command)
+bool RecordingsScreen::execute(MwAppController::Command command)
 {
     switch (command) {
     case MwAppController::START_PLAYING:
@@ -98,7 +79,7 @@ bool RecordingsScreen::_execute(MwAppController::Command command)
     return true;
 }
 
-void RecordingsScreen::playerChanged() { _controller->getPlayerUpdatedSignal().emit(); }
+void RecordingsScreen::playerChanged() { controller()->getPlayerUpdatedSignal().emit(); }
 
 void RecordingsScreen::announce(MwSignalMgr::SystemInfo info)
 {

@@ -1,32 +1,22 @@
 #pragma once
 
-#include <memory>
 #include <string>
 #include <vector>
 
-#include <panekit/WNaviframeController.h>
-
-#include "FakeController.h"
-#include "MwModel.h"
-#include "MwSignalMgr.h"
+#include "ScreenWindow.h"
 
 namespace ui {
 
 // The recordings list above another screen, in a window of its own, over the real model and media database and a
 // controller that plays nothing. Recordings are put into the database before it opens.
-class RecordingsScreen {
+class RecordingsScreen : public ScreenWindow {
 public:
     enum class Mode { Normal, Request };
 
     explicit RecordingsScreen(Mode mode = Mode::Normal, int width = 360, int height = 640);
-    ~RecordingsScreen();
-    RecordingsScreen(const RecordingsScreen&) = delete;
-    RecordingsScreen& operator=(const RecordingsScreen&) = delete;
+    ~RecordingsScreen() override;
 
-    MwModel model;
-    Evas_Object* window = nullptr;
     Evas_Object* view = nullptr; // null once the screen has been left
-    panekit::WNaviframeController* naviframe = nullptr;
 
     void open();
     // Announces what the system manager would.
@@ -53,10 +43,11 @@ public:
     std::vector<std::string> menu();
     void chooseMenu(const std::string& entry);
 
+protected:
+    bool execute(MwAppController::Command command) override;
+
 private:
-    bool _execute(MwAppController::Command command);
     [[nodiscard]] Evas_Object* _item() const;
-    std::unique_ptr<MwAppController> _controller;
 };
 
 // Enters recordings of one minute each, the first is the newest; answers the first's path.
