@@ -104,7 +104,7 @@ bool MwContentViewController::onPop()
     Evas_Object* naviframe = elm_object_item_widget_get(getNaviItem());
     if (Elm_Object_Item* below = secondItem(naviframe); below) {
         Evas_Object* view = elm_object_item_part_content_get(below, "elm.swallow.content");
-        if (auto* screen = static_cast<MwContentViewController*>(fromView(view)); screen)
+        if (auto* screen = dynamic_cast<MwContentViewController*>(fromView(view)); screen)
             screen->onTop();
     }
     if (elm_naviframe_bottom_item_get(naviframe) == getNaviItem())
