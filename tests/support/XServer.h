@@ -14,7 +14,8 @@ public:
     XServer()
     {
         const std::string number = _directory.file("number");
-        _server = Program({"Xvfb", "-displayfd", "1", "-screen", "0", "640x480x24"}, number);
+        // Else the server starts anew when its last client goes, and a client that is just coming is thrown out.
+        _server = Program({"Xvfb", "-displayfd", "1", "-noreset", "-screen", "0", "640x480x24"}, number);
         runUntil([&] { return readFile(number).ends_with('\n') || !_server.isRunning(); }, 30);
         _name = ":" + readFile(number);
         _name.pop_back();
