@@ -10,8 +10,8 @@ std::string mwFormat(const char* format, ...) __attribute__((format(printf, 1, 2
 // The translated text of a string identifier.
 std::string mwTranslate(const char* id);
 
-// The translated text of an identifier with the number in place of its "%d". What comes from a translation is never used
-// as a format.
+// The translated text of an identifier with the number in place of its "%d". What comes from a translation is never
+// used as a format.
 std::string mwTranslateNumber(const char* id, size_t number);
 
 // Shows the translated text of an identifier to the user as a status message. Any thread.
