@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "MwLog.h"
+#include "MwModel.h"
 #include "MwStorageRoots.h"
 #include "MwText.h"
 
@@ -52,10 +53,5 @@ std::string mwSizeText(double bytes)
 
 std::string mwLengthText(int duration)
 {
-    const auto seconds = static_cast<unsigned int>(std::max(duration, SHORTEST_SHOWN) / 1000);
-    const unsigned int hours = seconds / 3600;
-    const unsigned int minutes = seconds / 60 % 60;
-    if (hours > 0)
-        return mwFormat("%02u:%02u:%02u", hours, minutes, seconds % 60);
-    return mwFormat("%02u:%02u", minutes, seconds % 60);
+    return MwModel::getDurationText(static_cast<unsigned int>(std::max(duration, SHORTEST_SHOWN)), false);
 }

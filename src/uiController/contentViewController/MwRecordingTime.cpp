@@ -1,7 +1,6 @@
 #include "MwRecordingTime.h"
 
 #include "MwModel.h"
-#include "MwText.h"
 
 namespace {
 
@@ -16,11 +15,7 @@ constexpr int MP4_FACTOR = 23;
 
 std::string mwRecordingTimeText(unsigned int seconds)
 {
-    const unsigned int hours = seconds / 3600;
-    const unsigned int minutes = (seconds / 60) % 60;
-    if (hours > 0)
-        return mwFormat("%02u:%02u:%02u", hours, minutes, seconds % 60);
-    return mwFormat("%02u:%02u", minutes, seconds % 60);
+    return MwModel::getDurationText(seconds * 1000, false);
 }
 
 unsigned int mwShownSeconds(unsigned long long elapsed, unsigned int maximum)
