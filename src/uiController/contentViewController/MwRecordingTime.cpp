@@ -13,10 +13,7 @@ constexpr int MP4_FACTOR = 23;
 
 }
 
-std::string mwRecordingTimeText(unsigned int seconds)
-{
-    return MwModel::getDurationText(seconds * 1000, false);
-}
+std::string mwRecordingTimeText(unsigned int seconds) { return MwModel::getDurationText(seconds * 1000, false); }
 
 unsigned int mwShownSeconds(unsigned long long elapsed, unsigned int maximum)
 {
