@@ -4,11 +4,13 @@
 #include <cerrno>
 #include <fcntl.h>
 #include <linux/fs.h>
+#include <linux/magic.h>
 #include <memory>
 #include <new>
 #include <sys/ioctl.h>
 #include <sys/sendfile.h>
 #include <sys/stat.h>
+#include <sys/vfs.h>
 #include <unistd.h>
 #include <utility>
 
@@ -73,7 +75,11 @@ bool MwFileCopy::_shareBlocks()
 // A full disk shows before anything is copied, and blocks that lie together are written twice as fast.
 bool MwFileCopy::_reserve() const
 {
-    if (_source.st_size == 0 || ::fallocate(_to, 0, 0, _source.st_size) == 0 || isUnsupported(errno))
+    // In memory the reserved room would be filled with zeros first, which takes half as long as the copy.
+    struct statfs system { };
+    if (_source.st_size == 0 || (::fstatfs(_to, &system) == 0 && system.f_type == TMPFS_MAGIC))
+        return true;
+    if (::fallocate(_to, 0, 0, _source.st_size) == 0 || isUnsupported(errno))
         return true;
     MW_LOGE("no room for the copy : %d", errno);
     return false;
