@@ -25,6 +25,10 @@ typedef struct audio_meta_s* audio_meta_h;
 typedef struct filter_s* filter_h;
 typedef struct files_lock_s* files_lock_h;
 typedef struct media_bookmark_s* media_bookmark_h;
+typedef struct {
+    unsigned int marked_time; // seconds
+    const char* name;
+} media_bookmark_entry_s;
 typedef bool (*media_info_cb)(media_info_h media, void* user_data);
 typedef bool (*media_bookmark_cb)(media_bookmark_h bookmark, void* user_data);
 // Runs on the main loop after a commit of any process; uuid, path and mime may be null.
@@ -73,6 +77,11 @@ int media_info_delete_from_db(const char* media_id);
 // Several rows in one commit: all or none.
 int media_info_delete_list_from_db(const char* const* media_ids, int count);
 int media_info_move_to_db(media_info_h media, const char* path);
+// A recording and its bookmarks in one commit, all or nothing: the row old_media_id (null for none) goes with its
+// bookmarks, the file at path gets a row, under a new identifier, with these. A row that path already has goes as well.
+// new_media_id may be null, else it is newly allocated. Everything else is borrowed for the call.
+int media_info_replace_in_db(const char* old_media_id, const char* path, const media_bookmark_entry_s* bookmarks,
+    int count, char** new_media_id);
 int media_info_destroy(media_info_h media);
 int media_info_get_media_id(media_info_h media, char** media_id);
 int media_info_get_file_path(media_info_h media, char** path);

@@ -317,12 +317,30 @@ int Database::rename(const std::string& mediaId, const MediaRow& row)
     });
 }
 
-int Database::insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name)
+int Database::replace(const std::string& formerId, const MediaRow& row, const std::vector<BookmarkRow>& bookmarks)
 {
     return _transaction([&] {
-        Statement statement(_db, "INSERT INTO bookmark(MEDIA_ID, BOOKMARK_MARKED_TIME, BOOKMARK_NAME) VALUES(?,?,?)");
-        return statement.bind(mediaId).bind(static_cast<long long>(markedTime)).bind(name).run();
+        int result = Statement(_db, "DELETE FROM media WHERE MEDIA_ID = ?").bind(formerId).run();
+        if (result == SQLITE_OK)
+            result = _removePath(row.path);
+        MediaRow inserted = row;
+        if (result == SQLITE_OK)
+            result = _putRow(inserted);
+        for (auto mark = bookmarks.begin(); result == SQLITE_OK && mark != bookmarks.end(); ++mark)
+            result = _insertBookmark(inserted.id, mark->markedTime, mark->name);
+        return result;
     });
+}
+
+int Database::_insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name)
+{
+    Statement statement(_db, "INSERT INTO bookmark(MEDIA_ID, BOOKMARK_MARKED_TIME, BOOKMARK_NAME) VALUES(?,?,?)");
+    return statement.bind(mediaId).bind(static_cast<long long>(markedTime)).bind(name).run();
+}
+
+int Database::insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name)
+{
+    return _transaction([&] { return _insertBookmark(mediaId, markedTime, name); });
 }
 
 int Database::removeBookmark(int bookmarkId)

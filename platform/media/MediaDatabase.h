@@ -74,6 +74,9 @@ public:
     // A row that had the new path goes: its file was replaced.
     int rename(const std::string& mediaId, const MediaRow& row);
 
+    // The row of an identifier (may be empty) and the one of the path go; the new one comes with its bookmarks.
+    int replace(const std::string& formerId, const MediaRow& row, const std::vector<BookmarkRow>& bookmarks);
+
     int insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name);
     int removeBookmark(int bookmarkId);
     int selectBookmarks(const std::string& mediaId, const Query& query, std::vector<BookmarkRow>& rows);
@@ -88,6 +91,7 @@ private:
     int _putRow(MediaRow& row);
     int _moveRow(const std::string& formerPath, const MediaRow& row);
     int _removePath(const std::string& path);
+    int _insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name);
     void _setAside();
     void _close();
 

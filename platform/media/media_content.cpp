@@ -445,6 +445,23 @@ int media_info_move_to_db(media_info_h media, const char* path)
     return result;
 }
 
+int media_info_replace_in_db(
+    const char* old_media_id, const char* path, const media_bookmark_entry_s* bookmarks, int count, char** new_media_id)
+{
+    if (path == nullptr || count < 0 || (count > 0 && bookmarks == nullptr))
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    const auto row = media::describeFile(path);
+    if (!row)
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    std::vector<media::BookmarkRow> marks;
+    for (int i = 0; i < count; ++i)
+        marks.push_back({0, bookmarks[i].marked_time, bookmarks[i].name != nullptr ? bookmarks[i].name : ""});
+    const int result = write([&](media::Database& database) {
+        return database.replace(old_media_id != nullptr ? old_media_id : "", *row, marks);
+    });
+    return result == MEDIA_CONTENT_ERROR_NONE && new_media_id != nullptr ? giveText(row->id, new_media_id) : result;
+}
+
 int media_info_destroy(media_info_h media)
 {
     delete media;

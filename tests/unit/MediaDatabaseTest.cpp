@@ -1,9 +1,11 @@
 #include <gtest/gtest.h>
 #include <media_content.h>
+#include <sqlite3.h>
 
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <array>
 #include <thread>
 
 #include "support/Recordings.h"
@@ -113,6 +115,42 @@ TEST_F(MediaDatabaseTest, BookmarksGoWithTheirRecording)
     int count = -1;
     media_info_get_bookmark_count_from_db(id.c_str(), nullptr, &count);
     EXPECT_EQ(0, count);
+}
+
+TEST_F(MediaDatabaseTest, ReplacesARecordingWithItsBookmarksInOneStep)
+{
+    addRecording("a.m4a");
+    const std::string path = support::recordingPath("a.m4a");
+    const std::array<media_bookmark_entry_s, 2> marks = {{{1, "one"}, {2, "two"}}};
+    ASSERT_EQ(0, media_info_replace_in_db(nullptr, path.c_str(), marks.data(), 2, nullptr));
+    const std::string former = idOf("a.m4a");
+    int count = 0;
+    EXPECT_EQ(0, media_info_get_bookmark_count_from_db(former.c_str(), nullptr, &count));
+    EXPECT_EQ(2, count);
+
+    // A bookmark that cannot be written takes everything back with it.
+    sqlite3* direct = nullptr;
+    ASSERT_EQ(SQLITE_OK, sqlite3_open(_directory.file("media.db").c_str(), &direct));
+    sqlite3_exec(direct,
+        "CREATE TRIGGER no_two BEFORE INSERT ON bookmark WHEN NEW.BOOKMARK_NAME='two' "
+        "BEGIN SELECT RAISE(ABORT, 'no'); END",
+        nullptr, nullptr, nullptr);
+    EXPECT_NE(0, media_info_replace_in_db(former.c_str(), path.c_str(), marks.data(), 2, nullptr));
+    EXPECT_EQ(Names{former}, names("1", media_info_get_media_id));
+    EXPECT_EQ(0, media_info_get_bookmark_count_from_db(former.c_str(), nullptr, &count));
+    EXPECT_EQ(2, count);
+
+    sqlite3_exec(direct, "DROP TRIGGER no_two", nullptr, nullptr, nullptr);
+    sqlite3_close(direct);
+    char* id = nullptr;
+    ASSERT_EQ(0, media_info_replace_in_db(former.c_str(), path.c_str(), marks.data(), 1, &id));
+    const std::string latter = mwAdopt(id);
+    EXPECT_NE(former, latter);
+    EXPECT_EQ(Names{latter}, names("1", media_info_get_media_id));
+    EXPECT_EQ(0, media_info_get_bookmark_count_from_db(latter.c_str(), nullptr, &count));
+    EXPECT_EQ(1, count);
+    EXPECT_NE(0, media_info_replace_in_db(latter.c_str(), (path + ".gone").c_str(), nullptr, 0, nullptr));
+    EXPECT_EQ(Names{latter}, names("1", media_info_get_media_id));
 }
 
 TEST_F(MediaDatabaseTest, ADamagedDatabaseIsSetAsideAndRebuiltFromTheFiles)
