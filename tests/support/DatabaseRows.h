@@ -22,6 +22,17 @@ inline std::string databasePath()
     return chosen != nullptr ? chosen : std::string(std::getenv("XDG_DATA_HOME")) + "/mewlo-lite/media.db";
 }
 
+// Changes the database past the media interface.
+inline bool execute(const std::string& sql)
+{
+    sqlite3* database = nullptr;
+    const bool done = sqlite3_open(databasePath().c_str(), &database) == SQLITE_OK
+        && sqlite3_busy_timeout(database, 2000) == SQLITE_OK
+        && sqlite3_exec(database, sql.c_str(), nullptr, nullptr, nullptr) == SQLITE_OK;
+    sqlite3_close(database);
+    return done;
+}
+
 // Enters rows past the media interface, thousands in a moment. The identifiers are the paths.
 inline bool enterRows(const std::vector<DatabaseRow>& rows)
 {

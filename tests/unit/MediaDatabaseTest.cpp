@@ -1,19 +1,19 @@
 #include <gtest/gtest.h>
 #include <media_content.h>
-#include <sqlite3.h>
 
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <array>
 #include <thread>
 
+#include "support/DatabaseRows.h"
 #include "support/Recordings.h"
 #include "support/RunUntil.h"
 
 namespace {
 
 using support::addRecording;
+using support::recordingPath;
 
 class MediaDatabaseTest : public ::testing::Test {
 protected:
@@ -56,6 +56,12 @@ protected:
     static std::string idOf(const std::string& name)
     {
         return names("MEDIA_DISPLAY_NAME=\"" + name + "\"", media_info_get_media_id).at(0);
+    }
+    static int bookmarksOf(const std::string& id)
+    {
+        int count = -1;
+        media_info_get_bookmark_count_from_db(id.c_str(), nullptr, &count);
+        return count;
     }
     // Changes that were told, and by which process the last one was made.
     struct Heard {
@@ -112,45 +118,49 @@ TEST_F(MediaDatabaseTest, BookmarksGoWithTheirRecording)
     media_info_foreach_bookmark_from_db(id.c_str(), nullptr, collect, &order);
     EXPECT_EQ("early late ", order);
     EXPECT_EQ(0, media_info_delete_from_db(id.c_str()));
-    int count = -1;
-    media_info_get_bookmark_count_from_db(id.c_str(), nullptr, &count);
-    EXPECT_EQ(0, count);
+    EXPECT_EQ(0, bookmarksOf(id));
 }
 
-TEST_F(MediaDatabaseTest, ReplacesARecordingWithItsBookmarksInOneStep)
+TEST_F(MediaDatabaseTest, AFileThatReplacesAnotherBringsRowAndBookmarksInOneCommit)
 {
-    addRecording("a.m4a");
-    const std::string path = support::recordingPath("a.m4a");
-    const std::array<media_bookmark_entry_s, 2> marks = {{{1, "one"}, {2, "two"}}};
-    ASSERT_EQ(0, media_info_replace_in_db(nullptr, path.c_str(), marks.data(), 2, nullptr));
-    const std::string former = idOf("a.m4a");
-    int count = 0;
-    EXPECT_EQ(0, media_info_get_bookmark_count_from_db(former.c_str(), nullptr, &count));
-    EXPECT_EQ(2, count);
-
-    // A bookmark that cannot be written takes everything back with it.
-    sqlite3* direct = nullptr;
-    ASSERT_EQ(SQLITE_OK, sqlite3_open(_directory.file("media.db").c_str(), &direct));
-    sqlite3_exec(direct,
-        "CREATE TRIGGER no_two BEFORE INSERT ON bookmark WHEN NEW.BOOKMARK_NAME='two' "
-        "BEGIN SELECT RAISE(ABORT, 'no'); END",
-        nullptr, nullptr, nullptr);
-    EXPECT_NE(0, media_info_replace_in_db(former.c_str(), path.c_str(), marks.data(), 2, nullptr));
-    EXPECT_EQ(Names{former}, names("1", media_info_get_media_id));
-    EXPECT_EQ(0, media_info_get_bookmark_count_from_db(former.c_str(), nullptr, &count));
-    EXPECT_EQ(2, count);
-
-    sqlite3_exec(direct, "DROP TRIGGER no_two", nullptr, nullptr, nullptr);
-    sqlite3_close(direct);
+    const std::string former = addRecording("a.m4a", "long");
+    EXPECT_EQ(0, media_bookmark_insert_to_db(former.c_str(), 9, "of the former"));
+    const media_bookmark_entry_s marks[] = {{1, "one"}, {2, "two"}};
+    // Whatever fails, in the middle or in the commit itself, leaves all as it was, and the next change succeeds.
+    const struct {
+        const char* fails;
+        const char* undo;
+    } failures[] = {
+        {"CREATE TRIGGER fails BEFORE INSERT ON bookmark WHEN NEW.BOOKMARK_NAME='two' BEGIN "
+         "SELECT RAISE(ABORT, 'no'); END",
+            "DROP TRIGGER fails"},
+        {"CREATE TABLE late(id REFERENCES media DEFERRABLE INITIALLY DEFERRED); CREATE TRIGGER fails AFTER INSERT ON "
+         "bookmark BEGIN INSERT INTO late VALUES('nobody'); END",
+            "DROP TRIGGER fails; DROP TABLE late"},
+    };
+    for (const auto& [fails, undo] : failures) {
+        SCOPED_TRACE(fails);
+        ASSERT_TRUE(support::execute(fails));
+        EXPECT_NE(0, media_info_replace_in_db(former.c_str(), recordingPath("a.m4a").c_str(), marks, 2, nullptr));
+        EXPECT_EQ(former, idOf("a.m4a"));
+        EXPECT_EQ(1, bookmarksOf(former));
+        ASSERT_TRUE(support::execute(undo));
+        EXPECT_EQ(0, media_bookmark_insert_to_db(addRecording("other.m4a").c_str(), 1, "x"));
+    }
+    listen();
     char* id = nullptr;
-    ASSERT_EQ(0, media_info_replace_in_db(former.c_str(), path.c_str(), marks.data(), 1, &id));
-    const std::string latter = mwAdopt(id);
-    EXPECT_NE(former, latter);
-    EXPECT_EQ(Names{latter}, names("1", media_info_get_media_id));
-    EXPECT_EQ(0, media_info_get_bookmark_count_from_db(latter.c_str(), nullptr, &count));
-    EXPECT_EQ(1, count);
-    EXPECT_NE(0, media_info_replace_in_db(latter.c_str(), (path + ".gone").c_str(), nullptr, 0, nullptr));
-    EXPECT_EQ(Names{latter}, names("1", media_info_get_media_id));
+    ASSERT_EQ(0, media_info_replace_in_db(former.c_str(), recordingPath("a.m4a").c_str(), marks, 2, &id));
+    const std::string own = mwAdopt(id);
+    EXPECT_NE(former, own);
+    EXPECT_EQ(own, idOf("a.m4a"));
+    EXPECT_EQ(2, bookmarksOf(own));
+    EXPECT_EQ(0, bookmarksOf(former));
+    EXPECT_TRUE(support::runUntil([&] { return _heard.count > 0; }));
+    EXPECT_EQ(1, _heard.count);
+    EXPECT_EQ(0, media_info_replace_in_db(nullptr, recordingPath("a.m4a").c_str(), nullptr, 0, nullptr));
+    EXPECT_EQ((Names{"a.m4a", "other.m4a"}), names());
+    EXPECT_NE(0, media_info_replace_in_db(nullptr, "/no/such.m4a", nullptr, 0, nullptr));
+    media_content_unset_db_updated_cb();
 }
 
 TEST_F(MediaDatabaseTest, ADamagedDatabaseIsSetAsideAndRebuiltFromTheFiles)
@@ -169,7 +179,7 @@ TEST_F(MediaDatabaseTest, ADamagedDatabaseIsSetAsideAndRebuiltFromTheFiles)
 TEST_F(MediaDatabaseTest, DamageFoundInTheMiddleIsRepairedToo)
 {
     for (int i = 0; i < 200; ++i)
-        support::writeFile(support::recordingPath("r" + std::to_string(1000 + i) + ".m4a"), "x");
+        support::writeFile(recordingPath("r" + std::to_string(1000 + i) + ".m4a"), "x");
     media_content_scan_folder(support::recordingsDirectory().c_str(), nullptr, nullptr);
     media_content_disconnect(); // also writes the log back into the file
     std::string content = support::readFile(_directory.file("media.db"));
@@ -193,10 +203,10 @@ TEST(MediaDatabaseWriter, DISABLED_InsertsOneFile)
 
 TEST_F(MediaDatabaseTest, OtherProcessesAreToldOfCommits)
 {
-    support::writeFile(support::recordingPath("foreign.m4a"), "x");
+    support::writeFile(recordingPath("foreign.m4a"), "x");
     listen();
     // The writer is a fresh process: a database connection must not cross a fork.
-    ::setenv("MEWLO_TEST_FOREIGN_FILE", support::recordingPath("foreign.m4a").c_str(), 1);
+    ::setenv("MEWLO_TEST_FOREIGN_FILE", recordingPath("foreign.m4a").c_str(), 1);
     const pid_t child = ::fork();
     if (child == 0) {
         ::execl("/proc/self/exe", "writer", "--gtest_filter=MediaDatabaseWriter.*", "--gtest_also_run_disabled_tests",
@@ -237,9 +247,9 @@ TEST_F(MediaDatabaseTest, ScanningKeepsRowsOfAFolderThatIsAway)
     EXPECT_EQ(0, media_content_scan_folder(support::recordingsDirectory().c_str(), nullptr, &removed));
     EXPECT_EQ(Names{"a.m4a"}, names());
     std::filesystem::rename(away, support::recordingsDirectory());
-    support::writeFile(support::recordingPath(".hidden.m4a"), "x");
-    support::writeFile(support::recordingPath("notes.txt"), "x");
-    support::writeFile(support::recordingPath("\xff\xfe.m4a"), "no UTF-8");
+    support::writeFile(recordingPath(".hidden.m4a"), "x");
+    support::writeFile(recordingPath("notes.txt"), "x");
+    support::writeFile(recordingPath("\xff\xfe.m4a"), "no UTF-8");
     int added = 0;
     media_content_scan_folder(support::recordingsDirectory().c_str(), &added, &removed);
     EXPECT_EQ(1, added);
@@ -257,20 +267,18 @@ TEST_F(MediaDatabaseTest, FollowsTheFilesWhileWatched)
     support::runFor(0.5); // the watch moves up to the nearest folder that is left
     std::filesystem::create_directories(support::recordingsDirectory());
     support::runFor(0.5);
-    support::writeFile(support::recordingPath("a.m4a"), "x");
+    support::writeFile(recordingPath("a.m4a"), "x");
     EXPECT_TRUE(become({"a.m4a"}));
     EXPECT_TRUE(support::runUntil([&] { return _heard.count > 0; }));
 
     const std::string id = idOf("a.m4a");
     EXPECT_EQ(0, media_bookmark_insert_to_db(id.c_str(), 7, "Here"));
-    std::filesystem::rename(support::recordingPath("a.m4a"), support::recordingPath("b.m4a"));
+    std::filesystem::rename(recordingPath("a.m4a"), recordingPath("b.m4a"));
     EXPECT_TRUE(become({"b.m4a"}));
     EXPECT_EQ(id, idOf("b.m4a"));
-    int bookmarks = 0;
-    media_info_get_bookmark_count_from_db(id.c_str(), nullptr, &bookmarks);
-    EXPECT_EQ(1, bookmarks);
+    EXPECT_EQ(1, bookmarksOf(id));
 
-    std::filesystem::remove(support::recordingPath("b.m4a"));
+    std::filesystem::remove(recordingPath("b.m4a"));
     EXPECT_TRUE(become({}));
     media_content_unset_db_updated_cb();
 }
@@ -280,12 +288,12 @@ TEST_F(MediaDatabaseTest, AScanWaitsForAFileThatIsBeingChanged)
     const std::string id = addRecording("a.m4a");
     files_lock_h lock = nullptr;
     ASSERT_EQ(0, media_content_lock_files(&lock));
-    std::filesystem::rename(support::recordingPath("a.m4a"), support::recordingPath("b.m4a"));
+    std::filesystem::rename(recordingPath("a.m4a"), recordingPath("b.m4a"));
     std::thread scanner([] { media_content_scan_all(); });
     std::this_thread::sleep_for(std::chrono::milliseconds(50)); // it has looked by now and waits
     media_info_h media = nullptr;
     ASSERT_EQ(0, media_info_get_media_from_db(id.c_str(), &media));
-    EXPECT_EQ(0, media_info_move_to_db(media, support::recordingPath("b.m4a").c_str()));
+    EXPECT_EQ(0, media_info_move_to_db(media, recordingPath("b.m4a").c_str()));
     media_info_destroy(media);
     media_content_unlock_files(lock);
     scanner.join();
