@@ -92,6 +92,8 @@ int audio_meta_get_duration(audio_meta_h audio, int* milliseconds);
 int audio_meta_destroy(audio_meta_h audio);
 
 int media_bookmark_insert_to_db(const char* media_id, unsigned int marked_time, const char* name);
+// Those whose time has no bookmark yet, in one commit, all or nothing.
+int media_bookmark_insert_missing_to_db(const char* media_id, const media_bookmark_entry_s* bookmarks, int count);
 int media_bookmark_delete_from_db(int bookmark_id);
 int media_info_get_bookmark_count_from_db(const char* media_id, filter_h filter, int* count);
 int media_info_foreach_bookmark_from_db(

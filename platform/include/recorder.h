@@ -18,6 +18,7 @@ enum recorder_error_e : int {
     RECORDER_ERROR_SOUND_POLICY_BY_ALARM = static_cast<int>(0xFE6B0019u),
     RECORDER_ERROR_ESD = static_cast<int>(0xFE6B001Au),
     RECORDER_ERROR_OUT_OF_STORAGE = static_cast<int>(0xFE6B001Bu),
+    RECORDER_ERROR_STORAGE = static_cast<int>(0xFE6B001Cu), // it fails, but the recording goes on
 };
 enum recorder_state_e {
     RECORDER_STATE_NONE,

@@ -24,6 +24,9 @@ int recorder_rescue_leftovers(const char* temporary_path, recorder_leftover_cb c
 // The application's notes about a running recording: "<temporary path>.notes". They travel with the recording when it
 // is moved aside.
 #define RECORDER_NOTES_SUFFIX ".notes"
+// Whether the recording that this process made there is complete: RECORDER_ERROR_NONE, or an error when its completion
+// failed. Then it is neither to be moved nor released, so that a rescue finds it with its journal.
+int recorder_check_temporary(const char* temporary_path);
 // Ends this process's claim on the temporary path after its file was moved away or deleted: removes the journal.
 int recorder_release_temporary(const char* temporary_path);
 }

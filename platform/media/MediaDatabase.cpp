@@ -343,6 +343,22 @@ int Database::insertBookmark(const std::string& mediaId, unsigned int markedTime
     return _transaction([&] { return _insertBookmark(mediaId, markedTime, name); });
 }
 
+int Database::insertMissingBookmarks(const std::string& mediaId, const std::vector<BookmarkRow>& bookmarks)
+{
+    return _transaction([&] {
+        for (const BookmarkRow& mark : bookmarks) {
+            Statement statement(_db,
+                "INSERT INTO bookmark(MEDIA_ID, BOOKMARK_MARKED_TIME, BOOKMARK_NAME) SELECT ?1, ?2, ?3 WHERE NOT "
+                "EXISTS "
+                "(SELECT 1 FROM bookmark WHERE MEDIA_ID = ?1 AND BOOKMARK_MARKED_TIME = ?2)");
+            const auto time = static_cast<long long>(mark.markedTime);
+            if (const int result = statement.bind(mediaId).bind(time).bind(mark.name).run(); result != SQLITE_OK)
+                return result;
+        }
+        return SQLITE_OK;
+    });
+}
+
 int Database::removeBookmark(int bookmarkId)
 {
     return _transaction([&] {

@@ -78,6 +78,8 @@ public:
     int replace(const std::string& formerId, const MediaRow& row, const std::vector<BookmarkRow>& bookmarks);
 
     int insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name);
+    // Those whose time has no bookmark yet; all or nothing.
+    int insertMissingBookmarks(const std::string& mediaId, const std::vector<BookmarkRow>& bookmarks);
     int removeBookmark(int bookmarkId);
     int selectBookmarks(const std::string& mediaId, const Query& query, std::vector<BookmarkRow>& rows);
 

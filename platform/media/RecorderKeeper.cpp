@@ -145,8 +145,9 @@ void Recorder::_reportEnd(Trouble trouble, recorder_state_e before, int fileErro
     const auto interrupt = [&](recorder_policy_e policy) {
         _post([policy, before](const RecorderCallbacks& to) { to.interrupted(policy, before, RECORDER_STATE_READY); });
     };
+    // Neither an interruption nor a limit: both say that the file is complete.
     if (fileError != 0)
-        _post([fileError](const RecorderCallbacks& to) {
+        return _post([fileError](const RecorderCallbacks& to) {
             to.error(fileError == ENOSPC ? RECORDER_ERROR_OUT_OF_STORAGE : RECORDER_ERROR_INVALID_OPERATION,
                 RECORDER_STATE_READY);
         });

@@ -29,6 +29,7 @@ namespace {
         std::mutex mutex;
         std::map<std::string, FileDescriptor> held; // by the resolved path
         std::set<std::string> written;
+        std::set<std::string> complete;
     };
 
     Claims& claims()
@@ -209,6 +210,7 @@ int claimTemporary(const std::string& givenPath)
         if (isReadyForUse(path, journal.get(), error)) {
             claims().held[path] = std::move(journal);
             claims().written.insert(path);
+            claims().complete.erase(path);
             return 0;
         }
         if (error != 0)
@@ -229,10 +231,18 @@ bool isBeingWritten(const std::string& path)
     return claims().written.contains(resolved(path));
 }
 
-void endWriting(const std::string& path)
+void endWriting(const std::string& path, bool isComplete)
 {
     const std::scoped_lock lock(claims().mutex);
     claims().written.erase(resolved(path));
+    if (isComplete)
+        claims().complete.insert(resolved(path));
+}
+
+bool isComplete(const std::string& path)
+{
+    const std::scoped_lock lock(claims().mutex);
+    return claims().complete.contains(resolved(path));
 }
 
 FileDescriptor claimedJournal(const std::string& path)
@@ -254,6 +264,7 @@ bool releaseTemporary(const std::string& givenPath)
         (void)unlink((path + JOURNAL_SUFFIX).c_str());
     claims().held.erase(found);
     claims().written.erase(path);
+    claims().complete.erase(path);
     return true;
 }
 

@@ -25,7 +25,9 @@ int claimTemporary(const std::string& path);
 bool isClaimedHere(const std::string& path);
 // Whether a recorder of this process writes there at the moment; the end of writing leaves the claim.
 bool isBeingWritten(const std::string& path);
-void endWriting(const std::string& path);
+void endWriting(const std::string& path, bool isComplete);
+// Whether the last recording that this process ended there is complete.
+bool isComplete(const std::string& path);
 // Another handle of the claimed journal; empty when the path is not claimed here.
 FileDescriptor claimedJournal(const std::string& path);
 // Removes the journal and ends the claim; answers whether there was one.

@@ -130,7 +130,7 @@ int RecordingFile::finish()
     _reserve.close();
     const int error = isAac(_header) ? finishMp4(_file.get(), _journal.get(), _header, {_frames, _bytes})
                                      : finishAmr(_file.get(), _journal.get(), _header);
-    endWriting(_path);
+    endWriting(_path, error == 0);
     return error;
 }
 

@@ -165,6 +165,14 @@ int write(const Work& work)
     return toError(result);
 }
 
+std::vector<media::BookmarkRow> bookmarkRows(const media_bookmark_entry_s* bookmarks, int count)
+{
+    std::vector<media::BookmarkRow> rows;
+    for (int i = 0; i < count; ++i)
+        rows.push_back({0, bookmarks[i].marked_time, bookmarks[i].name != nullptr ? bookmarks[i].name : ""});
+    return rows;
+}
+
 int scan(Connection& held, const std::vector<std::string>& folders, media::ScanCount& count)
 {
     const int code = media::scanFolders(held.database, folders, count);
@@ -453,9 +461,7 @@ int media_info_replace_in_db(
     const auto row = media::describeFile(path);
     if (!row)
         return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
-    std::vector<media::BookmarkRow> marks;
-    for (int i = 0; i < count; ++i)
-        marks.push_back({0, bookmarks[i].marked_time, bookmarks[i].name != nullptr ? bookmarks[i].name : ""});
+    const std::vector<media::BookmarkRow> marks = bookmarkRows(bookmarks, count);
     const int result = write([&](media::Database& database) {
         return database.replace(old_media_id != nullptr ? old_media_id : "", *row, marks);
     });
@@ -521,6 +527,14 @@ int media_bookmark_insert_to_db(const char* media_id, unsigned int marked_time, 
     if (media_id == nullptr || name == nullptr)
         return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
     return write([&](media::Database& database) { return database.insertBookmark(media_id, marked_time, name); });
+}
+
+int media_bookmark_insert_missing_to_db(const char* media_id, const media_bookmark_entry_s* bookmarks, int count)
+{
+    if (media_id == nullptr || count < 0 || (count > 0 && bookmarks == nullptr))
+        return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
+    const std::vector<media::BookmarkRow> marks = bookmarkRows(bookmarks, count);
+    return write([&](media::Database& database) { return database.insertMissingBookmarks(media_id, marks); });
 }
 
 int media_bookmark_delete_from_db(int bookmark_id)

@@ -136,6 +136,13 @@ int recorder_rescue_leftovers(const char* temporary_path, recorder_leftover_cb c
     return count;
 }
 
+int recorder_check_temporary(const char* temporary_path)
+{
+    if (temporary_path == nullptr)
+        return RECORDER_ERROR_INVALID_PARAMETER;
+    return isComplete(temporary_path) ? RECORDER_ERROR_NONE : RECORDER_ERROR_INVALID_OPERATION;
+}
+
 int recorder_release_temporary(const char* temporary_path)
 {
     if (temporary_path == nullptr)

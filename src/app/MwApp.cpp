@@ -371,10 +371,16 @@ void MwApp::_recordingStopRequestCb(const char*, void* userData)
     if (preference_get_boolean(STOP_PREFERENCE, &requested) != 0 || !requested)
         return;
     MW_LOGI("request stop recording by sub app");
-    if (self->_appController->dispatchCommand(MwAppController::STOP_RECORDING))
-        MW_LOGI("recording stop success");
-    else
-        MW_LOGE("STOP recording failed!!!");
+    // On the worker: the window does not wait for the save.
+    self->_appController->dispatchCommandAsync(
+        MwAppController::STOP_RECORDING,
+        [](MwAppController::Command, MwAppController::Result result, void*) {
+            if (result == MwAppController::SUCCESS)
+                MW_LOGI("recording stop success");
+            else
+                MW_LOGE("STOP recording failed!!!");
+        },
+        nullptr);
 }
 
 void MwApp::_lowBatteryEventCb()

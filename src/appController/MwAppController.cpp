@@ -259,9 +259,16 @@ void MwAppController::_lifeCycleChanged(MwSignalMgr::LifeCycle lifeCycle)
 void MwAppController::_recorderErrorOccurred(MwRecorder::ErrorType type)
 {
     MW_LOGE("Error signal: [%d]", type);
+    if (type == MwRecorder::ERROR_STORAGE) {
+        mwPost("IDS_MW_TPOP_STORAGE_FAILS_RECORDING_MAY_BE_LOST");
+        return;
+    }
     _createErrorPopup("Interal Error!");
     _ungrabMediaKey();
     _releaseLock();
+    const int state = _model->getRecorderState();
+    if ((state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED) && _recorder->hasEnded())
+        _emitSignalAfterStopRecording(true);
 }
 
 void MwAppController::_createErrorPopup(const char* text)

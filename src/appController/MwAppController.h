@@ -113,6 +113,8 @@ private:
     bool _resumeRecording();
     bool _cancelRecording(bool interrupted);
     bool _stopRecording(bool interrupted);
+    bool _commitRecording(bool interrupted);
+    bool _isOver() const;
     void _releaseTemporaryFile();
     bool _replyWithRecording();
     void _recorderLimitReached(MwRecorder::LimitType type);
@@ -122,8 +124,10 @@ private:
     bool _checkRecordedFileDir();
     bool _moveTempRecordingFile(const char* destFilePath);
     void _insertRecordedFileToDB(const char* filePath, std::string& mediaId);
-    void _insertBookmarkList(const std::string& mediaId);
+    bool _insertBookmarkList(const std::string& mediaId);
     void _emitSignalAfterStopRecording(bool interrupted);
+    void _chooseName();
+    bool _setUpRecording();
     bool _setUpRecorder();
     static void _postStartFailure(MwRecorder::ErrorType error);
 
@@ -199,5 +203,6 @@ private:
     // Held for the whole execution of a command, by whichever thread executes it.
     mutable std::recursive_mutex _commandMutex;
     std::string _lastSavedPath; // of this process; empty while or after one that was not saved
+    bool _wasDiscarded = false; // the last recording of this process
     std::string _stopReason; // identifier of the message that says why a recording ended by itself
 };

@@ -110,6 +110,8 @@ bool MwAppController::_executeResumeRecording()
 
 bool MwAppController::_executeCancel()
 {
+    if (_isOver() && _wasDiscarded)
+        return true;
     _ungrabMediaKey();
     if (!_cancelRecording(false)) {
         MW_LOGE("_cancelRecording failed");
@@ -123,6 +125,10 @@ bool MwAppController::_executeCancel()
 
 bool MwAppController::_executeStop(bool interrupted)
 {
+    if (_isOver()) {
+        MW_LOGI("the recording is over already");
+        return true;
+    }
     _ungrabMediaKey();
     bool stopped = false;
     if (_model->getElapsedTime() < SHORTEST_RECORDING_MS) {

@@ -62,21 +62,15 @@ bool MwAppController::_startRecording()
         mwPost("IDS_MW_TPOP_UNABLE_TO_START_NEW_RECORDING_OTHER_APP_ALREADY_RECORDING");
         return false;
     }
-    if (const std::string name = _model->getRenameString(); !name.empty()) {
-        MW_LOGI("Has been renamed, used rename string");
-        _model->chooseCurrentRecordingFileName(name);
-        _model->setRenameString("");
-    } else {
-        _model->updateNextRecordingFileName();
-    }
-    if (const int reason = _soundSession->setRecordSoundSession(); reason != MwSoundSession::SESSION_RESULT_NONE) {
-        MW_LOGE("set sound session failed : [%d]!!!", reason);
-        mwPost(reason == MwSoundSession::SESSION_RESULT_BLOCKED_BY_CALL ? "IDS_MW_TPOP_CANT_RECORD_VOICE_DURING_CALLS"
-                                                                        : "IDS_MUSIC_TPOP_CANT_RECORD_VOICE");
+    const std::string chosen = _model->getRenameString();
+    _model->holdStorage();
+    _chooseName();
+    if (!_setUpRecording()) {
+        _model->windBackRecordingFileName();
+        _model->setRenameString(chosen);
+        _model->releaseStorage();
         return false;
     }
-    if (!_setUpRecorder())
-        return false;
     MwLoggingMgr::getInstance()->insert("RECO", "Normal Mode");
     _model->setRecorderState(MwRecorder::REC_STATE_RECORDING);
     _model->saveRecordingNotes();
@@ -84,9 +78,34 @@ bool MwAppController::_startRecording()
     return true;
 }
 
+void MwAppController::_chooseName()
+{
+    const std::string name = _model->getRenameString();
+    if (name.empty()) {
+        _model->updateNextRecordingFileName();
+        return;
+    }
+    MW_LOGI("Has been renamed, used rename string");
+    _model->chooseCurrentRecordingFileName(name);
+    _model->setRenameString("");
+}
+
+bool MwAppController::_setUpRecording()
+{
+    if (const int reason = _soundSession->setRecordSoundSession(); reason != MwSoundSession::SESSION_RESULT_NONE) {
+        MW_LOGE("set sound session failed : [%d]!!!", reason);
+        mwPost(reason == MwSoundSession::SESSION_RESULT_BLOCKED_BY_CALL ? "IDS_MW_TPOP_CANT_RECORD_VOICE_DURING_CALLS"
+                                                                        : "IDS_MUSIC_TPOP_CANT_RECORD_VOICE");
+        return false;
+    }
+    return _setUpRecorder();
+}
+
 bool MwAppController::_setUpRecorder()
 {
     _lastSavedPath.clear();
+    _wasDiscarded = false;
+    _model->clearBookMark();
     _model->setElapsedTime(0);
     _model->setLevel(MwModel::SILENCE);
     if (!_recorder->createHandle(_model)) {
@@ -139,8 +158,10 @@ bool MwAppController::_resumeRecording()
         MW_LOGE("current state is [%d]!! can't resume recording", _model->getRecorderState());
         return false;
     }
-    if (!_recorder->resume()) {
+    MwRecorder::ErrorType error = MwRecorder::ERROR_UNKNOWN;
+    if (!_recorder->resume(error)) {
         MW_LOGE("recorder resume failed");
+        _postStartFailure(error);
         return false;
     }
     _model->setRecorderState(MwRecorder::REC_STATE_RECORDING);
@@ -157,21 +178,30 @@ bool MwAppController::_cancelRecording(bool interrupted)
         return false;
     }
     bool cancelled = true;
-    if (interrupted) {
+    const bool hasEnded = interrupted || _recorder->hasEnded();
+    if (hasEnded) {
         ecore_file_unlink(_model->getTemporaryFilePath().c_str());
     } else if (!_recorder->cancel()) {
         MW_LOGE("recorder cancel failed");
         cancelled = false;
     }
     _destroyRecorderHandle();
-    if (interrupted)
+    if (hasEnded)
         _releaseTemporaryFile(); // the recorder's own cancel has done it already
     _soundSession->unsetRecordSoundSession();
     _model->setRecorderState(MwRecorder::REC_STATE_READY);
     _model->clearBookMark();
     _model->windBackRecordingFileName();
+    _model->releaseStorage();
+    _wasDiscarded = cancelled;
     _releaseLock();
     return cancelled;
+}
+
+// The recording has ended by itself, with the result that a stop asks for.
+bool MwAppController::_isOver() const
+{
+    return _model->getRecorderState() == MwRecorder::REC_STATE_READY && (_wasDiscarded || !_lastSavedPath.empty());
 }
 
 // Ends the claim on the temporary path once nothing of this recording is left there.
@@ -201,13 +231,7 @@ bool MwAppController::_stopRecording(bool interrupted)
         MW_LOGE("current state is [%d]!! can't stop recording", _model->getRecorderState());
         return false;
     }
-    bool stopped = true;
-    if (!interrupted) {
-        stopped = _recorder->stop();
-        if (!stopped)
-            MW_LOGE("recorder stop failed");
-        MwLoggingMgr::getInstance()->insert("SAVE");
-    }
+    bool stopped = _commitRecording(interrupted);
     _destroyRecorderHandle();
     _soundSession->unsetRecordSoundSession();
     _model->setRecorderState(MwRecorder::REC_STATE_READY);
@@ -221,8 +245,24 @@ bool MwAppController::_stopRecording(bool interrupted)
             mwFormat("%s %s", _model->getCurrentRecordingFileName().c_str(), mwTranslate("IDS_MW_POP_SAVED").c_str())
                 .c_str());
     }
+    if (_lastSavedPath.empty())
+        mwPost("IDS_MW_TPOP_RECORDING_NOT_COMPLETED_KEPT_FOR_THE_NEXT_START");
+    _model->releaseStorage();
     _releaseLock();
     return stopped;
+}
+
+// A file that was not completed stays where it is: with journal and notes it is what the rescue needs.
+bool MwAppController::_commitRecording(bool interrupted)
+{
+    bool committed = true;
+    if (!interrupted) {
+        committed = _recorder->stop();
+        if (!committed)
+            MW_LOGE("recorder stop failed");
+        MwLoggingMgr::getInstance()->insert("SAVE");
+    }
+    return committed && MW_CALL(recorder_check_temporary, _model->getTemporaryFilePath().c_str());
 }
 
 bool MwAppController::_saveRecordingFile()
@@ -251,8 +291,8 @@ bool MwAppController::_saveRecordingFile()
         MW_LOGE("insert recorded file to DB failed!");
         return false;
     }
-    _insertBookmarkList(mediaId);
-    MwRecordingNotes::remove(MwRecordingNotes::pathForSaved(path));
+    if (_insertBookmarkList(mediaId))
+        MwRecordingNotes::remove(MwRecordingNotes::pathForSaved(path));
     return true;
 }
 
@@ -321,14 +361,16 @@ void MwAppController::_insertRecordedFileToDB(const char* filePath, std::string&
     mediaId = mwAdopt(id);
 }
 
-void MwAppController::_insertBookmarkList(const std::string& mediaId)
+bool MwAppController::_insertBookmarkList(const std::string& mediaId)
 {
     if (_model == nullptr) {
         MW_LOGE("_model is nullptr");
-        return;
+        return false;
     }
-    if (!_model->saveBookMark(mediaId.c_str()))
+    const bool saved = _model->saveBookMark(mediaId.c_str());
+    if (!saved)
         MW_LOGE("_model->saveBookMark failed!");
+    return saved;
 }
 
 void MwAppController::_recorderLimitReached(MwRecorder::LimitType type)

@@ -9,6 +9,7 @@
 #include "MwLog.h"
 #include "MwRecorder.h"
 #include "MwRecordingNotes.h"
+#include "MwSavedBookmarks.h"
 #include "MwStorageRoots.h"
 #include "MwText.h"
 
@@ -42,8 +43,24 @@ void MwModel::setRecorderState(int state)
         MW_CALL(preference_set_int, RECORDING_STATE_KEY, state);
 }
 
+void MwModel::holdStorage()
+{
+    releaseStorage();
+    const MwStorageType type = getStorageType();
+    const std::lock_guard lock(_storageMutex);
+    _storage = Storage{type, type == MW_STORAGE_DEVICE ? mwDeviceRoot() : mwCardRoot()};
+}
+
+void MwModel::releaseStorage()
+{
+    const std::lock_guard lock(_storageMutex);
+    _storage.reset();
+}
+
 MwStorageType MwModel::getStorageType() const
 {
+    if (const auto held = _heldStorage(); held)
+        return held->type;
     int card = 0;
     if (vconf_get_int(VCONFKEY_SYSMAN_MMC_STATUS, &card) != 0) {
         MW_LOGE("vconf_get_int fail");
@@ -70,6 +87,8 @@ void MwModel::setStorageType(MwStorageType type)
 
 std::string MwModel::getStorageRoot() const
 {
+    if (const auto held = _heldStorage(); held)
+        return held->root;
     return getStorageType() == MW_STORAGE_DEVICE ? mwDeviceRoot() : mwCardRoot();
 }
 
@@ -134,13 +153,11 @@ bool MwModel::saveBookMark(const char* mediaId)
         MW_LOGI("book mark list is empty!!");
         return true;
     }
-    for (const MwBookmark& bookmark : bookmarks) {
-        const int result = media_bookmark_insert_to_db(mediaId, bookmark.markedTime, bookmark.name.c_str());
-        if (result != 0)
-            MW_LOGE("media_bookmark_insert_to_db failed, [0x%X]", static_cast<unsigned int>(result));
-    }
+    const int result = mwInsertBookmarks(mediaId, bookmarks);
+    if (result != 0)
+        MW_LOGE("media_bookmark_insert_to_db failed, [0x%X]", static_cast<unsigned int>(result));
     clearBookMark();
-    return true;
+    return result == 0;
 }
 
 std::vector<MwBookmark> MwModel::getBookmarkList() const

@@ -65,7 +65,10 @@ public:
     [[nodiscard]] unsigned int getCurrentPlayDuration() const;
     [[nodiscard]] static std::string getDurationText(unsigned int milliseconds, bool withHours);
 
-    // Storage
+    // Storage. From hold to release, for one recording, type, root and all paths stay what they are, whatever happens
+    // to the card and the choice.
+    void holdStorage();
+    void releaseStorage();
     [[nodiscard]] MwStorageType getStorageType() const;
     // The stored choice, whether or not a card is mounted.
     [[nodiscard]] MwStorageType getStorageChoice() const;
@@ -84,12 +87,13 @@ public:
     bool updateNextRecordingFileName();
     [[nodiscard]] std::string getDefaultRecordingFileName() const;
     [[nodiscard]] bool checkRecordFileNameExist(const std::string& name) const;
-    // Releases the number of a recording that was discarded.
+    // Releases the number of a recording that was discarded or refused.
     void windBackRecordingFileName();
 
     // Bookmarks of the running recording
     bool addBookMark(unsigned int& markedTime);
     void clearBookMark();
+    // All of them or none.
     bool saveBookMark(const char* mediaId);
     [[nodiscard]] std::vector<MwBookmark> getBookmarkList() const;
     // Keeps name and bookmarks of the running recording beside its temporary file, for a rescue after a crash.
@@ -167,6 +171,18 @@ private:
 
     using RequestHandle = MwHandle<app_control_h, app_control_destroy>;
 
+    struct Storage {
+        MwStorageType type;
+        std::string root;
+    };
+    [[nodiscard]] std::optional<Storage> _heldStorage() const
+    {
+        const std::lock_guard lock(_storageMutex);
+        return _storage;
+    }
+
+    mutable std::mutex _storageMutex; // guards the next one; nothing else is locked under it
+    std::optional<Storage> _storage; // of the running recording
     mutable std::mutex _mutex; // guards names, numbers, play path and bookmarks
     std::atomic<int> _appState = APP_STATE_CREATED;
     std::atomic<int> _recorderState = 0;

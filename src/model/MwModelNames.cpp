@@ -145,10 +145,10 @@ void MwModel::chooseCurrentRecordingFileName(const std::string& name)
 bool MwModel::updateNextRecordingFileName()
 {
     const std::lock_guard lock(_mutex);
-    // The screen asks again whenever it comes back; a running recording keeps the name its user gave it.
+    // The screen asks again whenever it comes back; a running recording keeps the name that the screen shows.
     const bool runs
         = _recorderState == MwRecorder::REC_STATE_RECORDING || _recorderState == MwRecorder::REC_STATE_PAUSED;
-    if (runs && _nameIsChosen)
+    if (runs)
         return true;
     _nameIsChosen = false;
     _currentName = _advanceToFreeName(_numbers);
@@ -175,7 +175,7 @@ bool MwModel::checkRecordFileNameExist(const std::string& name) const
 void MwModel::windBackRecordingFileName()
 {
     const std::lock_guard lock(_mutex);
-    if (_numbers.last > 0)
+    if (_numbers.last > 0 && !_nameIsChosen)
         --_numbers.last;
     FileNumbers numbers = _numbers;
     _currentName = _advanceToFreeName(numbers);

@@ -52,3 +52,11 @@ std::vector<MwSavedBookmark> mwReadBookmarks(const std::string& mediaId, MwBookm
     succeeded(reading, "media_filter_destroy", filter.close());
     return std::move(reading.bookmarks);
 }
+
+int mwInsertBookmarks(const std::string& mediaId, const std::vector<MwBookmark>& bookmarks)
+{
+    std::vector<media_bookmark_entry_s> entries;
+    for (const MwBookmark& bookmark : bookmarks)
+        entries.push_back({bookmark.markedTime, bookmark.name.c_str()});
+    return media_bookmark_insert_missing_to_db(mediaId.c_str(), entries.data(), static_cast<int>(entries.size()));
+}

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "MwModel.h"
+
 #include <string>
 #include <vector>
 
@@ -17,3 +19,7 @@ using MwBookmarkFailure = void (*)(const char* call, int code);
 
 // The bookmarks of a recording by rising time; what could not be read is reported and left out. Any thread.
 std::vector<MwSavedBookmark> mwReadBookmarks(const std::string& mediaId, MwBookmarkFailure failed);
+
+// Writes the bookmarks that a saved recording does not have yet, all of them or none; answers the database's code. Any
+// thread.
+int mwInsertBookmarks(const std::string& mediaId, const std::vector<MwBookmark>& bookmarks);

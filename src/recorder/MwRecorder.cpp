@@ -13,18 +13,26 @@ constexpr int STATUS_CALLBACKS_PER_LEVEL = 9;
 constexpr double LEVEL_OFFSET = 5.0; // decibels
 
 // By code minus RECORDER_ERROR_SECURITY_RESTRICTED.
-constexpr std::array<MwRecorder::ErrorType, 5> ERROR_TYPES = {
+constexpr std::array<MwRecorder::ErrorType, 6> ERROR_TYPES = {
     MwRecorder::ERROR_SECURITY_RESTRICTED,
     MwRecorder::ERROR_BLOCKED_BY_CALL,
     MwRecorder::ERROR_UNKNOWN,
     MwRecorder::ERROR_UNKNOWN,
     MwRecorder::ERROR_OUT_OF_STORAGE,
+    MwRecorder::ERROR_STORAGE,
 };
 
 MwRecorder::ErrorType toErrorType(int code)
 {
     const auto index = static_cast<unsigned int>(code) - static_cast<unsigned int>(RECORDER_ERROR_SECURITY_RESTRICTED);
     return index < ERROR_TYPES.size() ? ERROR_TYPES[index] : MwRecorder::ERROR_UNKNOWN;
+}
+
+MwRecorder::ErrorType toRefusal(int code)
+{
+    if (code == RECORDER_ERROR_SECURITY_RESTRICTED)
+        return MwRecorder::ERROR_SECURITY_RESTRICTED;
+    return code == RECORDER_ERROR_SOUND_POLICY_BY_CALL ? MwRecorder::ERROR_BLOCKED_BY_CALL : MwRecorder::ERROR_UNKNOWN;
 }
 
 }
@@ -109,10 +117,7 @@ bool MwRecorder::start(ErrorType& error)
         return false;
     if (const int result = recorder_prepare(_handle);
         !mwSucceeded(result, "recorder_prepare", __FILE_NAME__, __func__, __LINE__)) {
-        if (result == RECORDER_ERROR_SECURITY_RESTRICTED)
-            error = ERROR_SECURITY_RESTRICTED;
-        else if (result == RECORDER_ERROR_SOUND_POLICY_BY_CALL)
-            error = ERROR_BLOCKED_BY_CALL;
+        error = toRefusal(result);
         return false;
     }
     if (const int result = recorder_start(_handle);
@@ -163,11 +168,15 @@ bool MwRecorder::pause()
         && MW_CALL(recorder_pause, _handle);
 }
 
-bool MwRecorder::resume()
+bool MwRecorder::resume(ErrorType& error)
 {
     MW_LOGW("BEGIN");
-    return _isInState(RECORDER_STATE_PAUSED, RECORDER_STATE_PAUSED, "can't resume in current fw state")
-        && MW_CALL(recorder_start, _handle);
+    error = ERROR_UNKNOWN;
+    if (!_isInState(RECORDER_STATE_PAUSED, RECORDER_STATE_PAUSED, "can't resume in current fw state"))
+        return false;
+    const int result = recorder_start(_handle);
+    error = result == 0 ? ERROR_NONE : toRefusal(result);
+    return mwSucceeded(result, "recorder_start", __FILE_NAME__, __func__, __LINE__);
 }
 
 bool MwRecorder::cancel()
@@ -187,20 +196,25 @@ bool MwRecorder::stop()
     recorder_state_e state = RECORDER_STATE_NONE;
     if (!_getState(state))
         return false;
-    // A program that waits for its recording gets whatever there is.
-    const bool tolerant = _model->isRequestMode();
     if (state == RECORDER_STATE_RECORDING || state == RECORDER_STATE_PAUSED) {
-        if (!MW_CALL(recorder_commit, _handle) && !tolerant)
+        if (!MW_CALL(recorder_commit, _handle))
             return false;
     } else {
         MW_LOGI("Unable to commit in current framework state: [%d]", state);
     }
     if (!_getState(state))
         return false;
-    if (state == RECORDER_STATE_READY && !MW_CALL(recorder_unprepare, _handle) && !tolerant)
+    // A program that waits for its recording gets it, whatever becomes of the microphone.
+    if (state == RECORDER_STATE_READY && !MW_CALL(recorder_unprepare, _handle) && !_model->isRequestMode())
         return false;
     MW_LOGW("END");
     return true;
+}
+
+bool MwRecorder::hasEnded() const
+{
+    recorder_state_e state = RECORDER_STATE_NONE;
+    return _handle != nullptr && _getState(state) && state <= RECORDER_STATE_READY;
 }
 
 bool MwRecorder::isInRecording(int kind) const

@@ -16,6 +16,7 @@ public:
         ERROR_OUT_OF_STORAGE,
         ERROR_BLOCKED_BY_CALL,
         ERROR_SECURITY_RESTRICTED,
+        ERROR_STORAGE, // it fails while the recording goes on
     };
     enum LimitType : int { LIMIT_NONE, LIMIT_TIME, LIMIT_SIZE, LIMIT_FREE_SPACE };
     // Kept in the model by the controller.
@@ -31,10 +32,12 @@ public:
     bool destroyHandle();
     bool start(ErrorType& error);
     bool pause();
-    bool resume();
+    bool resume(ErrorType& error);
     bool cancel();
     // Commits the temporary file.
     bool stop();
+    // Whether the service has ended the recording by itself.
+    bool hasEnded() const;
     bool isInRecording(int kind) const;
 
 private:

@@ -13,6 +13,7 @@
 #include "MwLog.h"
 #include "MwModel.h"
 #include "MwRecordingNotes.h"
+#include "MwSavedBookmarks.h"
 #include "MwStagedFile.h"
 #include "MwStorageRoots.h"
 #include "MwSystemMgr.h"
@@ -58,15 +59,7 @@ bool catalogue(const std::string& path, const std::vector<MwBookmark>& bookmarks
         || !MW_CALL(media_info_get_media_id, media.get(), &id))
         return false;
     const std::string mediaId = mwAdopt(id);
-    int known = 0;
-    if (!MW_CALL(media_info_get_bookmark_count_from_db, mediaId.c_str(), nullptr, &known))
-        return false;
-    if (known > 0)
-        return true;
-    bool inserted = true;
-    for (const MwBookmark& bookmark : bookmarks)
-        inserted &= MW_CALL(media_bookmark_insert_to_db, mediaId.c_str(), bookmark.markedTime, bookmark.name.c_str());
-    return inserted;
+    return MW_CALL(mwInsertBookmarks, mediaId, bookmarks);
 }
 
 bool isPlainName(const std::string& name)

@@ -63,5 +63,6 @@ int recorder_rescue_leftovers(const char* path, recorder_leftover_cb callback, v
 {
     return recorder.onRescue ? recorder.onRescue(path, callback, data) : 0;
 }
+FAKE(recorder_check_temporary, (const char* path), , path)
 FAKE(recorder_release_temporary, (const char* path), , path)
 }

@@ -23,6 +23,8 @@ bool MwAppController::dispatchCommandAsync(Command command, AsyncCallback callba
     return true;
 }
 
+std::string MwAppController::getLastSavedPath() const { return fakes::controller.lastSavedPath; }
+
 void MwAppController::openRecordings() { ++fakes::controller.recordingsOpened; }
 
 namespace fakes {

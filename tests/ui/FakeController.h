@@ -15,6 +15,7 @@ struct Controller {
     std::function<bool(MwAppController::Command)> onCommand;
     bool acceptAsync = true;
     int recordingsOpened = 0;
+    std::string lastSavedPath;
 
     // Delivers the results of the asynchronous commands so far.
     void finish();

@@ -414,6 +414,32 @@ TEST(RecorderScreenTest, SaveToChoosesTheStorage)
     screen.model.setStorageType(MW_STORAGE_DEVICE);
 }
 
+TEST(RecorderScreenTest, APulledCardSavesWhatItCanAndNothingElseIsSentMeanwhile)
+{
+    for (const auto state : {MwRecorder::REC_STATE_RECORDING, MwRecorder::REC_STATE_PAUSED}) {
+        ui::RecorderScreen screen;
+        vconf_set_int(VCONFKEY_SYSMAN_MMC_STATUS, 1);
+        screen.model.setStorageType(MW_STORAGE_CARD);
+        screen.model.holdStorage();
+        screen.enter(state);
+        screen.model.setElapsedTime(5000);
+        vconf_set_int(VCONFKEY_SYSMAN_MMC_STATUS, 0);
+        emit(MwSignalMgr::MMC_REMOVED);
+        fakes::controller.commands.clear();
+        for (const char* part : {"pause_button", "resume_button", "stop_button", "discard_button"})
+            if (screen.button(part) != nullptr)
+                screen.press(part);
+        EXPECT_TRUE(fakes::controller.commands.empty()) << "nothing waits for the stop";
+        EXPECT_EQ(nullptr, WPopupController::topmost());
+        fakes::controller.lastSavedPath = "/card/saved.m4a";
+        fakes::controller.finish();
+        EXPECT_EQ(std::vector{MwAppController::STOP_RECORDING}, fakes::controller.commands);
+        EXPECT_EQ(1, fakes::controller.recordingsOpened);
+        screen.model.releaseStorage();
+        screen.model.setStorageType(MW_STORAGE_DEVICE);
+    }
+}
+
 TEST(RecorderScreenTest, SystemEvents)
 {
     ui::RecorderScreen screen;

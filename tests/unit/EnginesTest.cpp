@@ -81,13 +81,13 @@ TEST_F(MwRecorderTest, StartUsesTheModelsSettings)
 TEST_F(MwRecorderTest, GuardsEveryStep)
 {
     EXPECT_FALSE(_recorder.pause());
-    EXPECT_FALSE(_recorder.resume());
+    EXPECT_FALSE(_recorder.resume(_error));
     EXPECT_FALSE(_recorder.cancel());
     ASSERT_TRUE(start());
-    EXPECT_FALSE(_recorder.resume());
+    EXPECT_FALSE(_recorder.resume(_error));
     EXPECT_TRUE(_recorder.pause());
     EXPECT_FALSE(_recorder.pause());
-    EXPECT_TRUE(_recorder.resume());
+    EXPECT_TRUE(_recorder.resume(_error));
     EXPECT_TRUE(_recorder.pause());
     EXPECT_TRUE(_recorder.cancel());
     EXPECT_EQ(RECORDER_STATE_CREATED, fakes::recorder.state);
@@ -98,7 +98,7 @@ TEST_F(MwRecorderTest, GuardsEveryStep)
     EXPECT_FALSE(_recorder.createHandle(nullptr));
 }
 
-TEST_F(MwRecorderTest, StopCommitsAndIsTolerantOnlyForRequests)
+TEST_F(MwRecorderTest, StopNeverHidesAFailedCommit)
 {
     ASSERT_TRUE(start());
     EXPECT_TRUE(_recorder.stop());
@@ -113,7 +113,11 @@ TEST_F(MwRecorderTest, StopCommitsAndIsTolerantOnlyForRequests)
         fakes::recorder.state = RECORDER_STATE_RECORDING;
         _model.setRequestMode(request);
         calls.failWith("recorder_commit", -1);
-        EXPECT_EQ(request, _recorder.stop());
+        EXPECT_FALSE(_recorder.stop());
+        calls.clear();
+        calls.failWith("recorder_unprepare", -1);
+        EXPECT_EQ(request, _recorder.stop()) << "the file is complete";
+        calls.clear();
     }
 }
 
@@ -158,9 +162,9 @@ TEST_F(MwRecorderTest, ErrorsBecomeSignals)
     _recorder.errorSignal.addListener([&](MwRecorder::ErrorType type) { errors.push_back(type); });
     for (const int code : std::initializer_list<int>{RECORDER_ERROR_SECURITY_RESTRICTED,
              RECORDER_ERROR_SOUND_POLICY_BY_CALL, RECORDER_ERROR_SOUND_POLICY_BY_ALARM, RECORDER_ERROR_ESD,
-             RECORDER_ERROR_OUT_OF_STORAGE, RECORDER_ERROR_DEVICE, 0})
+             RECORDER_ERROR_OUT_OF_STORAGE, RECORDER_ERROR_DEVICE, 0, RECORDER_ERROR_STORAGE})
         fakes::recorder.error(code, RECORDER_STATE_RECORDING, fakes::recorder.userData);
-    EXPECT_EQ((std::vector<int>{4, 3, 1, 1, 2, 1, 1}), errors);
+    EXPECT_EQ((std::vector<int>{4, 3, 1, 1, 2, 1, 1, 5}), errors);
     fakes::recorder.interrupted(RECORDER_POLICY_NONE, RECORDER_STATE_READY, RECORDER_STATE_READY, nullptr);
     EXPECT_TRUE(fakes::log.has("self is nullptr"));
 }

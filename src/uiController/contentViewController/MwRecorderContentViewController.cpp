@@ -207,10 +207,10 @@ void MwRecorderContentViewController::_systemInfoChanged(MwSignalMgr::SystemInfo
 
 void MwRecorderContentViewController::_mmcRemoved()
 {
-    if (getModel()->getStorageType() == MW_STORAGE_CARD
-        && getModel()->getRecorderState() == MwRecorder::REC_STATE_RECORDING
-        && !getAppController()->dispatchCommand(MwAppController::CANCEL_RECORDING))
-        MW_LOGE("recording cancel failed");
+    // What can be kept is kept: on the card, when it is only about to go, or for the rescue, when it comes back.
+    if (getModel()->getStorageType() == MW_STORAGE_CARD && _isRecordingOrPaused() && !_isStopping)
+        _isStopping
+            = _dispatchAsync(MwAppController::STOP_RECORDING, &MwRecorderContentViewController::_stoppedByRemovedCard);
     _destroySaveToPopup();
 }
 

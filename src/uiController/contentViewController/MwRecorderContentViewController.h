@@ -119,6 +119,7 @@ private:
         MwAppController::Command command, void (MwRecorderContentViewController::*finished)(MwAppController::Result));
     void _stopFinished(MwAppController::Result result);
     void _tooShortCancelled(MwAppController::Result result);
+    void _stoppedByRemovedCard(MwAppController::Result result);
 
     // Popups
     void _renameRecordingFileName();
@@ -135,6 +136,7 @@ private:
     unsigned int _lastShownSeconds = 0;
     bool _addBookMarkEnabled = true;
     bool _skipNextResume = true;
+    bool _isStopping = false; // a stop is under way; another command would wait for it
     std::unique_ptr<MwRenamePopupController> _renamePopup;
     panekit::WTimer::Weak _blinkTimer;
     panekit::WTimer::Weak _statusUpdateTimer;

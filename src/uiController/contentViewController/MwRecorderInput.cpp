@@ -91,6 +91,8 @@ void MwRecorderContentViewController::_stopButtonClicked()
         MW_LOGW("current recorder state is [%d]!! can't stop recording", getModel()->getRecorderState());
         return;
     }
+    if (_isStopping)
+        return;
     if (getModel()->getElapsedTime() < SHORTEST_RECORDING)
         _cancelTooShortRecording();
     else
@@ -105,11 +107,13 @@ void MwRecorderContentViewController::_cancelTooShortRecording()
         MW_LOGE("Record stop failed!");
         return;
     }
+    _isStopping = true;
     _ignoreFurtherClicks("stop_button", _stopButtonCb);
 }
 
 void MwRecorderContentViewController::_tooShortCancelled(MwAppController::Result result)
 {
+    _isStopping = false;
     MW_LOGW("async Command[STOP_RECORDING] result is [%d]", result);
     if (result == MwAppController::FAIL)
         _createRecordingFailedPopup();
@@ -121,11 +125,23 @@ void MwRecorderContentViewController::_stopRecording()
         MW_LOGE("Record stop failed!");
         return;
     }
+    _isStopping = true;
     _ignoreFurtherClicks("stop_button", _stopButtonCb);
+}
+
+// The controller has told what became of a recording that could not be saved.
+void MwRecorderContentViewController::_stoppedByRemovedCard(MwAppController::Result result)
+{
+    _isStopping = false;
+    if (result != MwAppController::SUCCESS || getAppController()->getLastSavedPath().empty())
+        return;
+    _openRecordings();
+    mwPost("IDS_MW_TPOP_RECORDING_INTERRUPTED_WHAT_WAS_RECORDED_IS_SAVED");
 }
 
 void MwRecorderContentViewController::_stopFinished(MwAppController::Result result)
 {
+    _isStopping = false;
     MW_LOGW("async Command result [%d]", result);
     if (result == MwAppController::SUCCESS)
         _openRecordings();
@@ -141,7 +157,7 @@ void MwRecorderContentViewController::_recordingsButtonClicked()
 
 void MwRecorderContentViewController::_pauseButtonClicked()
 {
-    if (!_isComplete())
+    if (!_isComplete() || _isStopping)
         return;
     if (!getAppController()->dispatchCommand(MwAppController::PAUSE_RECORDING))
         MW_LOGE("Record pause failed!");
@@ -150,7 +166,7 @@ void MwRecorderContentViewController::_pauseButtonClicked()
 
 void MwRecorderContentViewController::_resumeButtonClicked()
 {
-    if (!_isComplete())
+    if (!_isComplete() || _isStopping)
         return;
     if (!getAppController()->dispatchCommand(MwAppController::RESUME_RECORDING))
         MW_LOGE("Record resume failed!");
@@ -159,7 +175,7 @@ void MwRecorderContentViewController::_resumeButtonClicked()
 
 void MwRecorderContentViewController::_bookmarkButtonClicked()
 {
-    if (!_isComplete())
+    if (!_isComplete() || _isStopping)
         return;
     if (!_isRecordingOrPaused()) {
         MW_LOGE("Invalid recorder state [%d]", getModel()->getRecorderState());
@@ -197,7 +213,7 @@ void MwRecorderContentViewController::_updateBookMarkEffect(unsigned int seconds
 
 void MwRecorderContentViewController::_backKeyClicked()
 {
-    if (!_isComplete())
+    if (!_isComplete() || _isStopping)
         return;
     if (_isRecordingOrPaused())
         _createDiscardPopup();

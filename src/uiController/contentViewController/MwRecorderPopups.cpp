@@ -96,12 +96,14 @@ void MwRecorderContentViewController::_discardRecording()
 {
     if (!_isComplete())
         return;
-    if (!getAppController()->dispatchCommand(MwAppController::CANCEL_RECORDING))
+    const bool discarded = getAppController()->dispatchCommand(MwAppController::CANCEL_RECORDING);
+    if (!discarded)
         MW_LOGE("Record cancel failed!");
     getModel()->clearBookMark();
     // Closes the popup when the recorder is ready again.
     _updateContentView();
-    mwPost("IDS_MW_TPOP_RECORDING_DISCARDED_M_SOUND");
+    if (discarded)
+        mwPost("IDS_MW_TPOP_RECORDING_DISCARDED_M_SOUND");
 }
 
 void MwRecorderContentViewController::_createStorageFullPopup()
