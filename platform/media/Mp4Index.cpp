@@ -62,6 +62,12 @@ namespace {
                 + matrix() + u32(0) + u32(0));
     }
 
+    std::string edits(uint64_t shown)
+    {
+        const std::string entry = time(shown) + (isLong(shown) ? u64(AAC_PRIMING_SAMPLES) : u32(AAC_PRIMING_SAMPLES));
+        return box("edts", box("elst", number(isLong(shown) ? 1 : 0, 1) + zeros(3) + u32(1) + entry + u32(0x10000)));
+    }
+
     std::string sampleDescription(const Mp4Track& track)
     {
         const std::string decoder = number(0x40, 1) + number(0x15, 1) + number(6144 / 8 * track.channels, 3)
@@ -95,10 +101,17 @@ std::string mp4FileHead(uint64_t dataBytes)
     return type + box("free", "") + u32(dataBytes + 8) + "mdat";
 }
 
-std::string mp4IndexHead(const Mp4Track& track, uint64_t frames)
+uint64_t aacSamples(uint64_t frames)
+{
+    const uint64_t all = frames * AAC_FRAME_SAMPLES;
+    return all > AAC_PRIMING_SAMPLES ? all - AAC_PRIMING_SAMPLES : 0;
+}
+
+std::string mp4IndexHead(const Mp4Track& track, uint64_t frames, uint64_t samples)
 {
     const uint64_t tail = 4 * frames;
     const uint64_t duration = frames * AAC_FRAME_SAMPLES;
+    const uint64_t shown = std::min(samples, aacSamples(frames));
     const std::string tables = sampleDescription(track)
         + box("stts", u32(0) + u32(1) + u32(frames) + u32(AAC_FRAME_SAMPLES))
         + box("stsc", u32(0) + u32(1) + u32(1) + u32(frames) + u32(1))
@@ -110,8 +123,8 @@ std::string mp4IndexHead(const Mp4Track& track, uint64_t frames)
         = box("mdhd", timedHead(duration) + u32(track.sampleRate) + time(duration) + u16(0x55C4) + u16(0))
         + box("hdlr", u32(0) + u32(0) + "soun" + zeros(12) + "SoundHandler" + zeros(1))
         + box("minf", information, tail);
-    const std::string trackContent = trackHeader(duration) + box("mdia", media, tail);
-    return box("moov", movieHeader(track, duration) + box("trak", trackContent, tail), tail);
+    const std::string trackContent = trackHeader(shown) + edits(shown) + box("mdia", media, tail);
+    return box("moov", movieHeader(track, shown) + box("trak", trackContent, tail), tail);
 }
 
 uint64_t mp4FileSize(uint64_t frames, uint64_t dataBytes)

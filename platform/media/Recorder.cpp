@@ -13,8 +13,10 @@ namespace media {
 
 namespace {
 
+    constexpr auto OPEN = std::chrono::milliseconds(3000);
     constexpr auto FIRST_SOUND = std::chrono::milliseconds(3000);
     constexpr auto DRAIN = std::chrono::milliseconds(1000);
+    constexpr auto QUICK_LOOK = std::chrono::milliseconds(40); // on the main loop
     constexpr int AMR_RATE = 8000;
 
     int errorFor(int systemError)
@@ -99,9 +101,9 @@ RecorderFormat Recorder::_format() const
     return format;
 }
 
-int Recorder::_refusal() const
+int Recorder::_refusal(std::chrono::milliseconds limit) const
 {
-    const auto sound = host::PulseWatch::instance().refresh();
+    const auto sound = host::PulseWatch::instance().refresh(limit);
     if (sound.hasCall)
         return RECORDER_ERROR_SOUND_POLICY_BY_CALL;
     return sound.hasAlarm ? RECORDER_ERROR_SOUND_POLICY_BY_ALARM : RECORDER_ERROR_NONE;
@@ -126,7 +128,7 @@ int Recorder::prepare()
         return RECORDER_ERROR_INVALID_PARAMETER;
     if (const int refusal = _refusal(); refusal != RECORDER_ERROR_NONE)
         return refusal;
-    _pipeline = RecorderPipeline::create(_format());
+    _pipeline = RecorderPipeline::create(_format(), OPEN);
     if (!_pipeline)
         return RECORDER_ERROR_DEVICE;
     _setState(RECORDER_STATE_READY);
@@ -156,14 +158,11 @@ int Recorder::start()
 int Recorder::_resume()
 {
     const auto recording = _current();
-    if (const int refusal = _refusal(); refusal != RECORDER_ERROR_NONE)
+    if (const int refusal = _refusal(QUICK_LOOK); refusal != RECORDER_ERROR_NONE)
         return refusal;
     _silentTicks = 0;
     recording->setHeld(false);
-    if (!_pipeline->play()) {
-        recording->setHeld(true);
-        return RECORDER_ERROR_DEVICE;
-    }
+    _pipeline->play();
     _setState(RECORDER_STATE_RECORDING);
     _noteSound(host::PulseWatch::instance().snapshot().hasCall);
     return RECORDER_ERROR_NONE;
@@ -177,7 +176,7 @@ int Recorder::_startNew()
         return refusal;
     _isEndedByPolicy = false;
     if (!_pipeline)
-        _pipeline = RecorderPipeline::create(_format());
+        _pipeline = RecorderPipeline::create(_format(), OPEN);
     if (!_pipeline)
         return RECORDER_ERROR_DEVICE;
     if (const int error = claimTemporary(_settings.path); error != 0)
@@ -210,8 +209,10 @@ int Recorder::_startOn(std::shared_ptr<Recording> recording)
 {
     _isAnnounced = false;
     _silentTicks = 0;
-    _pipeline->setListener(recording.get());
-    if (!_pipeline->play() || !recording->waitForSound(FIRST_SOUND)) {
+    _isStorageFailing = false;
+    _pipeline->setListener(recording);
+    _pipeline->play();
+    if (!recording->waitForSound(FIRST_SOUND)) {
         recording->close();
         _pipeline.reset();
         _discard();
@@ -233,10 +234,7 @@ int Recorder::pause()
         return RECORDER_ERROR_INVALID_STATE;
     const auto recording = _current();
     recording->setHeld(true);
-    if (!_pipeline->pause()) {
-        recording->setHeld(false);
-        return RECORDER_ERROR_DEVICE;
-    }
+    _pipeline->pause();
     _setState(RECORDER_STATE_PAUSED);
     return RECORDER_ERROR_NONE;
 }
@@ -256,16 +254,27 @@ int Recorder::commit()
     return errorFor(error);
 }
 
+// The file first: what becomes of the sound server is not its matter.
 int Recorder::_complete(Recording& recording)
 {
     recording.setHeld(true);
-    if (recording.trouble() != Trouble::STORAGE_FULL && recording.trouble() != Trouble::STORAGE_LOST) {
-        _pipeline->drain();
-        (void)recording.waitForDrain(DRAIN);
-    }
+    if (recording.trouble() != Trouble::STORAGE_FULL && recording.trouble() != Trouble::STORAGE_LOST)
+        _drain(recording);
     recording.close();
+    const int error = recording.file().finish(recording.samples());
     _pipeline.reset();
-    return recording.file().finish();
+    return error;
+}
+
+// A storage that is slow, but not stuck, gets all that waits for it.
+void Recorder::_drain(Recording& recording)
+{
+    _pipeline->drain();
+    for (uint64_t frames = 0;;) {
+        if (recording.waitForDrain(DRAIN) || recording.file().frames() == frames)
+            return;
+        frames = recording.file().frames();
+    }
 }
 
 int Recorder::cancel()

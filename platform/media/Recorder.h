@@ -6,6 +6,7 @@
 #include <recorder.h>
 
 #include <atomic>
+#include <chrono>
 #include <condition_variable>
 #include <memory>
 #include <mutex>
@@ -71,11 +72,12 @@ private:
     int _startNew();
     int _startOn(std::shared_ptr<Recording> recording);
     int _resume();
-    int _refusal() const;
+    int _refusal(std::chrono::milliseconds limit = std::chrono::milliseconds(200)) const;
     std::shared_ptr<Recording> _createRecording(int& error);
     Recording::Events _recordingEvents();
     // Writes out what was captured and closes the file; answers the system's error number.
     int _complete(Recording& recording);
+    void _drain(Recording& recording);
     void _discard();
     void _setState(recorder_state_e state, bool byPolicy = false);
     bool _isRecordingOrPaused() const;
@@ -91,6 +93,7 @@ private:
 
     void _keep();
     void _inspect(Recording& recording, bool isSecond);
+    void _inspectStorage(Recording& recording);
     void _watchMicrophone(const Recording& recording);
     void _endInterrupted(const std::shared_ptr<Recording>& recording);
     void _reportEnd(Trouble trouble, recorder_state_e before, int fileError);
@@ -103,6 +106,7 @@ private:
     std::atomic<recorder_state_e> _state{RECORDER_STATE_CREATED};
     std::atomic<bool> _isStatusPosted{false}; // one status under way at a time, however fast sound arrives
     std::atomic<bool> _isAnnounced{false}; // the status with elapsed 0 was sent
+    std::atomic<bool> _isStorageFailing{false}; // and that was told
 
     std::mutex _operation; // one operation, or the keeper's end of a recording; guards the next four
     RecorderSettings _settings;

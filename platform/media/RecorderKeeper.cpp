@@ -100,12 +100,8 @@ void Recorder::_keep()
 
 void Recorder::_inspect(Recording& recording, bool isSecond)
 {
-    if (isSecond) {
-        recording.file().flush();
-        recording.file().growReserve();
-        if (recording.file().freeSpaceError() != 0)
-            recording.reachLimit(RECORDER_RECORDING_LIMIT_FREE_SPACE);
-    }
+    if (isSecond)
+        _inspectStorage(recording);
     // An operation under way moves the samples itself.
     const std::unique_lock lock(_operation, std::try_to_lock);
     if (!lock || _state != RECORDER_STATE_RECORDING || _current().get() != &recording)
@@ -113,6 +109,20 @@ void Recorder::_inspect(Recording& recording, bool isSecond)
     _watchMicrophone(recording);
     if (_silentTicks >= SILENT_TICKS)
         recording.raise(Trouble::DEVICE_LOST);
+}
+
+void Recorder::_inspectStorage(Recording& recording)
+{
+    const int error = recording.file().flush();
+    if (error != 0 && !_isStorageFailing.exchange(true)) {
+        PLATFORM_LOGE("the recording cannot be flushed: [%d]", error);
+        _post([state = state()](const RecorderCallbacks& to) { to.error(RECORDER_ERROR_STORAGE, state); });
+    }
+    recording.file().growReserve();
+    if (recording.file().freeSpaceError() != 0)
+        recording.reachLimit(RECORDER_RECORDING_LIMIT_FREE_SPACE);
+    if (!recording.file().isInPlace())
+        recording.raise(Trouble::STORAGE_LOST);
 }
 
 // Ticks of our own rather than the clock: a process that was stopped for a while has missed nothing.

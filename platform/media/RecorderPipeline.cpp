@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <array>
+#include <atomic>
 #include <cstdlib>
 
 namespace media {
@@ -12,7 +13,9 @@ namespace {
 
     // Ten seconds bridge a storage that stalls.
     constexpr auto QUEUE = "queue name=queue max-size-time=10000000000 max-size-bytes=0 max-size-buffers=0";
-    constexpr auto SOUND_SERVER = "pulsesrc client-name=Mewlo stream-properties=props,media.role=production";
+    constexpr auto TEAR_DOWN = std::chrono::milliseconds(30);
+    constexpr auto SOUND_SERVER
+        = "pulsesrc name=microphone client-name=Mewlo stream-properties=props,media.role=production";
     constexpr auto CONVERTER = " ! audioconvert ! audioresample";
     constexpr auto SINK = "fakesink async=false sync=false";
     constexpr int AAC_MOST_BITS = 320000;
@@ -67,22 +70,71 @@ bool isGStreamerReady()
     return ready;
 }
 
-RecorderPipeline::RecorderPipeline(const RecorderFormat& format)
+RecorderPipeline::RecorderPipeline()
+    : _steps(StepThread::create())
+{
+}
+
+std::unique_ptr<RecorderPipeline> RecorderPipeline::create(
+    const RecorderFormat& format, std::chrono::milliseconds limit)
+{
+    if (!isGStreamerReady())
+        return nullptr;
+    std::unique_ptr<RecorderPipeline> self(new RecorderPipeline);
+    self->_chain = std::make_shared<Chain>(format);
+    const auto isOpen = std::make_shared<std::atomic<bool>>(false);
+    self->_steps->add([chain = self->_chain, isOpen] { *isOpen = chain->open(); });
+    if (!self->_steps->wait(limit))
+        PLATFORM_LOGE("the sound server does not answer");
+    return *isOpen ? std::move(self) : nullptr;
+}
+
+// In the ordinary case the microphone is free when this returns.
+RecorderPipeline::~RecorderPipeline()
+{
+    _steps->add([chain = std::exchange(_chain, nullptr)] { chain->change(GST_STATE_NULL); });
+    _steps->finish();
+    (void)_steps->wait(TEAR_DOWN);
+}
+
+void RecorderPipeline::setListener(std::shared_ptr<CaptureListener> listener)
+{
+    _chain->setListener(std::move(listener));
+}
+
+void RecorderPipeline::play()
+{
+    _steps->add([chain = _chain] { chain->change(GST_STATE_PLAYING); });
+}
+
+void RecorderPipeline::pause()
+{
+    _steps->add([chain = _chain] { chain->change(GST_STATE_PAUSED); });
+}
+
+void RecorderPipeline::drain() { _chain->drain(); }
+
+double RecorderPipeline::backlog() const { return _chain->backlog(); }
+
+std::string RecorderPipeline::microphone() const { return _chain->microphone(); }
+
+RecorderPipeline::Chain::Chain(const RecorderFormat& format)
     : _format(format)
 {
 }
 
-std::unique_ptr<RecorderPipeline> RecorderPipeline::create(const RecorderFormat& format)
+bool RecorderPipeline::Chain::open()
 {
-    if (!isGStreamerReady())
-        return nullptr;
-    std::unique_ptr<RecorderPipeline> self(new RecorderPipeline(format));
-    if (!self->_build() || gst_element_set_state(self->_pipeline, GST_STATE_READY) == GST_STATE_CHANGE_FAILURE)
-        return nullptr;
-    return self;
+    return _build() && gst_element_set_state(_pipeline, GST_STATE_READY) != GST_STATE_CHANGE_FAILURE;
 }
 
-bool RecorderPipeline::_build()
+void RecorderPipeline::Chain::change(GstState state)
+{
+    if (_pipeline != nullptr && gst_element_set_state(_pipeline, state) == GST_STATE_CHANGE_FAILURE && _listener)
+        _listener->onFailed("the state cannot be changed");
+}
+
+bool RecorderPipeline::Chain::_build()
 {
     GError* error = nullptr;
     _pipeline = gst_parse_launch_full(description(_format).c_str(), nullptr, GST_PARSE_FLAG_FATAL_ERRORS, &error);
@@ -100,14 +152,14 @@ bool RecorderPipeline::_build()
 }
 
 // Messages are taken where they arise: nobody has to empty a queue of them.
-void RecorderPipeline::_watch()
+void RecorderPipeline::Chain::_watch()
 {
     GstBus* bus = gst_element_get_bus(_pipeline);
     gst_bus_set_sync_handler(bus, _messageCb, this, nullptr);
     gst_object_unref(bus);
 }
 
-RecorderPipeline::~RecorderPipeline()
+RecorderPipeline::Chain::~Chain()
 {
     if (_pipeline == nullptr)
         return;
@@ -119,17 +171,7 @@ RecorderPipeline::~RecorderPipeline()
     g_clear_object(&_pipeline);
 }
 
-bool RecorderPipeline::play()
-{
-    return gst_element_set_state(_pipeline, GST_STATE_PLAYING) != GST_STATE_CHANGE_FAILURE;
-}
-
-bool RecorderPipeline::pause()
-{
-    return gst_element_set_state(_pipeline, GST_STATE_PAUSED) != GST_STATE_CHANGE_FAILURE;
-}
-
-void RecorderPipeline::drain()
+void RecorderPipeline::Chain::drain()
 {
     // Sent into the queue rather than to the source: works while paused, and its lock puts it behind the last buffer.
     GstPad* pad = gst_element_get_static_pad(_queue, "sink");
@@ -137,19 +179,32 @@ void RecorderPipeline::drain()
     gst_object_unref(pad);
 }
 
-double RecorderPipeline::backlog() const
+std::string RecorderPipeline::Chain::microphone() const
+{
+    GstElement* source = gst_bin_get_by_name(GST_BIN(_pipeline), "microphone");
+    if (source == nullptr)
+        return {};
+    gchar* device = nullptr;
+    g_object_get(source, "current-device", &device, nullptr);
+    gst_object_unref(source);
+    std::string name = device != nullptr ? device : "";
+    g_free(device);
+    return name;
+}
+
+double RecorderPipeline::Chain::backlog() const
 {
     guint64 waiting = 0;
     g_object_get(_queue, "current-level-time", &waiting, nullptr);
     return static_cast<double>(waiting) / GST_SECOND;
 }
 
-GstPadProbeReturn RecorderPipeline::_capture(GstPadProbeInfo* info)
+GstPadProbeReturn RecorderPipeline::Chain::_capture(GstPadProbeInfo* info)
 {
     GstBuffer* buffer = gst_buffer_make_writable(GST_PAD_PROBE_INFO_BUFFER(info));
     GST_PAD_PROBE_INFO_DATA(info) = buffer;
     GstMapInfo map;
-    if (_listener == nullptr || !gst_buffer_map(buffer, &map, GST_MAP_READ))
+    if (!_listener || !gst_buffer_map(buffer, &map, GST_MAP_READ))
         return GST_PAD_PROBE_DROP;
     const size_t count = map.size / sizeof(int16_t);
     const size_t taken = _listener->onCaptured(reinterpret_cast<const int16_t*>(map.data), count);
@@ -169,7 +224,7 @@ GstPadProbeReturn RecorderPipeline::_capture(GstPadProbeInfo* info)
 }
 
 // The encoder forgets what it looked ahead at when the stream ends; silence pushes the last sound out.
-void RecorderPipeline::_pushSilence(GstPad* pad)
+void RecorderPipeline::Chain::_pushSilence(GstPad* pad)
 {
     if (_samples == 0)
         return;
@@ -182,23 +237,23 @@ void RecorderPipeline::_pushSilence(GstPad* pad)
     (void)gst_pad_chain(pad, silence);
 }
 
-GstPadProbeReturn RecorderPipeline::_captureCb(GstPad*, GstPadProbeInfo* info, gpointer self)
+GstPadProbeReturn RecorderPipeline::Chain::_captureCb(GstPad*, GstPadProbeInfo* info, gpointer self)
 {
-    return static_cast<RecorderPipeline*>(self)->_capture(info);
+    return static_cast<Chain*>(self)->_capture(info);
 }
 
-GstPadProbeReturn RecorderPipeline::_encoderInputCb(GstPad* pad, GstPadProbeInfo* info, gpointer self)
+GstPadProbeReturn RecorderPipeline::Chain::_encoderInputCb(GstPad* pad, GstPadProbeInfo* info, gpointer self)
 {
     if (isEnd(info))
-        static_cast<RecorderPipeline*>(self)->_pushSilence(pad);
+        static_cast<Chain*>(self)->_pushSilence(pad);
     return GST_PAD_PROBE_OK;
 }
 
 // Takes every frame and the end away from the sink, which would wait for the playing state.
-GstPadProbeReturn RecorderPipeline::_encoderOutputCb(GstPad*, GstPadProbeInfo* info, gpointer self)
+GstPadProbeReturn RecorderPipeline::Chain::_encoderOutputCb(GstPad*, GstPadProbeInfo* info, gpointer self)
 {
-    auto* listener = static_cast<RecorderPipeline*>(self)->_listener;
-    if (listener == nullptr)
+    const auto& listener = static_cast<Chain*>(self)->_listener;
+    if (!listener)
         return GST_PAD_PROBE_DROP;
     if (isEnd(info)) {
         listener->onDrained();
@@ -214,12 +269,12 @@ GstPadProbeReturn RecorderPipeline::_encoderOutputCb(GstPad*, GstPadProbeInfo* i
     return GST_PAD_PROBE_DROP;
 }
 
-GstBusSyncReply RecorderPipeline::_messageCb(GstBus*, GstMessage* message, gpointer self)
+GstBusSyncReply RecorderPipeline::Chain::_messageCb(GstBus*, GstMessage* message, gpointer self)
 {
     if (GST_MESSAGE_TYPE(message) == GST_MESSAGE_ERROR) {
         GError* error = nullptr;
         gst_message_parse_error(message, &error, nullptr);
-        if (auto* listener = static_cast<RecorderPipeline*>(self)->_listener; listener != nullptr)
+        if (const auto& listener = static_cast<Chain*>(self)->_listener; listener)
             listener->onFailed(error->message);
         else
             PLATFORM_LOGE("no microphone: %s", error->message);

@@ -1,15 +1,19 @@
 #pragma once
 
+#include "media/StepThread.h"
+
 #include <gst/gst.h>
 
+#include <chrono>
 #include <cstddef>
 #include <cstdint>
 #include <memory>
 #include <string>
+#include <utility>
 
 namespace media {
 
-// Hears what the pipeline captures and encodes. Called on streaming threads; must neither wait nor call the pipeline.
+// Hears what the pipeline captures and encodes. Called on threads of the pipeline; must neither wait nor call it.
 class CaptureListener {
 public:
     virtual ~CaptureListener() = default;
@@ -34,27 +38,54 @@ struct RecorderFormat {
 
 // Microphone, queue and encoder. The sound is re-stamped to an unbroken time line at the queue, so a pause leaves no
 // gap; encoded frames go to the listener and nowhere else. One caller at a time; nothing here waits for the main loop.
+// What talks to the sound server runs in a thread of its own, step after step: a server that hangs holds that thread
+// and nobody else, and what hangs at the end goes on by itself.
 class RecorderPipeline {
 public:
-    // Opens the microphone's server; none when that fails. MEWLO_AUDIO_SOURCE names another source than the sound
-    // server, in the notation of gst-launch.
-    static std::unique_ptr<RecorderPipeline> create(const RecorderFormat& format);
+    // Opens the microphone's server; none when that fails or takes longer than the limit. MEWLO_AUDIO_SOURCE names
+    // another source than the sound server, in the notation of gst-launch.
+    static std::unique_ptr<RecorderPipeline> create(const RecorderFormat& format, std::chrono::milliseconds limit);
     ~RecorderPipeline();
     RecorderPipeline(const RecorderPipeline&) = delete;
     RecorderPipeline& operator=(const RecorderPipeline&) = delete;
 
-    // The listener must outlive the pipeline.
-    void setListener(CaptureListener* listener) { _listener = listener; }
-    bool play();
-    // Stops capturing and gives the microphone free for others; what is captured is still encoded.
-    bool pause();
+    // Before the first play(). Kept until the pipeline's threads have ended, which may be after the pipeline.
+    void setListener(std::shared_ptr<CaptureListener> listener);
+    // Begins in a moment; the listener hears of a failure.
+    void play();
+    // Stops capturing, in a moment, and gives the microphone free for others; what is captured is still encoded.
+    void pause();
     // Encodes the rest, in any state; onDrained() follows. Nothing is captured afterwards.
     void drain();
     // Seconds of sound waiting for the encoder: a storage that does not keep up, not a silent microphone.
     [[nodiscard]] double backlog() const;
+    // The server's name of the microphone in use; empty when unknown.
+    [[nodiscard]] std::string microphone() const;
 
 private:
-    explicit RecorderPipeline(const RecorderFormat& format);
+    class Chain;
+    RecorderPipeline();
+
+    const std::shared_ptr<StepThread> _steps;
+    std::shared_ptr<Chain> _chain;
+};
+
+// The elements behind a pipeline.
+class RecorderPipeline::Chain {
+public:
+    explicit Chain(const RecorderFormat& format);
+    ~Chain();
+    Chain(const Chain&) = delete;
+    Chain& operator=(const Chain&) = delete;
+
+    bool open();
+    void change(GstState state);
+    void drain();
+    [[nodiscard]] double backlog() const;
+    [[nodiscard]] std::string microphone() const;
+    void setListener(std::shared_ptr<CaptureListener> listener) { _listener = std::move(listener); }
+
+private:
     bool _build();
     void _watch();
     void _pushSilence(GstPad* pad);
@@ -66,7 +97,7 @@ private:
     static GstBusSyncReply _messageCb(GstBus* bus, GstMessage* message, gpointer self);
 
     RecorderFormat _format;
-    CaptureListener* _listener = nullptr;
+    std::shared_ptr<CaptureListener> _listener;
     GstElement* _pipeline = nullptr;
     GstElement* _queue = nullptr;
     uint64_t _samples = 0; // on the time line; streaming thread

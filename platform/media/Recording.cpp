@@ -52,6 +52,16 @@ void Recording::_notify()
     _changed.notify_all();
 }
 
+void Recording::close()
+{
+    {
+        const std::scoped_lock lock(_writing);
+        _isClosed = true;
+    }
+    const std::scoped_lock lock(_telling);
+    _isMuted = true;
+}
+
 void Recording::raise(Trouble trouble)
 {
     Trouble none = Trouble::NONE;
@@ -59,7 +69,7 @@ void Recording::raise(Trouble trouble)
         return;
     _isFull = true;
     _notify();
-    _events.trouble();
+    _tell([this] { _events.trouble(); });
 }
 
 bool Recording::waitForSound(std::chrono::milliseconds limit)
@@ -78,7 +88,7 @@ bool Recording::waitForDrain(std::chrono::milliseconds limit)
 void Recording::reachLimit(recorder_recording_limit_type_e type)
 {
     if (!_isFull.exchange(true))
-        _events.limit(type);
+        _tell([&] { _events.limit(type); });
 }
 
 void Recording::_measure(const int16_t* samples, size_t count)
@@ -103,7 +113,7 @@ size_t Recording::onCaptured(const int16_t* samples, size_t count)
         _notify();
     const auto rate = static_cast<uint64_t>(_format.sampleRate);
     if (before * PROGRESS_PER_SECOND / rate != (before + taken) * PROGRESS_PER_SECOND / rate)
-        _events.progress();
+        _tell([this] { _events.progress(); });
     if (isLast)
         reachLimit(RECORDER_RECORDING_LIMIT_TIME);
     return taken;
@@ -112,6 +122,7 @@ size_t Recording::onCaptured(const int16_t* samples, size_t count)
 void Recording::onFrame(const void* frame, size_t size)
 {
     // The silence that drives the last sound out of the encoder may end in frames of its own.
+    const std::scoped_lock lock(_writing);
     const uint64_t frameSamples = _format.frameSamples();
     const uint64_t needed = (_samples + _format.lookAhead() + frameSamples - 1) / frameSamples;
     if (_isClosed || _file->frames() >= needed)

@@ -35,8 +35,8 @@ public:
 
     // Holding drops what the microphone delivers. The pipeline is paused after, and played before letting go.
     void setHeld(bool held) { _isHeld = held; }
-    // From now on no frame is written.
-    void close() { _isClosed = true; }
+    // When this returns no frame is being written and nothing told, and none will be.
+    void close();
     void raise(Trouble trouble);
 
     [[nodiscard]] Trouble trouble() const { return _trouble; }
@@ -61,6 +61,13 @@ public:
 private:
     void _measure(const int16_t* samples, size_t count);
     void _notify();
+    template <typename Tell>
+    void _tell(const Tell& tell)
+    {
+        const std::scoped_lock lock(_telling);
+        if (!_isMuted)
+            tell();
+    }
 
     const std::unique_ptr<RecordingFile> _file;
     const RecorderFormat _format;
@@ -73,6 +80,9 @@ private:
     std::atomic<bool> _isClosed{false};
     std::atomic<bool> _isDrained{false};
     std::atomic<Trouble> _trouble{Trouble::NONE};
+    std::mutex _writing; // held while a frame is written
+    std::mutex _telling; // held while an event is told; guards the next one
+    bool _isMuted = false;
     std::mutex _mutex; // only for waiting
     std::condition_variable _changed;
 };

@@ -59,6 +59,13 @@ namespace {
             && open.st_dev == named.st_dev;
     }
 
+    // A regular file under no other name.
+    bool isOrdinary(int fd)
+    {
+        struct stat status { };
+        return fstat(fd, &status) == 0 && S_ISREG(status.st_mode) && status.st_nlink <= 1;
+    }
+
     int renameWithoutReplacing(const std::string& from, const std::string& to)
     {
         if (renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0)
@@ -154,8 +161,15 @@ int openLocked(const std::string& journalPath)
 {
     for (int attempt = 0; attempt < ATTEMPTS; ++attempt) {
         FileDescriptor fd(open(journalPath.c_str(), O_RDWR | O_CREAT | O_CLOEXEC | O_NOFOLLOW, JOURNAL_MODE));
+        const int error = errno;
+        if (fd ? !isOrdinary(fd.get()) : error == ELOOP) {
+            // Planted: what it leads to is not ours to touch.
+            if (unlink(journalPath.c_str()) != 0)
+                return -errno;
+            continue;
+        }
         if (!fd)
-            return -errno;
+            return -error;
         if (flock(fd.get(), LOCK_EX | LOCK_NB) != 0)
             return -errno;
         // The previous holder may have removed or renamed it between our opening and locking.

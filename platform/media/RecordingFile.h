@@ -9,6 +9,13 @@
 
 namespace media {
 
+// What tells one state of a file from another.
+struct FileVersion {
+    uint64_t inode = 0;
+    int64_t changed = 0; // nanoseconds
+    bool operator==(const FileVersion&) const = default;
+};
+
 // The file of one running recording with its journal. append() belongs to one thread at a time, flush() and
 // freeSpaceError() may run beside it. Every frame is in the system's hands when append() returns.
 class RecordingFile {
@@ -23,18 +30,24 @@ public:
     [[nodiscard]] uint64_t size() const;
     [[nodiscard]] uint64_t frames() const { return _frames; }
 
-    // To the storage: the recording first, so that the journal never promises more than there is.
-    void flush();
+    // To the storage, with the application's notes: the recording first, so that the journal never promises more than
+    // there is. Answers 0 or the system's error number.
+    int flush();
+    // Whether the path still leads to the file.
+    [[nodiscard]] bool isInPlace() const;
     // Room for the index is kept back for the case that the storage fills up; grows with the recording.
     void growReserve();
     // ENOSPC when the storage has no more room than finishing needs, else 0.
     [[nodiscard]] int freeSpaceError() const;
 
-    // Makes it an ordinary file and flushes; answers 0 or the system's error number.
-    int finish();
+    // Makes it an ordinary file of that many samples and flushes, under its path, wherever that leads by now; answers 0
+    // or the system's error number.
+    int finish(uint64_t samples);
 
 private:
     RecordingFile(std::string path, JournalHeader header);
+    int _flushNotes();
+    int _putBack();
 
     std::string _path;
     JournalHeader _header;
@@ -42,7 +55,8 @@ private:
     FileDescriptor _journal;
     FileDescriptor _reserve;
     uint64_t _reserved = 0;
-    uint64_t _flushedFrames = 0; // by the flushing thread
+    uint64_t _flushedFrames = 0; // by the flushing thread, as the next one
+    FileVersion _flushedNotes;
     std::atomic<uint64_t> _frames{0};
     std::atomic<uint64_t> _bytes{0}; // of the frames
 };

@@ -97,7 +97,7 @@ namespace {
         // The journal first: a repetition must not take a half-written index for further frames.
         if (ftruncate(journal, journalSize(frames.count)) != 0 || fdatasync(journal) != 0)
             return resultOf(errno, RECORDER_FILE_FORMAT_MP4);
-        return resultOf(finishMp4(file, journal, header, frames), RECORDER_FILE_FORMAT_MP4);
+        return resultOf(finishMp4(file, journal, header, frames, aacSamples(frames.count)), RECORDER_FILE_FORMAT_MP4);
     }
 
     off_t dropBlankAmrTail(int file, off_t end)
@@ -143,10 +143,10 @@ namespace {
 
 }
 
-int finishMp4(int file, int journal, JournalHeader header, const JournalFrames& frames)
+int finishMp4(int file, int journal, JournalHeader header, const JournalFrames& frames, uint64_t samples)
 {
     const off_t end = static_cast<off_t>(MP4_DATA_START + frames.bytes);
-    const std::string index = mp4IndexHead(header.track(), frames.count);
+    const std::string index = mp4IndexHead(header.track(), frames.count, samples);
     const std::string head = mp4FileHead(frames.bytes);
     if (ftruncate(file, end) != 0)
         return errno;

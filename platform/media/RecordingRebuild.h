@@ -19,7 +19,7 @@ struct RebuildResult {
 
 // Writes the index of an MP4 recording behind its frames, then its head, flushing in between, and marks the journal.
 // A crash at any point leaves what a repetition completes. Answers 0 or the system's error number.
-int finishMp4(int file, int journal, JournalHeader header, const JournalFrames& frames);
+int finishMp4(int file, int journal, JournalHeader header, const JournalFrames& frames, uint64_t samples);
 int finishAmr(int file, int journal, JournalHeader header);
 // Makes the best of a leftover, whatever part of file and journal survived. Any thread; both must be open for writing.
 RebuildResult rebuildRecording(int file, int journal);

@@ -58,7 +58,8 @@ bool isBeingMoved(const std::string& temporaryPath, const std::string& group)
 {
     if (access((group + JOURNAL_SUFFIX).c_str(), F_OK) == 0)
         return false;
-    const FileDescriptor journal(open((temporaryPath + JOURNAL_SUFFIX).c_str(), O_RDONLY | O_CLOEXEC));
+    const FileDescriptor journal(
+        open((temporaryPath + JOURNAL_SUFFIX).c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC));
     const auto header = journal ? readJournalHeader(journal.get()) : std::nullopt;
     return header && header->rescueId != 0 && rescueName(temporaryPath, header->rescueId) == group;
 }

@@ -4,8 +4,9 @@
 #include <recorder_leftover.h>
 
 #include <cstdio>
-#include <fstream>
+#include <fcntl.h>
 #include <memory>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include "MwHandle.h"
@@ -17,6 +18,8 @@ namespace {
 constexpr auto GROUP_RECORDING = "recording";
 constexpr auto GROUP_BOOKMARKS = "bookmarks";
 constexpr auto KEY_NAME = "name";
+constexpr mode_t OWNER_ONLY = 0600;
+constexpr off_t MOST_BYTES = 1024 * 1024;
 
 using KeyFile = MwHandle<GKeyFile*, g_key_file_unref>;
 
@@ -42,6 +45,35 @@ void loadBookmarks(GKeyFile* file, std::vector<MwBookmark>& bookmarks)
     g_strfreev(keys);
 }
 
+// What somebody else put there, such as a link, is neither written through nor kept.
+bool writeNew(const std::string& path, const std::string& text)
+{
+    ::unlink(path.c_str());
+    const int handle = ::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, OWNER_ONLY);
+    if (handle < 0)
+        return false;
+    const bool written = ::fchmod(handle, OWNER_ONLY) == 0
+        && ::write(handle, text.data(), text.size()) == static_cast<ssize_t>(text.size());
+    return ::close(handle) == 0 && written;
+}
+
+// Empty when it is not a regular file of a credible size.
+std::string readOrdinary(const std::string& path)
+{
+    const int handle = ::open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC);
+    if (handle < 0)
+        return {};
+    struct stat status { };
+    std::string text;
+    if (::fstat(handle, &status) == 0 && S_ISREG(status.st_mode) && status.st_size <= MOST_BYTES) {
+        text.resize(static_cast<size_t>(status.st_size));
+        const ssize_t count = ::read(handle, text.data(), text.size());
+        text.resize(count > 0 ? static_cast<size_t>(count) : 0);
+    }
+    ::close(handle);
+    return text;
+}
+
 }
 
 namespace MwRecordingNotes {
@@ -62,13 +94,10 @@ bool save(const std::string& notesPath, const Content& content)
         g_key_file_set_string(
             file.get(), GROUP_BOOKMARKS, std::to_string(bookmark.markedTime).c_str(), bookmark.name.c_str());
     // Written beside and renamed: a crash leaves the old notes or the new ones. No flush here, this runs on the main
-    // loop; file systems order a replacing rename after the data.
+    // loop; the recorder flushes them with the sound.
     const std::string beside = notesPath + "~";
     const std::string text = takeText(g_key_file_to_data(file.get(), nullptr, nullptr));
-    std::ofstream out(beside, std::ios::binary | std::ios::trunc);
-    out << text;
-    out.close();
-    if (out && std::rename(beside.c_str(), notesPath.c_str()) == 0)
+    if (writeNew(beside, text) && std::rename(beside.c_str(), notesPath.c_str()) == 0)
         return true;
     MW_LOGE("notes of the recording cannot be written");
     ::unlink(beside.c_str());
@@ -88,7 +117,8 @@ bool keepFor(const std::string& notesPath, const std::string& recordingPath)
 std::optional<Content> load(const std::string& notesPath)
 {
     const KeyFile file(g_key_file_new());
-    if (!g_key_file_load_from_file(file.get(), notesPath.c_str(), G_KEY_FILE_NONE, nullptr))
+    const std::string text = readOrdinary(notesPath);
+    if (text.empty() || !g_key_file_load_from_data(file.get(), text.data(), text.size(), G_KEY_FILE_NONE, nullptr))
         return std::nullopt;
     Content content;
     content.name = takeText(g_key_file_get_string(file.get(), GROUP_RECORDING, KEY_NAME, nullptr));

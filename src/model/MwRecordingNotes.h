@@ -19,7 +19,7 @@ struct Content {
 std::string pathFor(const std::string& temporaryPath);
 // The notes that wait beside a saved recording until its bookmarks are in the database.
 std::string pathForSaved(const std::string& recordingPath);
-// Replaces the notes atomically.
+// Replaces the notes atomically; only the owner can read them.
 bool save(const std::string& notesPath, const Content& content);
 // Gives the notes of a running recording a second name; needs no room on the disk where the file system can.
 bool keepFor(const std::string& notesPath, const std::string& recordingPath);

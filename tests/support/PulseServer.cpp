@@ -72,6 +72,8 @@ PulseServer::~PulseServer()
         setenv("PULSE_SERVER", _previousServer.c_str(), 1);
 }
 
+void PulseServer::signal(int number) const { _daemon.signal(number); }
+
 void PulseServer::kill() { _daemon.end(); }
 
 Program PulseServer::speak(const std::string& wav) const

@@ -32,6 +32,8 @@ public:
     [[nodiscard]] std::string load(const std::string& moduleAndArguments) const;
     void unload(const std::string& moduleNumberOrName) const;
     [[nodiscard]] std::string control(const std::string& pactlArguments) const;
+    // SIGSTOP lets the daemon hang, SIGCONT go on.
+    void signal(int number) const;
     // Ends the daemon as a crash would.
     void kill();
 

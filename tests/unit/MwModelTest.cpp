@@ -5,6 +5,7 @@
 #include <vconf.h>
 
 #include <filesystem>
+#include <sys/stat.h>
 
 #include "MwRecordingNotes.h"
 #include "MwText.h"
@@ -177,6 +178,36 @@ TEST_F(MwModelTest, NotesSurviveHostileNamesAndDamage)
     support::writeFile(path, "no key file \xff");
     EXPECT_FALSE(MwRecordingNotes::load(path));
     EXPECT_FALSE(MwRecordingNotes::save("/nonexistent/notes", content));
+}
+
+TEST_F(MwModelTest, NotesAreTheOwnersAndFollowNoLink)
+{
+    const std::string path = support::deviceRoot() + "/.mw_temp.notes";
+    const std::string victim = support::deviceRoot() + "/victim";
+    const MwRecordingNotes::Content content{"mine", {}};
+    const mode_t before = umask(0);
+    for (const mode_t mask : {0000, 0777}) {
+        for (const char* planted : {"~", ""}) {
+            support::writeFile(victim, "[recording]\nname=theirs\n");
+            std::filesystem::remove(path);
+            std::filesystem::create_symlink(victim, path + planted);
+            umask(mask);
+            EXPECT_FALSE(MwRecordingNotes::load(path)) << "what a link leads to is not ours";
+            EXPECT_TRUE(MwRecordingNotes::save(path, content));
+            umask(0);
+            EXPECT_EQ("[recording]\nname=theirs\n", support::readFile(victim));
+            EXPECT_EQ("mine", MwRecordingNotes::load(path)->name);
+            struct stat status { };
+            EXPECT_EQ(0, lstat(path.c_str(), &status));
+            EXPECT_EQ(S_IFREG | 0600u, status.st_mode);
+            std::filesystem::remove(victim);
+        }
+    }
+    umask(before);
+    std::filesystem::remove(path);
+    ASSERT_EQ(0, mkfifo(path.c_str(), 0600));
+    EXPECT_FALSE(MwRecordingNotes::load(path)) << "and a pipe holds nobody";
+    std::filesystem::remove(path);
 }
 
 TEST_F(MwModelTest, StorageFollowsTheCardAndTheChoice)
