@@ -2,7 +2,7 @@
 
 BUILD_PACKAGES=(g++ cmake ninja-build pkg-config gettext librsvg2-bin
   libefl-all-dev libcairo2-dev libglib2.0-dev libsystemd-dev libicu-dev libsqlite3-dev libpulse-dev
-  libgstreamer1.0-dev libgstreamer-plugins-base1.0-dev libx11-dev libxext-dev libxss-dev)
+  libgstreamer1.0-dev libgstreamer-plugins-base1.0-dev libavformat-dev libavcodec-dev libavutil-dev libx11-dev libxext-dev libxss-dev)
 RUN_PACKAGES=(gstreamer1.0-plugins-base gstreamer1.0-plugins-good gstreamer1.0-plugins-bad gstreamer1.0-plugins-ugly
   gstreamer1.0-libav gstreamer1.0-pulseaudio fonts-dejavu-core xdg-utils)
 DISPLAYLESS_PACKAGES=(xvfb openbox xdotool x11-utils imagemagick pulseaudio pulseaudio-utils espeak-ng ffmpeg)

@@ -29,6 +29,19 @@ CREATE TABLE IF NOT EXISTS bookmark(
 CREATE INDEX IF NOT EXISTS bookmark_media ON bookmark(MEDIA_ID, BOOKMARK_MARKED_TIME);
 )";
 
+    // A cache: how loud recordings are. Goes with the recording, follows its path, and is bounded.
+    constexpr auto WAVEFORM_SCHEMA = R"(
+CREATE TABLE IF NOT EXISTS waveform(
+  WAVEFORM_ID INTEGER PRIMARY KEY AUTOINCREMENT, WAVEFORM_PATH TEXT UNIQUE NOT NULL, WAVEFORM_SIZE INTEGER NOT NULL,
+  WAVEFORM_TIME INTEGER NOT NULL, WAVEFORM_SAMPLES BLOB NOT NULL);
+CREATE TRIGGER IF NOT EXISTS waveform_goes AFTER DELETE ON media BEGIN
+  DELETE FROM waveform WHERE WAVEFORM_PATH = OLD.MEDIA_PATH; END;
+CREATE TRIGGER IF NOT EXISTS waveform_follows AFTER UPDATE OF MEDIA_PATH ON media BEGIN
+  UPDATE OR REPLACE waveform SET WAVEFORM_PATH = NEW.MEDIA_PATH WHERE WAVEFORM_PATH = OLD.MEDIA_PATH; END;
+CREATE TRIGGER IF NOT EXISTS waveform_bound AFTER INSERT ON waveform BEGIN
+  DELETE FROM waveform WHERE WAVEFORM_ID <= NEW.WAVEFORM_ID - 1500; END;
+)";
+
     constexpr auto MEDIA_COLUMNS
         = "MEDIA_ID, MEDIA_PATH, MEDIA_DISPLAY_NAME, MEDIA_MIME_TYPE, MEDIA_MODE, MEDIA_STORAGE, "
           "MEDIA_SIZE, MEDIA_ADDED_TIME, MEDIA_MODIFIED_TIME, MEDIA_TIMELINE, MEDIA_DURATION";
@@ -65,6 +78,11 @@ public:
         return _keep(
             sqlite3_bind_text(_statement, ++_parameter, text.data(), static_cast<int>(text.size()), SQLITE_TRANSIENT));
     }
+    Statement& bindBytes(const std::string& bytes)
+    {
+        return _keep(
+            sqlite3_bind_blob(_statement, ++_parameter, bytes.data(), static_cast<int>(bytes.size()), SQLITE_TRANSIENT));
+    }
     Statement& bind(long long value) { return _keep(sqlite3_bind_int64(_statement, ++_parameter, value)); }
 
     // True while there is a row.
@@ -86,6 +104,12 @@ public:
     [[nodiscard]] std::string text(int column) const
     {
         const auto* data = reinterpret_cast<const char*>(sqlite3_column_text(_statement, column));
+        return data != nullptr ? std::string(data, static_cast<size_t>(sqlite3_column_bytes(_statement, column)))
+                               : std::string();
+    }
+    [[nodiscard]] std::string bytes(int column) const
+    {
+        const auto* data = static_cast<const char*>(sqlite3_column_blob(_statement, column));
         return data != nullptr ? std::string(data, static_cast<size_t>(sqlite3_column_bytes(_statement, column)))
                                : std::string();
     }
@@ -145,6 +169,8 @@ int Database::_openOnce()
     }
     if (result == SQLITE_OK)
         result = sqlite3_exec(_db, SCHEMA, nullptr, nullptr, nullptr);
+    if (result == SQLITE_OK)
+        result = sqlite3_exec(_db, WAVEFORM_SCHEMA, nullptr, nullptr, nullptr);
     if (result != SQLITE_OK) {
         __dlog_print(LOG_ID_MAIN, DLOG_ERROR, "MEWLO", "media database cannot be opened: %s", sqlite3_errstr(result));
         _close();
@@ -383,6 +409,28 @@ int Database::selectBookmarks(const std::string& mediaId, const Query& query, st
             rows.push_back({static_cast<int>(statement.number(0)), static_cast<unsigned int>(statement.number(1)),
                 statement.text(2)});
         return statement.code();
+    });
+}
+
+int Database::selectWaveform(const Waveform& key, std::string& samples)
+{
+    return _guarded([&] {
+        samples.clear();
+        Statement statement(_db,
+            "SELECT WAVEFORM_SAMPLES FROM waveform WHERE WAVEFORM_PATH = ? AND WAVEFORM_SIZE = ? AND WAVEFORM_TIME = ?");
+        if (statement.bind(key.path).bind(key.size).bind(key.time).step())
+            samples = statement.bytes(0);
+        return statement.code();
+    });
+}
+
+int Database::putWaveform(const Waveform& key, const std::string& samples)
+{
+    return _transaction([&] {
+        Statement statement(_db,
+            "INSERT OR REPLACE INTO waveform(WAVEFORM_PATH, WAVEFORM_SIZE, WAVEFORM_TIME, WAVEFORM_SAMPLES) "
+            "SELECT ?1, ?2, ?3, ?4 WHERE EXISTS (SELECT 1 FROM media WHERE MEDIA_PATH = ?1 COLLATE BINARY)");
+        return statement.bind(key.path).bind(key.size).bind(key.time).bindBytes(samples).run();
     });
 }
 

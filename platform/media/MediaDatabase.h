@@ -41,6 +41,13 @@ struct Query {
     int count = -1; // all
 };
 
+// Which state of which file a waveform is of.
+struct Waveform {
+    std::string path;
+    long long size = 0; // bytes
+    long long time = 0; // of its last change, nanoseconds since the epoch
+};
+
 // What a look at the folders found, by path.
 struct FileChanges {
     std::vector<MediaRow> put;
@@ -82,6 +89,11 @@ public:
     int insertMissingBookmarks(const std::string& mediaId, const std::vector<BookmarkRow>& bookmarks);
     int removeBookmark(int bookmarkId);
     int selectBookmarks(const std::string& mediaId, const Query& query, std::vector<BookmarkRow>& rows);
+
+    // Empty when there is none.
+    int selectWaveform(const Waveform& key, std::string& samples);
+    // Only that of a recording with a row is kept.
+    int putWaveform(const Waveform& key, const std::string& samples);
 
 private:
     class Statement;

@@ -1,5 +1,7 @@
 #include "media/Recorder.h"
 
+#include "media/WaveformCache.h"
+
 #include "host/PulseWatch.h"
 #include "media/RecordingClaims.h"
 
@@ -262,6 +264,8 @@ int Recorder::_complete(Recording& recording)
         _drain(recording);
     recording.close();
     const int error = recording.file().finish(recording.samples());
+    if (error == 0)
+        rememberLoudness(recording.file().inode(), recording.loudness());
     _pipeline.reset();
     return error;
 }

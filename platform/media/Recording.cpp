@@ -93,9 +93,19 @@ void Recording::reachLimit(recorder_recording_limit_type_e type)
 
 void Recording::_measure(const int16_t* samples, size_t count)
 {
+    constexpr double FULL_SCALE = 32768;
+    constexpr size_t BLOCK = 64;
     int peak = 0;
-    for (size_t i = 0; i < count; ++i)
-        peak = std::max(peak, std::abs(static_cast<int>(samples[i])));
+    for (size_t from = 0; from < count; from += BLOCK) {
+        const size_t end = std::min(count, from + BLOCK);
+        int sum = 0;
+        for (size_t i = from; i < end; ++i) {
+            const int amplitude = std::abs(static_cast<int>(samples[i]));
+            peak = std::max(peak, amplitude);
+            sum += amplitude;
+        }
+        _loudness.add(sum / FULL_SCALE, end - from);
+    }
     int known = _peak;
     while (peak > known && !_peak.compare_exchange_weak(known, peak)) { }
 }

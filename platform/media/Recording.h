@@ -1,5 +1,6 @@
 #pragma once
 
+#include "media/Loudness.h"
 #include "media/RecorderPipeline.h"
 #include "media/RecordingFile.h"
 
@@ -47,6 +48,9 @@ public:
     // Decibels below full scale; starts anew.
     double takePeak();
 
+    // Of all that was captured; after close().
+    [[nodiscard]] Loudness loudness() const { return _loudness.result(); }
+
     // Whether the first sample came in time; false at once when trouble came instead.
     bool waitForSound(std::chrono::milliseconds limit);
     bool waitForDrain(std::chrono::milliseconds limit);
@@ -74,6 +78,7 @@ private:
     const RecordingLimits _limits;
     const Events _events;
     std::atomic<uint64_t> _samples{0};
+    GrowingLoudness _loudness; // of the streaming thread, until that has come to its end
     std::atomic<int> _peak{0};
     std::atomic<bool> _isHeld{false};
     std::atomic<bool> _isFull{false};

@@ -126,6 +126,12 @@ int RecordingFile::_flushNotes()
     return 0;
 }
 
+uint64_t RecordingFile::inode() const
+{
+    struct stat status { };
+    return fstat(_file.get(), &status) == 0 ? status.st_ino : 0;
+}
+
 bool RecordingFile::isInPlace() const
 {
     struct stat open { };

@@ -33,6 +33,8 @@ public:
     // To the storage, with the application's notes: the recording first, so that the journal never promises more than
     // there is. Answers 0 or the system's error number.
     int flush();
+    // What tells the file from all others of its file system, whatever its name; 0 when unknown.
+    [[nodiscard]] uint64_t inode() const;
     // Whether the path still leads to the file.
     [[nodiscard]] bool isInPlace() const;
     // Room for the index is kept back for the case that the storage fills up; grows with the recording.

@@ -8,6 +8,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <sys/stat.h>
 #include <thread>
 #include <unistd.h>
 #include <utility>
@@ -19,6 +20,7 @@
 #include "media/MediaNotice.h"
 #include "media/MediaScan.h"
 #include "media/Rescanner.h"
+#include "media/WaveformCache.h"
 #include "state/Trees.h"
 
 struct media_info_s {
@@ -165,6 +167,25 @@ int write(const Work& work)
     return toError(result);
 }
 
+std::mutex rememberedMutex; // guards the next two
+uint64_t rememberedInode = 0;
+media::Loudness remembered;
+
+// The file at the path may be the one that was recorded last.
+void keepRemembered(const std::string& path)
+{
+    media::Loudness loudness;
+    {
+        struct stat status { };
+        const std::lock_guard lock(rememberedMutex);
+        if (rememberedInode == 0 || ::stat(path.c_str(), &status) != 0 || status.st_ino != rememberedInode)
+            return;
+        rememberedInode = 0;
+        loudness = std::move(remembered);
+    }
+    media::cacheLoudness(path, loudness);
+}
+
 std::vector<media::BookmarkRow> bookmarkRows(const media_bookmark_entry_s* bookmarks, int count)
 {
     std::vector<media::BookmarkRow> rows;
@@ -215,6 +236,60 @@ void startWatching(Connection& held)
         watchFolders(held);
         held.rescanner->request();
     });
+}
+
+}
+
+namespace media {
+
+namespace {
+
+    std::optional<Waveform> stateOf(const std::string& path)
+    {
+        struct stat status { };
+        if (::stat(path.c_str(), &status) != 0)
+            return {};
+        constexpr long long SECOND = 1000000000;
+        return Waveform{path, status.st_size, status.st_mtim.tv_sec * SECOND + status.st_mtim.tv_nsec};
+    }
+
+}
+
+Loudness cachedLoudness(const std::string& path)
+{
+    const auto held = current();
+    const auto key = stateOf(path);
+    std::string samples;
+    if (!held || !key
+        || read(*held, [&](Database& database) { return database.selectWaveform(*key, samples); }) != SQLITE_OK)
+        return {};
+    Loudness loudness;
+    for (size_t i = 0; i + 1 < samples.size(); i += 2)
+        loudness.push_back(
+            static_cast<uint32_t>(static_cast<unsigned char>(samples[i]) << 8 | static_cast<unsigned char>(samples[i + 1])));
+    return loudness;
+}
+
+void rememberLoudness(uint64_t inode, Loudness loudness)
+{
+    const std::lock_guard lock(rememberedMutex);
+    rememberedInode = inode;
+    remembered = std::move(loudness);
+}
+
+// Nobody needs to hear of this change.
+void cacheLoudness(const std::string& path, const Loudness& loudness)
+{
+    const auto held = current();
+    const auto key = stateOf(path);
+    if (!held || !key || loudness.empty())
+        return;
+    std::string samples;
+    for (const uint32_t value : loudness) {
+        samples.push_back(static_cast<char>(value >> 8));
+        samples.push_back(static_cast<char>(value));
+    }
+    read(*held, [&](Database& database) { return database.putWaveform(*key, samples); });
 }
 
 }
@@ -403,8 +478,10 @@ int media_info_insert_to_db(const char* path, media_info_h* media)
     if (!row)
         return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
     const int result = write([&](media::Database& database) { return database.put(*row); });
-    if (result == MEDIA_CONTENT_ERROR_NONE)
-        *media = new media_info_s{std::move(*row)};
+    if (result != MEDIA_CONTENT_ERROR_NONE)
+        return result;
+    keepRemembered(path);
+    *media = new media_info_s{std::move(*row)};
     return result;
 }
 

@@ -18,6 +18,7 @@
 #include "MwStorageRoots.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
+#include "MwTrimStore.h"
 
 namespace {
 
@@ -158,8 +159,10 @@ std::vector<std::string> MwRecordingRescue::run(MwModel& model)
             MW_LOGE("recorder_rescue_leftovers failed : [%d]!!!", found);
         catalogueWaitingNotes(directoryOf(root));
         MwStagedFile::sweep(directoryOf(root));
+        MwTrimStore::recover(directoryOf(root));
     }
     MwStagedFile::sweep(directoryOf(mwPrivateRoot()));
+    MwTrimStore::recover(directoryOf(mwPrivateRoot()));
     MW_CALL(media_content_scan_all);
     if (!work.rescued.empty())
         notification_status_message_post(tellRescued(work.rescued).c_str());
