@@ -1,0 +1,111 @@
+#include "support/FaultyCalls.h"
+
+#include <atomic>
+#include <cerrno>
+#include <csignal>
+#include <cstdarg>
+#include <cstring>
+#include <dlfcn.h>
+#include <fcntl.h>
+#include <unistd.h>
+
+namespace {
+
+char watched[512];
+std::atomic<int> calls = 0;
+std::atomic<int> target = 0;
+std::atomic<support::faults::Effect> effect = support::faults::Effect::COUNT;
+int failure = 0;
+
+bool isWatched(const char* path)
+{
+    return watched[0] != '\0' && path != nullptr && std::strncmp(path, watched, std::strlen(watched)) == 0;
+}
+
+bool isWatched(int file)
+{
+    char link[64];
+    char path[512];
+    if (watched[0] == '\0')
+        return false;
+    std::snprintf(link, sizeof link, "/proc/self/fd/%d", file);
+    const ssize_t size = ::readlink(link, path, sizeof path - 1);
+    if (size <= 0)
+        return false;
+    path[size] = '\0';
+    return isWatched(path);
+}
+
+// Whether this call is to fail.
+template <typename Place>
+bool meets(Place place)
+{
+    if (!isWatched(place) || ++calls != target)
+        return false;
+    if (effect == support::faults::Effect::KILL)
+        ::kill(::getpid(), SIGKILL);
+    errno = failure;
+    return effect == support::faults::Effect::FAIL;
+}
+
+template <typename Function>
+Function* real(const char* name)
+{
+    return reinterpret_cast<Function*>(::dlsym(RTLD_NEXT, name));
+}
+
+}
+
+namespace support::faults {
+
+void arm(const std::string& below, int number, Effect wanted, int error)
+{
+    calls = 0;
+    target = number;
+    effect = wanted;
+    failure = error;
+    std::strncpy(watched, below.c_str(), sizeof watched - 1);
+}
+
+void disarm() { watched[0] = '\0'; }
+
+int count() { return calls; }
+
+}
+
+#define FAULTY(type, name, parameters, arguments, place)                                                              \
+    type name parameters                                                                                              \
+    {                                                                                                                 \
+        static auto* const next = real<type parameters>(#name);                                                       \
+        return meets(place) ? -1 : next arguments;                                                                    \
+    }
+
+extern "C" {
+FAULTY(ssize_t, write, (int file, const void* data, size_t size), (file, data, size), file)
+FAULTY(ssize_t, pwrite, (int file, const void* data, size_t size, off_t at), (file, data, size, at), file)
+FAULTY(ssize_t, pwrite64, (int file, const void* data, size_t size, off64_t at), (file, data, size, at), file)
+FAULTY(ssize_t, copy_file_range, (int from, off64_t* start, int to, off64_t* at, size_t size, unsigned int flags),
+    (from, start, to, at, size, flags), to)
+FAULTY(int, fsync, (int file), (file), file)
+FAULTY(int, fdatasync, (int file), (file), file)
+FAULTY(int, ftruncate, (int file, off_t size), (file, size), file)
+FAULTY(int, ftruncate64, (int file, off64_t size), (file, size), file)
+FAULTY(int, rename, (const char* from, const char* to) noexcept, (from, to), from)
+FAULTY(int, renameat2, (int a, const char* from, int b, const char* to, unsigned int flags) noexcept,
+    (a, from, b, to, flags), from)
+FAULTY(int, link, (const char* from, const char* to) noexcept, (from, to), to)
+FAULTY(int, unlink, (const char* path) noexcept, (path), path)
+
+int open(const char* path, int flags, ...)
+{
+    static auto* const next = real<int(const char*, int, ...)>("open");
+    mode_t mode = 0;
+    if ((flags & (O_CREAT | O_TMPFILE)) != 0) {
+        va_list arguments;
+        va_start(arguments, flags);
+        mode = va_arg(arguments, mode_t);
+        va_end(arguments);
+    }
+    return (flags & O_CREAT) != 0 && meets(path) ? -1 : next(path, flags, mode);
+}
+}
