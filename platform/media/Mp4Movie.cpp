@@ -446,7 +446,7 @@ std::optional<Mp4Part> Mp4Movie::part(uint64_t begin, uint64_t end) const
         return {};
     const uint64_t firstHeard = frameAt(heardFrom);
     part.first = firstHeard - std::min(firstHeard, PREROLL_FRAMES);
-    part.end = std::min(frameAt(heardTo - 1) + 1 + (firstHeard - part.first), frames());
+    part.end = std::min(frameAt(heardTo - 1) + 1, frames());
     for (Mp4Piece& piece : part.pieces)
         piece.from -= piece.isSilence ? 0 : timeOf(part.first);
     return part;

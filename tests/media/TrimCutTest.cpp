@@ -1,5 +1,4 @@
 // The cutter against sound that another program decodes: what is cut is what was there.
-#include <metadata_extractor.h>
 #include <video_edit.h>
 
 #include <gtest/gtest.h>
@@ -12,16 +11,17 @@
 #include <unistd.h>
 #include <vector>
 
-#include "media/AmrIndex.h"
-#include "media/FileDuration.h"
+#include "media/FileDescriptor.h"
 #include "media/Mp4Movie.h"
-#include "support/Program.h"
+#include "support/Amr.h"
 #include "support/RunUntil.h"
 #include "support/TempDir.h"
 
 namespace {
 
 using support::TempDir;
+
+constexpr int LONGEST_FRAME = 4096; // samples: ffmpeg plays the last one to its end
 
 std::atomic<int> error = 0;
 std::atomic<bool> isDone = false;
@@ -55,6 +55,7 @@ protected:
     }
     ~TrimCutTest() override { video_edit_deinit(); }
 
+    // White noise, with which no shift goes unseen (but not AAC's own, which a decoder makes up anew each time).
     bool make(const std::string& name, const std::string& codec, int seconds = 6, int rate = 44100)
     {
         return shell("ffmpeg -v error -y -f lavfi -i anoisesrc=d=" + std::to_string(seconds) + ":r=" + std::to_string(rate)
@@ -90,7 +91,7 @@ protected:
         const auto part = decode(file(to), _directory);
         const auto first = static_cast<long>(std::lround(begin * rate / 1000.0));
         const auto wanted = static_cast<long>(std::lround(end * rate / 1000.0)) - first;
-        EXPECT_NEAR(static_cast<double>(part.size()), static_cast<double>(wanted), slack + 1024);
+        EXPECT_NEAR(static_cast<double>(part.size()), static_cast<double>(wanted), slack + LONGEST_FRAME);
         ASSERT_GE(static_cast<long>(part.size()), std::min<long>(wanted, static_cast<long>(whole.size()) - first) - slack);
         // The shift that fits best, within the slack; then all of it has to fit.
         long best = 0;
@@ -114,8 +115,9 @@ protected:
             }
         }
         EXPECT_LT(least, slack == 0 ? 0.5 : 40.0) << "from sample " << length / 2;
-        if (slack == 0)
+        if (slack == 0) {
             EXPECT_LT(differenceAt(best, 0, length), 0.5) << "as a whole";
+        }
     }
 
     TempDir _directory;
@@ -123,8 +125,8 @@ protected:
 
 TEST_F(TrimCutTest, CutsOurFormatsToTheSample)
 {
-    ASSERT_TRUE(make("a.m4a", "-c:a aac"));
-    ASSERT_TRUE(make("b.m4a", "-c:a aac -movflags +faststart -metadata title=Hello", 6, 48000));
+    ASSERT_TRUE(make("a.m4a", "-c:a aac -aac_pns 0"));
+    ASSERT_TRUE(make("b.m4a", "-c:a aac -aac_pns 0 -movflags +faststart -metadata title=Hello", 6, 48000));
     ASSERT_TRUE(make("c.m4a", "-c:a alac"));
     const struct {
         int begin;
@@ -146,7 +148,7 @@ TEST_F(TrimCutTest, CutsOurFormatsToTheSample)
 
 TEST_F(TrimCutTest, CutsAmrAtItsFrames)
 {
-    ASSERT_TRUE(make("a.amr", "-c:a libopencore_amrnb -ar 8000", 6, 8000));
+    ASSERT_TRUE(support::makeAmr(file("a.amr"), 6));
     const std::string source = support::readFile(file("a.amr"));
     ASSERT_EQ(0, cut("a.amr", "out.amr", 1010, 3009));
     const size_t frame = (source.size() - 6) / 300;
@@ -168,13 +170,13 @@ TEST_F(TrimCutTest, CutsWhatOthersHaveRecorded)
         const char* codec;
         int slack; // samples
     } cases[] = {
-        {"fragments.m4a", "-c:a aac -movflags frag_keyframe+empty_moov+default_base_moof -frag_duration 500000", 1200},
+        {"fragments.m4a", "-c:a aac -aac_pns 0 -movflags frag_keyframe+empty_moov+default_base_moof -frag_duration 500000", 1200},
         {"a.mp3", "-c:a libmp3lame -b:a 128k -metadata title=Hello", 1300},
         {"a.ogg", "-c:a libvorbis", 1300},
         {"a.opus.ogg", "-c:a libopus -ar 48000", 1300},
         {"a.flac", "-c:a flac -metadata title=Hello", 0},
         {"a.wav", "-c:a pcm_s16le", 0},
-        {"a.aac", "-c:a aac -f adts", 2200},
+        {"a.aac", "-c:a aac -aac_pns 0 -f adts", 2200},
     };
     for (const auto& each : cases) {
         SCOPED_TRACE(each.name);
@@ -184,15 +186,15 @@ TEST_F(TrimCutTest, CutsWhatOthersHaveRecorded)
         ASSERT_EQ(0, cut(each.name, out, 1500, 4500));
         expectSame(each.name, out, 1500, 4500, rate, each.slack);
         ASSERT_EQ(0, cut(each.name, out, 0, 1000));
-        if (std::string(each.codec).find("Hello") != std::string::npos)
-            EXPECT_TRUE(shell("ffprobe -v error -show_format '" + file(out) + "' | grep -qi TAG:title=Hello"));
+        const bool hasTitle = std::string(each.codec).find("Hello") != std::string::npos;
+        EXPECT_TRUE(!hasTitle || shell("ffprobe -v error -show_format '" + file(out) + "' | grep -qi TAG:title=Hello"));
     }
 }
 
 TEST_F(TrimCutTest, ReadsSeveralChunksEditsAndLongOffsets)
 {
     // As a device with little memory writes it: chunks of a second, with other data in between.
-    ASSERT_TRUE(make("a.mp4", "-f lavfi -i testsrc=d=6:s=16x16:r=5 -map 0:a -map 1:v -c:a aac -c:v mpeg4"));
+    ASSERT_TRUE(make("a.mp4", "-f lavfi -i testsrc=d=6:s=16x16:r=5 -map 0:a -map 1:v -c:a aac -aac_pns 0 -c:v mpeg4"));
     ASSERT_TRUE(shell("ffmpeg -v error -y -i '" + file("a.mp4") + "' -map 0:a -c copy '" + file("one.m4a") + "'"));
     const media::FileDescriptor whole(::open(file("one.m4a").c_str(), O_RDONLY));
     const auto movie = media::Mp4Movie::read(whole.get());
@@ -225,8 +227,7 @@ TEST_F(TrimCutTest, ReadsSeveralChunksEditsAndLongOffsets)
     // A film has more than one track: it is cut, or refused, but never spoiled.
     const int film = cut("a.mp4", "film.m4a", 1000, 3000);
     EXPECT_TRUE(film == 0 || film == VIDEO_EDIT_ERROR_NOT_SUPPORTED);
-    if (film == 0)
-        EXPECT_FALSE(decode(file("film.m4a"), _directory).empty());
+    EXPECT_TRUE(film != 0 || !decode(file("film.m4a"), _directory).empty());
 }
 
 // Twelve hours, nearly all of it a hole.
@@ -234,7 +235,7 @@ TEST_F(TrimCutTest, CutsTwelveHoursAndIsCancelledAtOnce)
 {
     constexpr uint64_t FRAMES = 12ull * 3600 * 44100 / 1024;
     constexpr uint32_t FRAME = 3000; // above 4 GiB in all
-    ASSERT_TRUE(make("a.m4a", "-c:a aac", 1));
+    ASSERT_TRUE(make("a.m4a", "-c:a aac -aac_pns 0", 1));
     const media::FileDescriptor small(::open(file("a.m4a").c_str(), O_RDONLY));
     const auto movie = media::Mp4Movie::read(small.get());
     ASSERT_TRUE(movie);
@@ -248,7 +249,6 @@ TEST_F(TrimCutTest, CutsTwelveHoursAndIsCancelledAtOnce)
         return u32(content.size() + 8) + type + content;
     };
     const std::string index = movie->indexOf(*movie->part(0, 44100), 48);
-    const std::string description = index.substr(index.find("stsd") - 4, 0);
     const size_t at = index.find("stsd") - 4;
     const std::string stsd = index.substr(at, static_cast<unsigned char>(index[at + 3]));
     const std::string tables = stsd + box("stts", u32(0) + u32(1) + u32(FRAMES) + u32(1024))
@@ -292,16 +292,17 @@ TEST_F(TrimCutTest, CutsTwelveHoursAndIsCancelledAtOnce)
 // Every cut short and many flipped bits: an error, or a result that opens.
 TEST_F(TrimCutTest, SurvivesDamagedSources)
 {
-    ASSERT_TRUE(make("a.m4a", "-c:a aac", 2));
+    ASSERT_TRUE(make("a.m4a", "-c:a aac -aac_pns 0", 2));
     ASSERT_TRUE(make("a.mp3", "-c:a libmp3lame", 2));
     unsigned int seed = 7;
     for (const char* name : {"a.m4a", "a.mp3"}) {
         const std::string whole = support::readFile(file(name));
         for (int i = 0; i < 120; ++i) {
             std::string damaged = whole;
-            for (int flips = 0; flips < 4; ++flips)
-                damaged[damaged.size() - 1 - (seed = seed * 1103515245 + 12345) % std::min<size_t>(damaged.size(), 1500)]
-                    ^= static_cast<char>(1 << (seed >> 20) % 8);
+            for (int flips = 0; flips < 4; ++flips) {
+                seed = seed * 1103515245 + 12345;
+                damaged[damaged.size() - 1 - (seed >> 8) % 1500] ^= static_cast<char>(1 << (seed >> 28) % 8);
+            }
             if (i % 3 == 0)
                 damaged.resize(damaged.size() * static_cast<size_t>(i) / 120);
             support::writeFile(file("damaged"), damaged);
