@@ -446,7 +446,8 @@ std::optional<Mp4Part> Mp4Movie::part(uint64_t begin, uint64_t end) const
         return {};
     const uint64_t firstHeard = frameAt(heardFrom);
     part.first = firstHeard - std::min(firstHeard, PREROLL_FRAMES);
-    part.end = std::min(frameAt(heardTo - 1) + 1, frames());
+    // Some players hear nothing of a file whose first heard frame is its last one.
+    part.end = std::min(std::max(frameAt(heardTo - 1) + 1, firstHeard + 2), frames());
     for (Mp4Piece& piece : part.pieces)
         piece.from -= piece.isSilence ? 0 : timeOf(part.first);
     return part;
