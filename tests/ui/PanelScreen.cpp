@@ -74,7 +74,19 @@ std::vector<MwSavedBookmark> PanelScreen::bookmarksOf(const std::string& mediaId
     return mwReadBookmarks(mediaId, [](const char*, int) {});
 }
 
-void PanelScreen::dock(MwPlayViewController::ViewType type)
+const std::string& PanelScreen::sound()
+{
+    static const std::string content = [] {
+        const support::TempDir directory;
+        const std::string file = directory.file("a.m4a");
+        const std::string command = "ffmpeg -v error -f lavfi -i anoisesrc=d=10:r=44100 -af volume=t/10:eval=frame -ac 1 "
+                                    "-c:a aac " + file;
+        return std::system(command.c_str()) == 0 ? support::readFile(file) : std::string();
+    }();
+    return content;
+}
+
+Evas_Object* PanelScreen::_host()
 {
     std::string path;
     MwResourceMgr::getInstance()->getEdjPath("edje/MwBookmarksContentView.edj", path);
@@ -83,6 +95,22 @@ void PanelScreen::dock(MwPlayViewController::ViewType type)
     evas_object_size_hint_weight_set(host, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
     elm_win_resize_object_add(window, host);
     evas_object_show(host);
+    return host;
+}
+
+void PanelScreen::dockTrim()
+{
+    trimPanel = new MwTrimViewController(&model, controller());
+    trimPanel->getEventSignal().addListener([this](auto event) { trimEvents.push_back(event); });
+    trimPanel->dock(_host());
+    panelView = trimPanel->getEvasObject();
+    support::settle(window);
+    support::runFor(0.05);
+}
+
+void PanelScreen::dock(MwPlayViewController::ViewType type)
+{
+    Evas_Object* host = _host();
     panel = new MwPlayViewController(&model, controller());
     panel->dock(host, type);
     panelView = panel->getEvasObject();

@@ -4,6 +4,7 @@
 
 #include "MwPlayViewController.h"
 #include "MwPlayer.h"
+#include "MwTrimViewController.h"
 #include "MwSavedBookmarks.h"
 #include "ScreenWindow.h"
 #include "support/TempDir.h"
@@ -17,9 +18,11 @@ public:
     explicit PanelScreen(int width = 360, int height = 640);
     ~PanelScreen() override;
 
-    MwPlayViewController* panel = nullptr;
+    MwPlayViewController* panel = nullptr; // one of the two
+    MwTrimViewController* trimPanel = nullptr;
     Evas_Object* panelView = nullptr;
     std::vector<MwPlayViewController::eventType> events; // of the panel
+    std::vector<MwTrimViewController::eventType> trimEvents;
     std::vector<unsigned int> soughtTo; // milliseconds
     MwAppController::Command failing = MwAppController::START_RECORDING; // which command fails; none of playback
 
@@ -28,10 +31,13 @@ public:
     // Makes a recording the loaded one and announces it.
     void load(const std::string& file, MwPlayer::PlayState state, unsigned int position = 0);
     void announce();
+    // A sound file of some seconds, as a content: noise that grows.
+    static const std::string& sound();
     static std::vector<MwSavedBookmark> bookmarksOf(const std::string& mediaId);
 
     // The panel alone at the lower edge of the window.
     void dock(MwPlayViewController::ViewType type = MwPlayViewController::QUIET);
+    void dockTrim();
     [[nodiscard]] std::string text(const char* part) const;
     // What is in a part of the panel, null for none.
     [[nodiscard]] Evas_Object* content(const char* part) const;
@@ -47,6 +53,7 @@ protected:
     bool execute(MwAppController::Command command) override;
 
 private:
+    Evas_Object* _host();
     bool _play(const std::string& path);
 
     support::TempDir _directory;

@@ -130,7 +130,6 @@ private:
     void _createDiscardPopup();
     void _discardRecording();
     void _createStorageFullPopup();
-    static void _openStorageSettings();
     void _createRecordingFailedPopup();
 
     unsigned int _lastShownSeconds = 0;

@@ -11,6 +11,7 @@
 
 #include "MwHandle.h"
 #include "MwLog.h"
+#include "MwMemoryFullPopup.h"
 #include "MwModel.h"
 #include "MwRecorder.h"
 #include "MwRenamePopupController.h"
@@ -20,8 +21,6 @@
 using panekit::WPopupController;
 
 namespace {
-
-constexpr auto STORAGE_SETTINGS = "com.tovanic.setting.storage";
 
 void closePopup(WPopupController* popup) { popup->destroy(); }
 
@@ -108,33 +107,7 @@ void MwRecorderContentViewController::_discardRecording()
 
 void MwRecorderContentViewController::_createStorageFullPopup()
 {
-    auto* popup = new WPopupController();
-    popup->setTitle("IDS_IDLE_HEADER_NOT_ENOUGH_SPACE_ABB2");
-    popup->setContent(getModel()->getStorageType() == MW_STORAGE_DEVICE
-            ? "IDS_IDLE_POP_YOUR_DEVICE_STORAGE_DOESNT_HAVE_ENOUGH_SPACE_MSG"
-            : "IDS_IDLE_POP_YOUR_SD_CARD_DOESNT_HAVE_ENOUGH_SPACE_MSG");
-    popup->addButton("IDS_MW_BUTTON_CANCEL", closePopup);
-    popup->addButton("IDS_MW_OPT_SETTINGS", [](WPopupController* self) {
-        _openStorageSettings();
-        closePopup(self);
-    });
-    popup->create(getWindow());
-}
-
-void MwRecorderContentViewController::_openStorageSettings()
-{
-    MwHandle<app_control_h, app_control_destroy> request;
-    int error = app_control_create(request.out());
-    if (error != APP_CONTROL_ERROR_NONE) {
-        MW_LOGE("app_control_create failed:[%d]", error);
-        return;
-    }
-    app_control_set_app_id(request.get(), STORAGE_SETTINGS);
-    app_control_add_extra_data(request.get(), "viewtype", "storage_detail");
-    app_control_set_launch_mode(request.get(), APP_CONTROL_LAUNCH_MODE_GROUP);
-    error = app_control_send_launch_request(request.get(), nullptr, nullptr);
-    if (error != APP_CONTROL_ERROR_NONE)
-        MW_LOGE("app_control_send_launch_request failed:[%d]", error);
+    mwCreateMemoryFullPopup(getWindow(), getModel()->getStorageType());
 }
 
 void MwRecorderContentViewController::_createRecordingFailedPopup()

@@ -111,6 +111,7 @@ void MwRecordingsContentViewController::onDestroy()
     _rows.reset();
     if (std::exchange(_playView, nullptr))
         _announcePlayViewClosed();
+    _trimView = nullptr;
     _destroyShareRequest(true);
     _destroyPrivateModeRequest(true);
     if (_fileOperator)
@@ -128,6 +129,7 @@ bool MwRecordingsContentViewController::onPop()
 {
     _cancelBringIn();
     _rows.reset(); // before the records it shows
+    getModel()->setTrimMode(false);
     getModel()->destroyRecordedFileList();
     _destroyShareRequest(true);
     _destroyPrivateModeRequest(true);
@@ -252,7 +254,7 @@ void MwRecordingsContentViewController::_stopAndExit()
 
 void MwRecordingsContentViewController::_earjackInserted()
 {
-    if (isTop() && getModel()->getAppState() == MwModel::APP_STATE_RESUMED && !_playView)
+    if (isTop() && getModel()->getAppState() == MwModel::APP_STATE_RESUMED && !_playView && !_trimView)
         mwPost("IDS_MW_TPOP_EXTERNAL_MICROPHONE_WILL_BE_USED_TO_RECORD");
 }
 

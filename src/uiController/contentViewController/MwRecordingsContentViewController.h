@@ -21,6 +21,7 @@ class MwFileOperator;
 class MwPlayViewController;
 class MwRecordingsRows;
 class MwRenamePopupController;
+class MwTrimViewController;
 typedef void (*Evas_Smart_Cb)(void* data, Evas_Object* object, void* info);
 
 namespace panekit {
@@ -90,6 +91,7 @@ private:
     void _destroyController();
     void _announcePlayViewClosed();
     void _playViewEvent(int event);
+    void _trimViewEvent(int event);
     void _updateLater();
     void _bringInItem();
     void _bringInAfterFrame();
@@ -183,7 +185,8 @@ private:
     Evas_Object* _noContents = nullptr;
     MwRecordingsListItem::Context _rowContext; // shared by all rows
     std::unique_ptr<MwRecordingsRows> _rows; // with the genlist
-    MwPlayViewController* _playView = nullptr; // deletes itself with its view
+    MwPlayViewController* _playView = nullptr; // at most one of these two; deletes itself with its view
+    MwTrimViewController* _trimView = nullptr;
     std::unique_ptr<MwFileOperator> _fileOperator;
     std::unique_ptr<MwFileOperationPopup> _fileOperationPopup; // while an operator works
     bool _privateStorageOpen = false; // asked for by a move, to be handed back

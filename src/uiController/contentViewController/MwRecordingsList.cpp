@@ -18,6 +18,7 @@
 #include "MwRecordingsRows.h"
 #include "MwResourceMgr.h"
 #include "MwText.h"
+#include "MwTrimViewController.h"
 
 using panekit::WTimer;
 
@@ -201,7 +202,9 @@ void MwRecordingsContentViewController::_updateController()
     if (!mwRecordingsMode(_viewType).plays)
         return _destroyController();
     if (getModel()->isTrimMode())
-        _createTrimViewController();
+        return _createTrimViewController();
+    if (_trimView)
+        _destroyController();
     if (!getModel()->getCurrentPlayPath().empty())
         return _createPlayViewController();
     if (_playView)
@@ -248,6 +251,7 @@ void MwRecordingsContentViewController::_clickRecordButton()
 void MwRecordingsContentViewController::_destroyController()
 {
     _playView = nullptr;
+    _trimView = nullptr;
     if (Evas_Object* content = elm_object_part_content_unset(getEvasObject(), CONTROLLER_PART); content)
         evas_object_del(content);
     _announcePlayViewClosed();
@@ -274,14 +278,33 @@ void MwRecordingsContentViewController::_createPlayViewController()
     getModel()->setPlayViewShown(true);
 }
 
-// The place where the trim panel docks instead of the player, with its events closed and saved both clearing the flag
-// and redrawing. Until there is one the player stays.
 void MwRecordingsContentViewController::_createTrimViewController()
 {
+    if (_trimView)
+        return;
+    _destroyController();
+    _trimView = new MwTrimViewController(getModel(), getAppController());
+    _trimView->getEventSignal().addListener([this](MwTrimViewController::eventType type) { _trimViewEvent(type); });
+    if (!_trimView->dock(getEvasObject())) {
+        getModel()->setTrimMode(false);
+        std::exchange(_trimView, nullptr)->destroy();
+    }
+}
+
+// Closed or saved, the player comes back. After the panel's own callback, for the redraw deletes the panel.
+void MwRecordingsContentViewController::_trimViewEvent(int event)
+{
+    if (event != MwTrimViewController::TRIM_VIEW_EVENT_CLOSE && event != MwTrimViewController::TRIM_VIEW_EVENT_SAVED) {
+        MW_LOGE("invalid eventType");
+        return;
+    }
     getModel()->setTrimMode(false);
-    mwPost("IDS_MW_TPOP_TRIMMING_IS_NOT_AVAILABLE");
-    // The player has hidden its marks already; this brings them back.
-    getAppController()->getPlayerUpdatedSignal().emit();
+    if (event == MwTrimViewController::TRIM_VIEW_EVENT_SAVED) {
+        getModel()->createRecordedFileList();
+        getModel()->setCurrentPlayPosition(0);
+        _reloadNeeded = true;
+    }
+    _updateLater();
 }
 
 void MwRecordingsContentViewController::_playViewEvent(int event)

@@ -21,6 +21,7 @@
 #include "MwSaveToPopup.h"
 #include "MwStorageRoots.h"
 #include "MwSystemMgr.h"
+#include "MwTrimViewController.h"
 
 using panekit::WMenuPopupController;
 using panekit::WPopupController;
@@ -207,9 +208,11 @@ void MwRecordingsContentViewController::_destroySaveToPopup()
 
 void MwRecordingsContentViewController::_clickBackKey()
 {
-    // While the trim panel is docked, leaving it is its own business.
-    if (!_isComplete() || getModel()->isTrimMode())
+    if (!_isComplete())
         return;
+    // While the trim panel is docked, leaving it is its own business.
+    if (_trimView)
+        return _trimView->back();
     const bool rests = _viewType == NORMAL || _viewType == PICK;
     if (rests && getModel()->getCurrentPlayPath().empty())
         return popOut();
@@ -262,7 +265,7 @@ void MwRecordingsContentViewController::_listenToListKeys()
 
 bool MwRecordingsContentViewController::_keyPressed(const std::string& key)
 {
-    if (!_isComplete() || _viewType != NORMAL || !_genlist || _fileOperator)
+    if (!_isComplete() || _viewType != NORMAL || !_genlist || _fileOperator || getModel()->isTrimMode())
         return false;
     if (key == "Delete" || key == "KP_Delete")
         _deleteHighlighted();
