@@ -11,6 +11,7 @@ using Arguments = std::vector<std::string>;
 int record(const Arguments& arguments);
 int request(const Arguments& arguments);
 int list(const Arguments& arguments);
+int trim(const Arguments& arguments);
 int state(const Arguments& arguments);
 int preference(const Arguments& arguments);
 int locks(const Arguments& arguments);

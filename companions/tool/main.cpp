@@ -13,11 +13,13 @@ struct Command {
     int (*run)(const tool::Arguments& arguments);
 };
 
-constexpr std::array<Command, 9> COMMANDS = {{
+constexpr std::array<Command, 10> COMMANDS = {{
     {"record", "SECONDS [--format m4a|amr]", "record without a window and print the path", tool::record},
     {"request", "[--mime TYPE] [--max-kb N]", "let the user record once in a window of its own and print the path",
         tool::request},
     {"list", "", "print path, milliseconds and number of bookmarks of every recording", tool::list},
+    {"trim", "FILE BEGIN END [--over | --out NAME]",
+        "cut a recording without loss (times: seconds, MM:SS, HH:MM:SS) and print the new path", tool::trim},
     {"state", "get KEY | set KEY VALUE | pin KEY VALUE | unpin KEY | watch [KEY...]",
         "read, write and follow state keys", tool::state},
     {"pref", "get KEY | set KEY VALUE", "read and write preferences", tool::preference},

@@ -155,18 +155,38 @@ TEST_F(RecordingsScreenTest, ATapPlaysPausesResumesAndSwitches)
     EXPECT_EQ("B", screen.text("B.m4a", NAME));
 }
 
-TEST_F(RecordingsScreenTest, TrimmingIsRefusedWithAMessage)
+TEST_F(RecordingsScreenTest, TheTrimPanelTakesThePlaceOfThePlayerAndGivesItBack)
 {
     ui::enterRecordings({"A.m4a"});
     RecordingsScreen screen;
     screen.open();
     screen.tap("A.m4a");
-    screen.model.setTrimMode(true);
-    screen.playerChanged();
+    const auto isTrimming = [&] {
+        Evas_Object* docked = elm_object_part_content_get(screen.view, "elm.swallow.controller");
+        return docked && elm_object_part_content_get(docked, "save_button");
+    };
+    const auto trim = [&] {
+        screen.model.setTrimMode(true);
+        screen.playerChanged();
+        EXPECT_TRUE(isTrimming());
+        EXPECT_TRUE(elm_object_disabled_get(screen.list()));
+    };
+    trim();
+    screen.key("Delete");
+    EXPECT_EQ(nullptr, panekit::WPopupController::topmost()) << "the keys of the list rest";
+    screen.back();
+    support::runFor(0.1);
     EXPECT_FALSE(screen.model.isTrimMode());
-    EXPECT_EQ("Trimming is not available in this version.", fakes::desktop.lastMessage);
+    EXPECT_FALSE(isTrimming());
     EXPECT_TRUE(screen.hasPlayer());
     EXPECT_FALSE(elm_object_disabled_get(screen.list()));
+    // A recording that another program deletes takes the panel along.
+    trim();
+    std::filesystem::remove(ui::recordingPath("A.m4a"));
+    screen.announce(MwSignalMgr::MEDIA_DB_UPDATED);
+    EXPECT_FALSE(screen.model.isTrimMode());
+    EXPECT_FALSE(isTrimming());
+    EXPECT_EQ("", screen.model.getCurrentPlayPath());
 }
 
 TEST_F(RecordingsScreenTest, TheTitleFollowsTheLanguageNumbersAlike)

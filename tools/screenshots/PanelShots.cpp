@@ -8,6 +8,7 @@
 
 #include "MwBookmarksContentViewController.h"
 #include "MwDetailsContentViewController.h"
+#include "MwTrimWaveform.h"
 #include "PanelScreen.h"
 #include "Picture.h"
 #include "support/Recordings.h"
@@ -145,7 +146,12 @@ namespace {
                     support::key(s.window, "Return");
                     support::runFor(0.2);
                 }},
-            {"trim-discard", [](auto& s) { trimAsk(s, "Escape"); }},
+            {"trim-discard",
+                [](auto& s) {
+                    trimRange(s, 10000);
+                    s.trimPanel->back();
+                    support::runFor(0.5);
+                }},
             {"bookmarks", [](auto& s) { bookmarks(s, 12); }},
             {"bookmarks-empty", [](auto& s) { bookmarks(s, 0); }},
             {"bookmarks-rename",

@@ -5,7 +5,6 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
-#include <iterator>
 #include <utility>
 
 #include <panekit/WAccessibility.h>
@@ -29,14 +28,15 @@ constexpr long long LONG_KEY_STEP = 1000;
 
 struct BarLook {
     const char* part;
+    const char* place; // what moves
     const char* sliderPart;
     const char* group;
     const char* name;
 };
 constexpr std::array<BarLook, 3> LOOKS = {{
-    {"start_bar", "start_slider", SIDE_BAR_GROUP, "IDS_MW_BODY_TRIM_START"},
-    {"end_bar", "end_slider", SIDE_BAR_GROUP, "IDS_MW_BODY_TRIM_END"},
-    {"play_bar", "play_slider", PLAY_BAR_GROUP, "IDS_MW_BODY_POSITION"},
+    {"start_bar", "start_place", "start_slider", SIDE_BAR_GROUP, "IDS_MW_BODY_TRIM_START"},
+    {"end_bar", "end_place", "end_slider", SIDE_BAR_GROUP, "IDS_MW_BODY_TRIM_END"},
+    {"play_bar", "play_place", "play_slider", PLAY_BAR_GROUP, "IDS_MW_BODY_POSITION"},
 }};
 
 int scaled(int units) { return static_cast<int>(units * elm_config_scale_get() / elm_app_base_scale_get()); }
@@ -98,14 +98,15 @@ void MwTrimBars::_createBar(Bar bar)
     elm_object_style_set(slider, SLIDER_STYLE);
     panekit::setAccessibleName(slider, look.name);
     elm_slider_min_max_set(slider, 0, std::max(1U, _range.getDuration()) / 1000.0);
-    elm_slider_step_set(slider, KEY_STEP / 1000.0);
+    elm_slider_step_set(slider, static_cast<double>(KEY_STEP) / std::max(1U, _range.getDuration()));
     elm_object_focus_move_policy_set(slider, ELM_FOCUS_MOVE_POLICY_KEY_ONLY);
     evas_object_pass_events_set(slider, EINA_TRUE);
     _handles[bar].slider = slider;
     evas_object_smart_callback_add(slider, "changed", _changedCb, &_handles[bar]);
-    // Before the slider makes steps of its own; what has the keyboard when it is focused is its inner object.
-    evas_object_event_callback_priority_add(
-        elm_layout_edje_get(slider), EVAS_CALLBACK_KEY_DOWN, EVAS_CALLBACK_PRIORITY_BEFORE, _keyCb, this);
+    // Before the slider makes steps of its own.
+    for (Evas_Object* object : {slider, elm_layout_edje_get(slider)})
+        evas_object_event_callback_priority_add(
+            object, EVAS_CALLBACK_KEY_DOWN, EVAS_CALLBACK_PRIORITY_BEFORE, _keyCb, &_handles[bar]);
     elm_object_part_content_set(_layout, look.sliderPart, slider);
     evas_object_show(slider);
 }
@@ -143,7 +144,7 @@ void MwTrimBars::update()
     const double whole = geometry.waveform + 2 * geometry.sideBar;
     const auto move = [&](Bar bar, double x, double width) {
         const double share = whole > width ? x / (whole - width) : 0;
-        edje_object_part_drag_value_set(elm_layout_edje_get(_layout), LOOKS[bar].part, share, 0);
+        edje_object_part_drag_value_set(elm_layout_edje_get(_layout), LOOKS[bar].place, share, 0);
         const double value = static_cast<double>(_valueOf(bar)) / 1000;
         if (std::abs(elm_slider_value_get(_handles[bar].slider) - value) >= 0.001)
             elm_slider_value_set(_handles[bar].slider, value);
@@ -185,25 +186,23 @@ void MwTrimBars::_keyCb(void* data, Evas*, Evas_Object*, void* info)
 {
     auto* event = static_cast<Evas_Event_Key_Down*>(info);
     const bool hasShift = evas_key_modifier_is_set(event->modifiers, "Shift") != EINA_FALSE;
-    if (static_cast<MwTrimBars*>(data)->takeKey(event->key, hasShift))
+    const auto* handle = static_cast<Handle*>(data);
+    if ((event->event_flags & EVAS_EVENT_FLAG_ON_HOLD) == 0
+        && handle->bars->_takeKey(handle->bar, event->key, hasShift))
         event->event_flags = static_cast<Evas_Event_Flags>(event->event_flags | EVAS_EVENT_FLAG_ON_HOLD);
 }
 
-bool MwTrimBars::takeKey(const std::string& key, bool hasShift)
+bool MwTrimBars::_takeKey(Bar bar, const std::string& key, bool hasShift)
 {
-    const auto* focused = std::find_if(std::begin(_handles), std::end(_handles),
-        [](const Handle& handle) { return elm_object_focus_get(handle.slider) != EINA_FALSE; });
-    if (focused == std::end(_handles))
-        return false;
     const long long step = hasShift ? LONG_KEY_STEP : KEY_STEP;
     if (key == "Left" || key == "KP_Left")
-        _setValue(focused->bar, _valueOf(focused->bar) - step);
+        _setValue(bar, _valueOf(bar) - step);
     else if (key == "Right" || key == "KP_Right")
-        _setValue(focused->bar, _valueOf(focused->bar) + step);
+        _setValue(bar, _valueOf(bar) + step);
     else if (key == "Home" || key == "KP_Home")
-        _setValue(focused->bar, 0);
+        _setValue(bar, 0);
     else if (key == "End" || key == "KP_End")
-        _setValue(focused->bar, _range.getDuration());
+        _setValue(bar, _range.getDuration());
     else
         return false;
     return true;

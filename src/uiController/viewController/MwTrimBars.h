@@ -30,7 +30,6 @@ public:
     // Puts the bars where range and position say.
     void update();
     [[nodiscard]] MwTrimRange::Press getPressed() const { return _press; }
-    [[nodiscard]] bool takeKey(const std::string& key, bool hasShift);
     void focus();
 
 private:
@@ -47,6 +46,7 @@ private:
     void _createTouchArea();
     void _updateGeometry();
     void _setValue(Bar bar, long long time);
+    bool _takeKey(Bar bar, const std::string& key, bool hasShift);
     [[nodiscard]] long long _valueOf(Bar bar) const;
     void _pressedWaveform(const Evas_Event_Mouse_Down& event);
     void _movedWaveform(const Evas_Event_Mouse_Move& event);

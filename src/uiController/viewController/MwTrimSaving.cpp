@@ -32,7 +32,9 @@ constexpr auto SAVING_TEXT = "IDS_MW_POP_SAVING_ING";
 constexpr double START_DELAY = 0.3; // seconds
 constexpr double PROGRESS_INTERVAL = 0.1;
 constexpr double BYTES_PER_SECOND = 88200; // more than any recording needs
+constexpr int NONE_MARKED = -1;
 constexpr int AS_NEW_FILE = 0;
+constexpr int OVER_ORIGINAL = 1;
 
 }
 
@@ -66,12 +68,12 @@ void MwTrimSaving::ask(Request request)
 
 void MwTrimSaving::_createSavePopup()
 {
-    Evas_Object* list = nullptr;
+    _marked = NONE_MARKED;
     _savePopup = new WPopupController();
     _savePopup->setTitle("IDS_MW_HEADER_SAVE_TRIMMED_RECORDING_ABB_M_VOICE");
     _savePopup->setStyle("theme_bg");
-    _savePopup->setContent([this, &list](Evas_Object* popup) {
-        list = elm_genlist_add(popup);
+    _savePopup->setContent([this](Evas_Object* popup) {
+        Evas_Object* list = elm_genlist_add(popup);
         elm_genlist_homogeneous_set(list, EINA_TRUE);
         elm_genlist_mode_set(list, ELM_LIST_COMPRESS);
         elm_scroller_content_min_limit(list, EINA_FALSE, EINA_TRUE);
@@ -79,13 +81,45 @@ void MwTrimSaving::_createSavePopup()
         evas_object_size_hint_align_set(list, EVAS_HINT_FILL, EVAS_HINT_FILL);
         for (const int index : {0, 1})
             (new MwSavePopupMenuItem(index, [this](int chosen) { _choose(chosen); }))->append(list);
+        // What has the keyboard when the list is focused is its inner object.
+        evas_object_event_callback_priority_add(
+            elm_layout_edje_get(list), EVAS_CALLBACK_KEY_DOWN, EVAS_CALLBACK_PRIORITY_BEFORE, _listKeyCb, this);
         evas_object_show(list);
+        _choices = list;
         return list;
     });
     _savePopup->setOnDestroyed([this] { _savePopup = nullptr; });
     _savePopup->create(elm_object_top_widget_get(_panel));
     // The arrow keys go to the choices at once.
-    elm_object_focus_set(list, EINA_TRUE);
+    elm_object_focus_set(_choices, EINA_TRUE);
+}
+
+void MwTrimSaving::_listKeyCb(void* data, Evas*, Evas_Object*, void* info)
+{
+    auto* event = static_cast<Evas_Event_Key_Down*>(info);
+    if (static_cast<MwTrimSaving*>(data)->_takeListKey(event->key))
+        event->event_flags = static_cast<Evas_Event_Flags>(event->event_flags | EVAS_EVENT_FLAG_ON_HOLD);
+}
+
+bool MwTrimSaving::_takeListKey(const std::string& key)
+{
+    if (key == "Up" || key == "KP_Up")
+        _mark(AS_NEW_FILE);
+    else if (key == "Down" || key == "KP_Down")
+        _mark(_marked == NONE_MARKED ? AS_NEW_FILE : OVER_ORIGINAL);
+    else if ((key == "Return" || key == "KP_Enter" || key == "space") && _marked != NONE_MARKED)
+        _choose(_marked);
+    else
+        return false;
+    return true;
+}
+
+void MwTrimSaving::_mark(int index)
+{
+    _marked = index;
+    Elm_Object_Item* item = elm_genlist_first_item_get(_choices);
+    for (int i = 0; item; ++i, item = elm_genlist_item_next_get(item))
+        elm_object_item_signal_emit(item, i == index ? "highlight,on" : "highlight,off", "mewlo");
 }
 
 void MwTrimSaving::_choose(int index)

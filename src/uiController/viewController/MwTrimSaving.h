@@ -41,6 +41,9 @@ public:
 
 private:
     void _createSavePopup();
+    // Up and Down mark a choice, Return takes it.
+    bool _takeListKey(const std::string& key);
+    void _mark(int index);
     void _choose(int index);
     void _startTrim(bool asNewFile);
     [[nodiscard]] bool _hasRoom(int storage) const;
@@ -50,6 +53,7 @@ private:
     void _backPressed();
     void _ended(MwTrim::eventType type);
     void _closePopups();
+    static void _listKeyCb(void* data, Evas* canvas, Evas_Object* list, void* info);
     static const char* _messageOf(MwTrim::Failure failure);
 
     Evas_Object* _panel;
@@ -59,6 +63,8 @@ private:
     Request _request{};
     panekit::WPopupController* _savePopup = nullptr; // these delete themselves
     panekit::WPopupController* _loadingPopup = nullptr;
+    Evas_Object* _choices = nullptr; // of the save popup
+    int _marked = -1;
     Evas_Object* _loadingLayout = nullptr;
     panekit::WTimer::Weak _startTimer;
     panekit::WTimer::Weak _progressTimer;
