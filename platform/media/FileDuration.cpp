@@ -86,19 +86,69 @@ namespace {
         return value > INT_MAX ? std::nullopt : std::optional<int>(static_cast<int>(value));
     }
 
-    std::optional<int> movieDuration(int fd, const Box& header)
+    // What a header says of times lies behind version, flags and two dates; 32 or 64 bits wide.
+    struct Times {
+        uint64_t first = 0; // of what comes before the duration, the last 4 bytes
+        uint64_t duration = 0;
+    };
+
+    std::optional<Times> timesOf(int fd, const Box& header, size_t between)
     {
-        std::array<unsigned char, 32> content{};
-        const bool isLong
-            = header.end - header.content >= 32 && readAt(fd, content.data(), 1, header.content) && content[0] == 1;
-        const size_t needed = isLong ? 32 : 20;
-        if (header.end - header.content < static_cast<off_t>(needed)
-            || !readAt(fd, content.data(), needed, header.content))
+        std::array<unsigned char, 40> content{};
+        const auto size = static_cast<size_t>(std::min<off_t>(static_cast<off_t>(content.size()), header.end - header.content));
+        if (size < 1 || !readAt(fd, content.data(), size, header.content))
             return {};
-        if (content[0] > 1 || (content[0] == 1 && !isLong))
+        const int width = content[0] == 1 ? 8 : 4;
+        const size_t place = 4 + 2 * static_cast<size_t>(width);
+        if (content[0] > 1 || size < place + between + static_cast<size_t>(width))
             return {};
-        return isLong ? milliseconds(bigEndian(content.data() + 24, 8), bigEndian(content.data() + 20, 4))
-                      : milliseconds(bigEndian(content.data() + 16, 4), bigEndian(content.data() + 12, 4));
+        return Times{bigEndian(content.data() + place, 4), bigEndian(content.data() + place + between, width)};
+    }
+
+    bool isSound(int fd, const Box& media)
+    {
+        bool sound = false;
+        visitBoxes(fd, media.content, media.end, [&](const Box& box) {
+            std::array<char, 12> head{};
+            sound = sound
+                || (box.is("hdlr") && box.end - box.content >= 12 && readAt(fd, head.data(), head.size(), box.content)
+                    && std::memcmp(head.data() + 8, "soun", 4) == 0);
+            return !sound;
+        });
+        return sound;
+    }
+
+    // Units of the movie; none for a track of something else.
+    std::optional<uint64_t> soundLength(int fd, const Box& track)
+    {
+        std::optional<uint64_t> length;
+        bool sound = false;
+        visitBoxes(fd, track.content, track.end, [&](const Box& box) {
+            constexpr size_t IDENTIFIER = 8; // of the track, and nothing
+            if (box.is("tkhd")) {
+                if (const auto times = timesOf(fd, box, IDENTIFIER))
+                    length = times->duration;
+            }
+            sound = sound || (box.is("mdia") && isSound(fd, box));
+            return true;
+        });
+        return sound && length.value_or(0) > 0 ? length : std::nullopt;
+    }
+
+    // As long as its sound is heard; else what the whole says.
+    std::optional<int> soundDuration(int fd, const Box& movie)
+    {
+        std::optional<Times> whole;
+        std::optional<uint64_t> sound;
+        visitBoxes(fd, movie.content, movie.end, [&](const Box& box) {
+            constexpr size_t SCALE = 4;
+            if (box.is("mvhd"))
+                whole = timesOf(fd, box, SCALE);
+            if (box.is("trak") && !sound)
+                sound = soundLength(fd, box);
+            return true;
+        });
+        return whole ? milliseconds(sound.value_or(whole->duration), whole->first) : std::nullopt;
     }
 
     struct Movie {
@@ -115,11 +165,7 @@ namespace {
             movie.isFragmented = movie.isFragmented || box.is("moof");
             movie.hasData = movie.hasData || box.is("mdat");
             if (box.is("moov"))
-                visitBoxes(fd, box.content, box.end, [&](const Box& inner) {
-                    if (inner.is("mvhd"))
-                        movie.duration = movieDuration(fd, inner);
-                    return !inner.is("mvhd");
-                });
+                movie.duration = soundDuration(fd, box);
             return !movie.isFragmented;
         });
         return movie;

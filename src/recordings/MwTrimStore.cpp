@@ -35,6 +35,16 @@ bool isResult(const struct stat& status, const Content& content)
     return status.st_ino == content.result.inode;
 }
 
+// Elsewhere files have rows only when somebody gave them one.
+bool isCatalogued(const std::string& directory)
+{
+    for (const std::string& root : {mwDeviceRoot(), mwCardRoot(), mwPrivateRoot()}) {
+        if (directory == MwFilePlaces::directoryBelow(root))
+            return true;
+    }
+    return false;
+}
+
 bool hasRow(const std::string& mediaId)
 {
     Media media;
@@ -43,6 +53,8 @@ bool hasRow(const std::string& mediaId)
 
 bool replaceRow(const Content& content, const std::string& path)
 {
+    if (content.formerId.empty() && !isCatalogued(directoryOf(path)))
+        return true;
     std::vector<media_bookmark_entry_s> entries;
     for (const MwBookmark& bookmark : content.bookmarks)
         entries.push_back({bookmark.markedTime, bookmark.name.c_str()});
@@ -54,6 +66,8 @@ bool replaceRow(const Content& content, const std::string& path)
 // For a row that somebody may have written meanwhile, without the bookmarks.
 bool completeRow(const Content& content, const std::string& path)
 {
+    if (!isCatalogued(directoryOf(path)))
+        return true;
     Media media;
     char* id = nullptr;
     if (!MW_CALL(media_info_insert_to_db, path.c_str(), media.out())
