@@ -19,7 +19,7 @@ extern "C" {
 // recorded before comes from the catalogue, as long as the file is the same.
 int mw_get_volume_samples(const char* path, volume_samples_s** samples);
 // The same, until the flag is set; nothing is given then. A coarse look fails where it would not be quicker.
-int mw_get_volume_samples_until(const char* path, volume_samples_quality_e quality,
-    const std::atomic<bool>* cancelled, volume_samples_s** samples);
+int mw_get_volume_samples_until(
+    const char* path, volume_samples_quality_e quality, const std::atomic<bool>* cancelled, volume_samples_s** samples);
 int mw_free_volume_samples(volume_samples_s* samples);
 }

@@ -95,7 +95,8 @@ namespace {
     std::optional<Times> timesOf(int fd, const Box& header, size_t between)
     {
         std::array<unsigned char, 40> content{};
-        const auto size = static_cast<size_t>(std::min<off_t>(static_cast<off_t>(content.size()), header.end - header.content));
+        const auto size
+            = static_cast<size_t>(std::min<off_t>(static_cast<off_t>(content.size()), header.end - header.content));
         if (size < 1 || !readAt(fd, content.data(), size, header.content))
             return {};
         const int width = content[0] == 1 ? 8 : 4;

@@ -81,7 +81,8 @@ namespace {
         for (int from = 0; from < frame.nb_samples; from += BLOCK) {
             const int count = std::min(BLOCK, frame.nb_samples - from);
             if (position + from >= 0)
-                sum.add(static_cast<uint64_t>(position + from), sumOf(frame, from, count), static_cast<uint64_t>(count));
+                sum.add(
+                    static_cast<uint64_t>(position + from), sumOf(frame, from, count), static_cast<uint64_t>(count));
         }
     }
 
@@ -98,8 +99,9 @@ namespace {
             frames._amr = AmrIndex::read(fd);
             if (!frames._amr)
                 frames._movie = Mp4Movie::read(fd);
-            const bool isOurs = frames._amr || (frames._movie && !frames._movie->decoderConfig().empty()
-                && frames._movie->pieces().size() == 1 && !frames._movie->pieces().front().isSilence);
+            const bool isOurs = frames._amr
+                || (frames._movie && !frames._movie->decoderConfig().empty() && frames._movie->pieces().size() == 1
+                    && !frames._movie->pieces().front().isSilence);
             return isOurs ? std::optional<Frames>(std::move(frames)) : std::nullopt;
         }
 
@@ -147,7 +149,8 @@ namespace {
             for (const ByteRange& range : ranges) {
                 uint64_t offset = range.offset;
                 while (offset < range.offset + range.size && frame < end) {
-                    const auto size = static_cast<size_t>(std::min<uint64_t>(BLOCK, range.offset + range.size - offset));
+                    const auto size
+                        = static_cast<size_t>(std::min<uint64_t>(BLOCK, range.offset + range.size - offset));
                     buffer.resize(size + AV_INPUT_BUFFER_PADDING_SIZE);
                     if (!readAt(_file.get(), buffer.data(), size, static_cast<off_t>(offset)))
                         return;
@@ -236,8 +239,7 @@ namespace {
         AvFrame _frame{av_frame_alloc()};
     };
 
-    void readExact(
-        const Frames& frames, uint64_t first, uint64_t end, LoudnessSum& sum, const Cancelled& cancelled)
+    void readExact(const Frames& frames, uint64_t first, uint64_t end, LoudnessSum& sum, const Cancelled& cancelled)
     {
         FrameDecoder(frames, sum).run(first, end, cancelled);
     }

@@ -80,8 +80,8 @@ public:
     }
     Statement& bindBytes(const std::string& bytes)
     {
-        return _keep(
-            sqlite3_bind_blob(_statement, ++_parameter, bytes.data(), static_cast<int>(bytes.size()), SQLITE_TRANSIENT));
+        return _keep(sqlite3_bind_blob(
+            _statement, ++_parameter, bytes.data(), static_cast<int>(bytes.size()), SQLITE_TRANSIENT));
     }
     Statement& bind(long long value) { return _keep(sqlite3_bind_int64(_statement, ++_parameter, value)); }
 
@@ -417,7 +417,8 @@ int Database::selectWaveform(const Waveform& key, std::string& samples)
     return _guarded([&] {
         samples.clear();
         Statement statement(_db,
-            "SELECT WAVEFORM_SAMPLES FROM waveform WHERE WAVEFORM_PATH = ? AND WAVEFORM_SIZE = ? AND WAVEFORM_TIME = ?");
+            "SELECT WAVEFORM_SAMPLES FROM waveform WHERE WAVEFORM_PATH = ? AND WAVEFORM_SIZE = ? AND WAVEFORM_TIME = "
+            "?");
         if (statement.bind(key.path).bind(key.size).bind(key.time).step())
             samples = statement.bytes(0);
         return statement.code();

@@ -354,8 +354,8 @@ uint64_t Mp4Movie::timeOf(uint64_t frame) const
 {
     if (frame >= frames())
         return _mediaLength;
-    const auto next = std::upper_bound(_runs.begin(), _runs.end(), frame,
-        [](uint64_t value, const Run& run) { return value < run.firstFrame; });
+    const auto next = std::upper_bound(
+        _runs.begin(), _runs.end(), frame, [](uint64_t value, const Run& run) { return value < run.firstFrame; });
     const Run& run = *std::prev(next);
     return run.firstTime + (frame - run.firstFrame) * run.delta;
 }
@@ -398,8 +398,7 @@ std::string Mp4Movie::decoderConfig() const
         return found;
     };
     const auto description = nested(_moov, {"trak", "mdia", "minf", "stbl", "stsd"});
-    const auto entry
-        = description && description->size() > 8 ? findBox(description->substr(8), "mp4a") : std::nullopt;
+    const auto entry = description && description->size() > 8 ? findBox(description->substr(8), "mp4a") : std::nullopt;
     constexpr size_t FIXED = 28; // of a sound's description, before its boxes
     auto rest = entry && entry->size() > FIXED ? findBox(entry->substr(FIXED), "esds") : std::nullopt;
     if (!rest || rest->size() < 4)
@@ -471,8 +470,7 @@ std::string Mp4Movie::_tables(const Mp4Part& part, uint64_t dataOffset) const
     for (uint64_t frame = part.first; frame < part.end; ++frame)
         putBigEndian(sizes, _sizes[frame], 4);
     const uint64_t count = part.end - part.first;
-    return makeBox("stts", u32(0) + u32(runs) + times)
-        + makeBox("stsc", u32(0) + u32(1) + u32(1) + u32(count) + u32(1))
+    return makeBox("stts", u32(0) + u32(runs) + times) + makeBox("stsc", u32(0) + u32(1) + u32(1) + u32(count) + u32(1))
         + makeBox("stsz", u32(0) + u32(0) + u32(count) + sizes) + makeBox("stco", u32(0) + u32(1) + u32(dataOffset));
 }
 
@@ -495,9 +493,7 @@ std::string Mp4Movie::indexOf(const Mp4Part& part, uint64_t dataOffset) const
             parsed->between = u32(_scale);
         return parsed->write(box.type);
     };
-    const auto stbl = [&](const Mp4Box& box) {
-        return box.type == "stsd" ? std::string(box.whole) : std::string();
-    };
+    const auto stbl = [&](const Mp4Box& box) { return box.type == "stsd" ? std::string(box.whole) : std::string(); };
     const auto minf = [&](const Mp4Box& box) {
         return box.type == "stbl" ? makeBox("stbl", rebuild(box.content, stbl) + _tables(part, dataOffset))
                                   : std::string(box.whole);

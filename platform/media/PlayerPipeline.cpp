@@ -15,8 +15,10 @@ namespace media {
 namespace {
 
     constexpr auto FILE_SOURCE = "filesrc name=file ! ";
-    constexpr auto SPEAKER = " ! audioconvert ! audioresample ! "
-                             "pulsesink name=speaker client-name=Mewlo stream-properties=props,media.role=music";
+    // The sink follows the system's clock: its own stands still for good when a stream is paused soon after its start.
+    constexpr auto SPEAKER
+        = " ! audioconvert ! audioresample ! "
+          "pulsesink name=speaker client-name=Mewlo provide-clock=false stream-properties=props,media.role=music";
     constexpr auto AAC_CHAIN = "qtdemux ! aacparse ! avdec_aac";
     constexpr auto ANY_DECODER = "decodebin";
     constexpr GstClockTime PREROLL = 3 * GST_SECOND;
@@ -115,8 +117,11 @@ PlayerPipeline::~PlayerPipeline()
     *_isAlive = false;
     if (_handler != nullptr)
         ecore_main_fd_handler_del(_handler);
-    if (_pipeline != nullptr)
+    // Not at once to the end: a decoder may still be asking the sink, which then has lost its connection.
+    if (_pipeline != nullptr) {
+        gst_element_set_state(_pipeline, GST_STATE_READY);
         gst_element_set_state(_pipeline, GST_STATE_NULL);
+    }
     g_clear_object(&_bus);
     g_clear_object(&_sink);
     g_clear_object(&_pipeline);

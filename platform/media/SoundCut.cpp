@@ -79,8 +79,8 @@ namespace {
         {
             constexpr unsigned int HALF = AmrIndex::FRAME_MS / 2;
             const uint64_t first = (static_cast<unsigned int>(range.begin) + HALF) / AmrIndex::FRAME_MS;
-            const uint64_t end = std::max<uint64_t>(
-                first + 1, (static_cast<unsigned int>(range.end) + HALF) / AmrIndex::FRAME_MS);
+            const uint64_t end
+                = std::max<uint64_t>(first + 1, (static_cast<unsigned int>(range.end) + HALF) / AmrIndex::FRAME_MS);
             const uint64_t from = _index.offsetOf(source(), first);
             const uint64_t to = _index.offsetOf(source(), end);
             if (from >= to)

@@ -242,8 +242,7 @@ int StreamCut::_encode(Output& output, const Range&, ExportWatch& watch)
     encoder->bits_per_raw_sample = decoder->bits_per_raw_sample;
     encoder->time_base = {1, decoder->sample_rate};
     encoder->strict_std_compliance = FF_COMPLIANCE_EXPERIMENTAL; // 32 bits
-    if (avcodec_open2(encoder, kind, nullptr) < 0
-        || avcodec_parameters_from_context(output.to->codecpar, encoder) < 0)
+    if (avcodec_open2(encoder, kind, nullptr) < 0 || avcodec_parameters_from_context(output.to->codecpar, encoder) < 0)
         return ENOTSUP;
     const AVRational unit = output.from->time_base;
     const int64_t begin = av_rescale_q(output.begin, unit, encoder->time_base);
@@ -267,8 +266,8 @@ int StreamCut::_encode(Output& output, const Range&, ExportWatch& watch)
         return code == AVERROR(EAGAIN) || code == AVERROR_EOF ? 0 : errorOf(code);
     };
     const auto encodeWhole = [&](bool isLast) {
-        while (av_audio_fifo_size(fifo.get()) >= encoder->frame_size
-            || (isLast && av_audio_fifo_size(fifo.get()) > 0)) {
+        while (
+            av_audio_fifo_size(fifo.get()) >= encoder->frame_size || (isLast && av_audio_fifo_size(fifo.get()) > 0)) {
             AvFrame chunk(av_frame_alloc());
             chunk->nb_samples = std::min(encoder->frame_size, av_audio_fifo_size(fifo.get()));
             chunk->format = encoder->sample_fmt;
@@ -303,8 +302,8 @@ int StreamCut::_encode(Output& output, const Range&, ExportWatch& watch)
         }
         if (const int error = encodeWhole(false); error != 0)
             return error;
-        watch.percent
-            = static_cast<int>(std::clamp<int64_t>((position - begin) * 100 / std::max<int64_t>(1, end - begin), 0, 100));
+        watch.percent = static_cast<int>(
+            std::clamp<int64_t>((position - begin) * 100 / std::max<int64_t>(1, end - begin), 0, 100));
     }
     if (const int error = encodeWhole(true); error != 0)
         return error;

@@ -265,8 +265,8 @@ Loudness cachedLoudness(const std::string& path)
         return {};
     Loudness loudness;
     for (size_t i = 0; i + 1 < samples.size(); i += 2)
-        loudness.push_back(
-            static_cast<uint32_t>(static_cast<unsigned char>(samples[i]) << 8 | static_cast<unsigned char>(samples[i + 1])));
+        loudness.push_back(static_cast<uint32_t>(
+            static_cast<unsigned char>(samples[i]) << 8 | static_cast<unsigned char>(samples[i + 1])));
     return loudness;
 }
 

@@ -36,8 +36,8 @@ int mw_get_volume_samples(const char* path, volume_samples_s** samples)
     return mw_get_volume_samples_until(path, VOLUME_SAMPLES_EXACT, &never, samples);
 }
 
-int mw_get_volume_samples_until(const char* path, volume_samples_quality_e quality,
-    const std::atomic<bool>* cancelled, volume_samples_s** samples)
+int mw_get_volume_samples_until(
+    const char* path, volume_samples_quality_e quality, const std::atomic<bool>* cancelled, volume_samples_s** samples)
 {
     if (path == nullptr || cancelled == nullptr || samples == nullptr)
         return FAILED;

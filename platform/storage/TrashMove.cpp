@@ -56,8 +56,8 @@ Trash trashFor(const std::string& path, dev_t device)
     const std::string top = topOf(path, device);
     const Trash own{(top == "/" ? "" : top) + "/.Trash-" + std::to_string(::getuid()), top};
     struct stat status { };
-    const bool isForeign = ::lstat(own.directory.c_str(), &status) == 0
-        && (!S_ISDIR(status.st_mode) || status.st_uid != ::getuid());
+    const bool isForeign
+        = ::lstat(own.directory.c_str(), &status) == 0 && (!S_ISDIR(status.st_mode) || status.st_uid != ::getuid());
     return top != "/" && !isForeign && makeFolders(own) ? own : Trash();
 }
 

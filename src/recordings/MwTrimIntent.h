@@ -17,10 +17,7 @@ public:
         uint64_t inode = 0;
         uint64_t size = 0; // bytes
 
-        static Identity of(const struct stat& status)
-        {
-            return {status.st_ino, static_cast<uint64_t>(status.st_size)};
-        }
+        static Identity of(const struct stat& status) { return {status.st_ino, static_cast<uint64_t>(status.st_size)}; }
         bool operator==(const Identity&) const = default;
     };
     struct Content {

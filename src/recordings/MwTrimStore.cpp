@@ -59,8 +59,8 @@ bool replaceRow(const Content& content, const std::string& path)
     for (const MwBookmark& bookmark : content.bookmarks)
         entries.push_back({bookmark.markedTime, bookmark.name.c_str()});
     const char* formerId = content.replaces && !content.formerId.empty() ? content.formerId.c_str() : nullptr;
-    return MW_CALL(media_info_replace_in_db, formerId, path.c_str(), entries.data(),
-        static_cast<int>(entries.size()), nullptr);
+    return MW_CALL(
+        media_info_replace_in_db, formerId, path.c_str(), entries.data(), static_cast<int>(entries.size()), nullptr);
 }
 
 // For a row that somebody may have written meanwhile, without the bookmarks.
@@ -223,8 +223,7 @@ bool MwTrimStore::_replaceFile(const Content& content)
     named.name = _source.substr(_source.rfind('/') + 1);
     if (!_intent.save(named))
         return false;
-    _canExchange
-        = ::renameat2(AT_FDCWD, _stagedPath.c_str(), AT_FDCWD, _output.c_str(), RENAME_EXCHANGE) == 0;
+    _canExchange = ::renameat2(AT_FDCWD, _stagedPath.c_str(), AT_FDCWD, _output.c_str(), RENAME_EXCHANGE) == 0;
     if (_canExchange)
         return true;
     if (errno != EINVAL && errno != ENOSYS) {
@@ -239,8 +238,7 @@ bool MwTrimStore::_undo(const Content& content)
 {
     const bool undone = !content.replaces
         ? ::renameat2(AT_FDCWD, _output.c_str(), AT_FDCWD, _stagedPath.c_str(), RENAME_NOREPLACE) == 0
-        : _canExchange
-            && ::renameat2(AT_FDCWD, _stagedPath.c_str(), AT_FDCWD, _output.c_str(), RENAME_EXCHANGE) == 0;
+        : _canExchange && ::renameat2(AT_FDCWD, _stagedPath.c_str(), AT_FDCWD, _output.c_str(), RENAME_EXCHANGE) == 0;
     if (undone)
         MwFiles::flushDirectoryOf(_output);
     return undone;

@@ -281,8 +281,7 @@ bool MwTrim::_getMediaInfo(const std::string& path, std::vector<MwBookmark>* boo
     }
     MwHandle<filter_h, media_filter_destroy> filter;
     // Exactly this path: the column itself does not tell capital letters from small ones.
-    const std::string condition
-        = "MEDIA_PATH = \"" + mwAdopt(media_content_escape(path.c_str())) + "\" COLLATE BINARY";
+    const std::string condition = "MEDIA_PATH = \"" + mwAdopt(media_content_escape(path.c_str())) + "\" COLLATE BINARY";
     if (!MW_CALL(media_filter_create, filter.out())
         || !MW_CALL(media_filter_set_condition, filter.get(), condition.c_str(), MEDIA_CONTENT_COLLATE_NOCASE)
         || !MW_CALL(media_filter_set_offset, filter.get(), 0, 1)

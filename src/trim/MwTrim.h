@@ -14,9 +14,9 @@
 #include "MwModel.h"
 #include "MwTrimStore.h"
 
-// Cuts a recording down to a time range, as a new file or in place of it, with the bookmarks inside. A worker drives the
-// platform's engine by a queue of commands; the outcome arrives as one event on the main loop. Used once; one at a time
-// in a process, made and destroyed on the main loop.
+// Cuts a recording down to a time range, as a new file or in place of it, with the bookmarks inside. A worker drives
+// the platform's engine by a queue of commands; the outcome arrives as one event on the main loop. Used once; one at a
+// time in a process, made and destroyed on the main loop.
 class MwTrim {
 public:
     enum eventType : int { TRIM_EVENT_FAILED = 0, TRIM_EVENT_DONE = 1 };

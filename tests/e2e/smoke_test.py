@@ -37,9 +37,13 @@ def recordings(place):
     return [(path, int(duration), int(bookmarks)) for path, duration, bookmarks in rows]
 
 
+def decoded(path, *options):
+    return subprocess.run(["ffmpeg", "-v", "error", "-i", path, *options, "-f", "s16le", "-ac", "1", "-"],
+                          stdin=subprocess.DEVNULL, capture_output=True, check=True).stdout
+
+
 def decoded_ms(path):
-    raw = subprocess.run(["ffmpeg", "-v", "error", "-i", path, "-f", "s16le", "-ac", "1", "-ar", "8000", "-"],
-                         stdin=subprocess.DEVNULL, capture_output=True, check=True).stdout
+    raw = decoded(path, "-ar", "8000")
     check(max(abs(b - 128) for b in raw[1::2]) > 0 and raw.strip(b"\0"), f"{path} is silent")
     return len(raw) // 16
 
@@ -132,7 +136,8 @@ def control(place, *words):
 
 
 def trash(place):
-    return os.listdir(place.env["XDG_DATA_HOME"] + "/Trash/files")
+    files = place.env["XDG_DATA_HOME"] + "/Trash/files"
+    return os.listdir(files) if os.path.isdir(files) else []
 
 
 def find_play_bookmark_rename_delete(place):
@@ -172,6 +177,43 @@ def find_play_bookmark_rename_delete(place):
     place.wait_for("the end of the file", lambda: not os.path.exists(path))
     place.wait_for("the row that is left", lambda: len(recordings(place)) == 1)
     check(trash(place) == ["Harbour.m4a"], "it lies in the trash")
+
+
+def trims_what_it_records(place):
+    start_recorder(place)
+    place.make_noise(20)
+    start_recording(place)
+    time.sleep(4)
+    place.call("xdotool", "key", "Return")
+    place.wait_for("the row", lambda: recordings(place))
+    path, duration, _ = recordings(place)[0]
+    time.sleep(1)
+    place.click(500, 120)  # the first row of the list that opened
+    time.sleep(1)
+    place.click(885, 911)  # trim
+    time.sleep(1)
+    place.call("xdotool", "key", "shift+Right", "Right", "Right")  # the start, which has the keyboard
+    place.call("xdotool", "key", "Return")
+    time.sleep(0.5)
+    place.call("xdotool", "key", "Down", "Return")  # as a new file
+    place.wait_for("the trimmed recording", lambda: len(recordings(place)) == 2)
+    trimmed = path.replace(".m4a", "_001.m4a")
+    check(sorted(row[0] for row in recordings(place)) == sorted([path, trimmed]), "its name")
+    length = [row[1] for row in recordings(place) if row[0] == trimmed][0]
+    check(abs(duration - 1200 - length) < 30, f"{length} of {duration} ms")
+    whole, part = decoded(path), decoded(trimmed)
+    begin = 44100 * 12 // 10 * 2
+    check(part[:length // 2 * 88] == whole[begin:begin + length // 2 * 88], "every sample of it")
+
+    time.sleep(1)
+    place.click(885, 911)
+    time.sleep(1)
+    place.call("xdotool", "key", "shift+Right", "Return")
+    time.sleep(0.5)
+    place.call("xdotool", "key", "Down", "Down", "Return")  # over the original
+    place.wait_for("the replaced recording", lambda: trash(place))
+    check(trash(place) == ["Voice 001 (original).m4a"], "the original lies in the trash")
+    check(abs(decoded_ms(path) - duration + 1000) < 60, f"{decoded_ms(path)} of {duration} ms")
 
 
 def request_returns_a_path(place):

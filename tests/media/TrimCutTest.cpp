@@ -32,8 +32,8 @@ bool shell(const std::string& command) { return std::system(command.c_str()) == 
 std::vector<int16_t> decode(const std::string& file, const TempDir& directory, const std::string& filter = {})
 {
     const std::string raw = directory.file("raw");
-    const std::string command
-        = "ffmpeg -v error -y -i '" + file + "' " + filter + " -map 0:a -ac 1 -f s16le " + raw + " </dev/null 2>/dev/null";
+    const std::string command = "ffmpeg -v error -y -i '" + file + "' " + filter + " -map 0:a -ac 1 -f s16le " + raw
+        + " </dev/null 2>/dev/null";
     if (!shell(command))
         return {};
     const std::string bytes = support::readFile(raw);
@@ -58,8 +58,8 @@ protected:
     // White noise, with which no shift goes unseen (but not AAC's own, which a decoder makes up anew each time).
     bool make(const std::string& name, const std::string& codec, int seconds = 6, int rate = 44100)
     {
-        return shell("ffmpeg -v error -y -f lavfi -i anoisesrc=d=" + std::to_string(seconds) + ":r=" + std::to_string(rate)
-            + ":a=0.4:c=white -ac 1 " + codec + " '" + file(name) + "'");
+        return shell("ffmpeg -v error -y -f lavfi -i anoisesrc=d=" + std::to_string(seconds)
+            + ":r=" + std::to_string(rate) + ":a=0.4:c=white -ac 1 " + codec + " '" + file(name) + "'");
     }
     [[nodiscard]] std::string file(const std::string& name) const { return _directory.file(name); }
 
@@ -92,7 +92,8 @@ protected:
         const auto first = static_cast<long>(std::lround(begin * rate / 1000.0));
         const auto wanted = static_cast<long>(std::lround(end * rate / 1000.0)) - first;
         EXPECT_NEAR(static_cast<double>(part.size()), static_cast<double>(wanted), slack + LONGEST_FRAME);
-        ASSERT_GE(static_cast<long>(part.size()), std::min<long>(wanted, static_cast<long>(whole.size()) - first) - slack);
+        ASSERT_GE(
+            static_cast<long>(part.size()), std::min<long>(wanted, static_cast<long>(whole.size()) - first) - slack);
         // The shift that fits best, within the slack; then all of it has to fit.
         long best = 0;
         double least = 1e30;
@@ -101,7 +102,8 @@ protected:
             double sum = 0;
             for (long i = from_; i < from_ + count; ++i) {
                 const long at = first + i + shift;
-                const double value = at >= 0 && at < static_cast<long>(whole.size()) ? whole[static_cast<size_t>(at)] : 0;
+                const double value
+                    = at >= 0 && at < static_cast<long>(whole.size()) ? whole[static_cast<size_t>(at)] : 0;
                 sum += std::abs(value - part[static_cast<size_t>(i)]);
             }
             return sum / static_cast<double>(count);
@@ -170,7 +172,8 @@ TEST_F(TrimCutTest, CutsWhatOthersHaveRecorded)
         const char* codec;
         int slack; // samples
     } cases[] = {
-        {"fragments.m4a", "-c:a aac -aac_pns 0 -movflags frag_keyframe+empty_moov+default_base_moof -frag_duration 500000", 1200},
+        {"fragments.m4a",
+            "-c:a aac -aac_pns 0 -movflags frag_keyframe+empty_moov+default_base_moof -frag_duration 500000", 1200},
         {"a.mp3", "-c:a libmp3lame -b:a 128k -metadata title=Hello", 1300},
         {"a.ogg", "-c:a libvorbis", 1300},
         {"a.opus.ogg", "-c:a libopus -ar 48000", 1300},
@@ -245,9 +248,8 @@ TEST_F(TrimCutTest, CutsTwelveHoursAndIsCancelledAtOnce)
             out.push_back(static_cast<char>(value >> shift));
         return out;
     };
-    const auto box = [&](const std::string& type, const std::string& content) {
-        return u32(content.size() + 8) + type + content;
-    };
+    const auto box
+        = [&](const std::string& type, const std::string& content) { return u32(content.size() + 8) + type + content; };
     const std::string index = movie->indexOf(*movie->part(0, 44100), 48);
     const size_t at = index.find("stsd") - 4;
     const std::string stsd = index.substr(at, static_cast<unsigned char>(index[at + 3]));

@@ -41,9 +41,10 @@ protected:
     {
         const bool isAmr = name.ends_with(".amr");
         // Three thirds: loud, silent, half as loud.
-        const std::string volume = "volume='if(lt(t," + length + "/3),0.5,if(lt(t,2*" + length + "/3),0,0.25))':eval=frame";
+        const std::string volume
+            = "volume='if(lt(t," + length + "/3),0.5,if(lt(t,2*" + length + "/3),0,0.25))':eval=frame";
         return std::system(("ffmpeg -v error -y -f lavfi -i anoisesrc=d=" + length + ":r=44100:a=1 -af \"" + volume
-                               + "\" -ac 1 " + codec + " '" + _directory.file(isAmr ? "a.wav" : name) + "'")
+                   + "\" -ac 1 " + codec + " '" + _directory.file(isAmr ? "a.wav" : name) + "'")
                                .c_str())
             == 0
             && (!isAmr || support::encodeAmr(_directory.file("a.wav"), _directory.file(name)));
@@ -76,8 +77,7 @@ TEST_F(VolumeSamplesTest, TellsLoudFromSilent)
 
 TEST_F(VolumeSamplesTest, CoarseLookShowsTheSamePicture)
 {
-    for (const auto& [name, codec] :
-        {std::pair("a.m4a", "-c:a aac -b:a 32k -ar 8000"), {"a.amr", "-ar 8000"}}) {
+    for (const auto& [name, codec] : {std::pair("a.m4a", "-c:a aac -b:a 32k -ar 8000"), {"a.amr", "-ar 8000"}}) {
         SCOPED_TRACE(name);
         ASSERT_TRUE(make(name, codec, "1200"));
         const Values coarse = read(_directory.file(name), VOLUME_SAMPLES_COARSE);

@@ -11,7 +11,8 @@ namespace support {
 inline bool encodeAmr(const std::string& from, const std::string& to)
 {
     const std::string command = "gst-launch-1.0 -q filesrc location='" + from
-        + "' ! wavparse ! audioconvert ! audioresample ! audio/x-raw,rate=8000,channels=1 ! amrnbenc ! filesink location='"
+        + "' ! wavparse ! audioconvert ! audioresample ! audio/x-raw,rate=8000,channels=1 ! amrnbenc ! filesink "
+          "location='"
         + to + ".frames'";
     if (std::system(command.c_str()) != 0)
         return false;

@@ -73,11 +73,11 @@ int count() { return calls; }
 
 }
 
-#define FAULTY(type, name, parameters, arguments, place)                                                              \
-    type name parameters                                                                                              \
-    {                                                                                                                 \
-        static auto* const next = real<type parameters>(#name);                                                       \
-        return meets(place) ? -1 : next arguments;                                                                    \
+#define FAULTY(type, name, parameters, arguments, place)                                                               \
+    type name parameters                                                                                               \
+    {                                                                                                                  \
+        static auto* const next = real<type parameters>(#name);                                                        \
+        return meets(place) ? -1 : next arguments;                                                                     \
     }
 
 extern "C" {

@@ -79,8 +79,10 @@ const std::string& PanelScreen::sound()
     static const std::string content = [] {
         const support::TempDir directory;
         const std::string file = directory.file("a.m4a");
-        const std::string command = "ffmpeg -v error -f lavfi -i anoisesrc=d=10:r=44100 -af volume=t/10:eval=frame -ac 1 "
-                                    "-c:a aac " + file;
+        const std::string command
+            = "ffmpeg -v error -f lavfi -i anoisesrc=d=10:r=44100 -af volume=t/10:eval=frame -ac 1 "
+              "-c:a aac "
+            + file;
         return std::system(command.c_str()) == 0 ? support::readFile(file) : std::string();
     }();
     return content;

@@ -4,8 +4,8 @@
 
 #include "MwPlayViewController.h"
 #include "MwPlayer.h"
-#include "MwTrimViewController.h"
 #include "MwSavedBookmarks.h"
+#include "MwTrimViewController.h"
 #include "ScreenWindow.h"
 #include "support/TempDir.h"
 

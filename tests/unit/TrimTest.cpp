@@ -67,7 +67,7 @@ std::string idOf(const std::string& path)
 Marks marksOf(const std::string& path)
 {
     Marks marks;
-    for (const MwSavedBookmark& each : mwReadBookmarks(idOf(path), [](const char*, int) { }))
+    for (const MwSavedBookmark& each : mwReadBookmarks(idOf(path), [](const char*, int) {}))
         marks[each.markedTime] = each.name;
     return marks;
 }
@@ -121,7 +121,8 @@ protected:
         std::error_code none;
         const fs::directory_iterator files(trash() + "/files", none);
         // A kill in between may have used up the name itself.
-        return files != fs::directory_iterator() && files->path().filename().string().starts_with("Voice 001 (original)")
+        return files != fs::directory_iterator()
+                && files->path().filename().string().starts_with("Voice 001 (original)")
             ? readFile(files->path())
             : std::string();
     }

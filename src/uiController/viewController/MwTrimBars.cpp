@@ -139,8 +139,8 @@ void MwTrimBars::update()
 {
     _updateGeometry();
     const MwTrimRange::Geometry& geometry = _range.getGeometry();
-    const unsigned int position = _press == MwTrimRange::PLAY_POSITION_BAR_PRESSED ? _dragPosition
-                                                                                  : _callbacks.getPosition();
+    const unsigned int position
+        = _press == MwTrimRange::PLAY_POSITION_BAR_PRESSED ? _dragPosition : _callbacks.getPosition();
     const double whole = geometry.waveform + 2 * geometry.sideBar;
     const auto move = [&](Bar bar, double x, double width) {
         const double share = whole > width ? x / (whole - width) : 0;

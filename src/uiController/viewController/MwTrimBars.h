@@ -7,9 +7,9 @@
 
 #include "MwTrimRange.h"
 
-// The three bars over the waveform, what they shade, and how they are moved: by finger on one touch area above them all,
-// by keys on the focused one, by a screen reader. Belongs to the panel; its objects to the panel's layout, which keeps
-// the bars in place when it changes its size. Main loop only.
+// The three bars over the waveform, what they shade, and how they are moved: by finger on one touch area above them
+// all, by keys on the focused one, by a screen reader. Belongs to the panel; its objects to the panel's layout, which
+// keeps the bars in place when it changes its size. Main loop only.
 class MwTrimBars {
 public:
     struct Callbacks {

@@ -103,10 +103,7 @@ void MwTrimBookmarkWidget::_delCb(Evas_Object* widget)
 
 void MwTrimBookmarkWidget::_moveCb(Evas_Object* widget, Evas_Coord, Evas_Coord) { evas_object_smart_changed(widget); }
 
-void MwTrimBookmarkWidget::_resizeCb(Evas_Object* widget, Evas_Coord, Evas_Coord)
-{
-    evas_object_smart_changed(widget);
-}
+void MwTrimBookmarkWidget::_resizeCb(Evas_Object* widget, Evas_Coord, Evas_Coord) { evas_object_smart_changed(widget); }
 
 void MwTrimBookmarkWidget::_showCb(Evas_Object* widget) { _dataOf(widget)->forEach(evas_object_show); }
 

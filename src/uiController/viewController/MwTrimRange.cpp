@@ -26,10 +26,7 @@ double MwTrimRange::_timeOf(double pixels) const
     return _geometry.waveform > 0 ? pixels / _geometry.waveform * _duration : 0;
 }
 
-double MwTrimRange::getStartX() const
-{
-    return _duration > 0 ? _geometry.waveform * _trimBegin / _duration : 0;
-}
+double MwTrimRange::getStartX() const { return _duration > 0 ? _geometry.waveform * _trimBegin / _duration : 0; }
 
 double MwTrimRange::getEndX() const
 {

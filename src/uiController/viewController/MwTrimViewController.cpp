@@ -203,8 +203,7 @@ void MwTrimViewController::_createBookmarkUI()
         return;
     }
     const MwFileInfo* info = _model->getRecordedFileInfoByPath(_playPath);
-    const auto bookmarks
-        = info ? mwReadBookmarks(info->mediaId, logBookmarkFailure) : std::vector<MwSavedBookmark>();
+    const auto bookmarks = info ? mwReadBookmarks(info->mediaId, logBookmarkFailure) : std::vector<MwSavedBookmark>();
     if (bookmarks.empty())
         return;
     Evas* canvas = evas_object_evas_get(getEvasObject());
@@ -407,8 +406,7 @@ void MwTrimViewController::_updateSaveButton()
     if (isPossible == (elm_object_disabled_get(button) == EINA_FALSE))
         return;
     elm_object_disabled_set(button, !isPossible);
-    uxt_theme_object_set_color(
-        elm_object_part_content_get(button, ICON_PART), isPossible ? COLOR : DISABLED_COLOR);
+    uxt_theme_object_set_color(elm_object_part_content_get(button, ICON_PART), isPossible ? COLOR : DISABLED_COLOR);
 }
 
 void MwTrimViewController::_updatePlayingTrimBar()
@@ -435,8 +433,7 @@ void MwTrimViewController::_showTime(const char* part, unsigned int time, bool i
     if (shown && text == shown)
         return;
     elm_object_part_text_set(getEvasObject(), part, text.c_str());
-    elm_object_signal_emit(
-        getEvasObject(), (std::string(part) + (isHeld ? ",held" : ",free")).c_str(), "mewlo");
+    elm_object_signal_emit(getEvasObject(), (std::string(part) + (isHeld ? ",held" : ",free")).c_str(), "mewlo");
 }
 
 void MwTrimViewController::_rangeMoved()

@@ -243,8 +243,8 @@ void MwTrimWaveform::_pixelsCb(void* data, Evas_Object* image)
         return;
     self->_drawWaveform();
     evas_object_image_data_set(image, cairo_image_surface_get_data(self->_surface));
-    evas_object_image_data_update_add(image, 0, 0, cairo_image_surface_get_width(self->_surface),
-        cairo_image_surface_get_height(self->_surface));
+    evas_object_image_data_update_add(
+        image, 0, 0, cairo_image_surface_get_width(self->_surface), cairo_image_surface_get_height(self->_surface));
 }
 
 void MwTrimWaveform::_drawWaveform()

@@ -16,8 +16,8 @@
 typedef struct _cairo cairo_t;
 typedef struct _cairo_surface cairo_surface_t;
 
-// The picture of how loud a recording is: 90 bars, drawn anew for each size of its image and each theme. The samples are
-// read on a thread of their own, a coarse look first, then the exact one; the bars grow from the one to the other.
+// The picture of how loud a recording is: 90 bars, drawn anew for each size of its image and each theme. The samples
+// are read on a thread of their own, a coarse look first, then the exact one; the bars grow from the one to the other.
 // Belongs to the panel, its image to the panel's layout. Main loop only.
 class MwTrimWaveform {
 public:
