@@ -1,12 +1,10 @@
 // Prints what the player panel costs, in percent of a core: "paused PERCENT" and "playing PERCENT", the latter with the
 // position of a short recording moving as fast as the player reports it. Drawn by the toolkit's buffer engine; nothing
 // is played.
-#include <Efreet.h>
 #include <Elementary.h>
 #include <gst/gst.h>
 #include <media_content.h>
 #include <panekit/WTimer.h>
-#include <uxt_theme.h>
 
 #include <cstdio>
 #include <string>
@@ -14,8 +12,8 @@
 
 #include "MwPlayViewController.h"
 #include "MwPlayer.h"
-#include "MwResourceMgr.h"
 #include "bench/Engines.h"
+#include "bench/PanelWindow.h"
 
 namespace {
 
@@ -52,14 +50,6 @@ double percentOfACore()
     return (usedSeconds() - used) * 100000.0 / (bench::milliseconds() - begin);
 }
 
-std::string resource(const char* name)
-{
-    std::string path;
-    if (!MwResourceMgr::getInstance()->getEdjPath(name, path))
-        std::fprintf(stderr, "bench: there is no %s\n", name);
-    return path;
-}
-
 // A silent file as long as the panel needs it.
 std::string makeRecording(const std::string& folder)
 {
@@ -78,34 +68,12 @@ std::string makeRecording(const std::string& folder)
     return file;
 }
 
-Evas_Object* openWindow()
-{
-    elm_app_base_scale_set(2.6);
-    elm_config_scale_set(1.3);
-    MwResourceMgr::getInstance()->initialize();
-    elm_theme_extension_add(nullptr, resource("edje/MwButton.edj").c_str());
-    uxt_theme_set_color_table(
-        uxt_theme_add_color_table(resource("tables/com.tovanic.mewlo-lite_ChangeableColorInfo.xml").c_str()));
-    Evas_Object* window = elm_win_util_standard_add("bench", "bench");
-    evas_object_resize(window, 360, 640);
-    Evas_Object* host = elm_layout_add(window);
-    elm_layout_file_set(host, resource("edje/MwBookmarksContentView.edj").c_str(), "bookmarks_content_view");
-    evas_object_size_hint_weight_set(host, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
-    elm_win_resize_object_add(window, host);
-    evas_object_show(host);
-    evas_object_show(window);
-    return host;
-}
-
 }
 
 int main(int argc, char** argv)
 {
-    ::setenv("ELM_ENGINE", "buffer", 1);
     gst_init(&argc, &argv);
-    efreet_cache_disable();
-    ecore_app_no_system_modules();
-    elm_init(argc, argv);
+    bench::initToolkit(argc, argv, 1.3);
     bench::Engines engines;
     const std::string file = makeRecording(engines.model.getRecordingsDirectory());
     media_info_h media = nullptr;
@@ -116,7 +84,7 @@ int main(int argc, char** argv)
     engines.model.setCurrentPlayPath(file);
     engines.model.setPlayerState(MwPlayer::PLAY_STATE_PAUSED);
     auto* panel = new MwPlayViewController(&engines.model, &engines.controller);
-    if (!panel->dock(openWindow(), MwPlayViewController::QUIET))
+    if (!panel->dock(bench::openWindow(360, 640), MwPlayViewController::QUIET))
         return 1;
     runFor(1.0);
     std::printf("paused %.2f\n", percentOfACore());
