@@ -237,6 +237,14 @@ TEST_F(TrimPanelTest, KeysMoveTheFocusedBar)
     key("Home");
     EXPECT_EQ(0U, range().getBegin());
     EXPECT_TRUE(_screen.takeCommands() == Commands{MwAppController::SET_PLAYER_POSITION});
+    key("Tab");
+    key("Left");
+    EXPECT_EQ(9900U, range().getEnd());
+    key("End");
+    key("Tab");
+    key("Left", true);
+    EXPECT_EQ((std::vector<unsigned int>{9000, 8000}), _screen.soughtTo) << "the play bar";
+    _screen.takeCommands();
     key("space");
     key("space");
     EXPECT_EQ((Commands{MwAppController::RESUME_PLAYING, MwAppController::PAUSE_PLAYING}), _screen.takeCommands());

@@ -10,6 +10,7 @@
 #include <media_content.h>
 #include <vconf.h>
 
+#include "PanelScreen.h"
 #include "Picture.h"
 #include "RecordingsScreen.h"
 #include "support/DatabaseRows.h"
@@ -103,6 +104,16 @@ namespace {
         screen.playerChanged();
     }
 
+    // The focused bar of the trim panel, by seconds.
+    void moveBar(RecordingsScreen& screen, const char* key, int seconds)
+    {
+        Evas* canvas = evas_object_evas_get(screen.window);
+        evas_key_modifier_on(canvas, "Shift");
+        for (int i = 0; i < seconds; ++i)
+            support::key(screen.window, key);
+        evas_key_modifier_off(canvas, "Shift");
+    }
+
     const std::vector<Shot>& shots()
     {
         static const std::vector<Shot> all = {
@@ -120,6 +131,19 @@ namespace {
                 [](auto& screen) {
                     play(screen);
                     screen.tap("Voice 004.m4a");
+                }},
+            {"list-trimming", some,
+                [](auto& screen) {
+                    support::writeFile(recordingPath("Voice 004.m4a"), PanelScreen::sound());
+                    play(screen);
+                    screen.tap("Voice 004.m4a");
+                    screen.model.setTrimMode(true);
+                    screen.playerChanged();
+                    support::runFor(1.0);
+                    moveBar(screen, "Right", 160);
+                    support::key(screen.window, "Tab");
+                    moveBar(screen, "Left", 180);
+                    support::runFor(0.2);
                 }},
             {"list-keyboard", some,
                 [](auto& screen) {

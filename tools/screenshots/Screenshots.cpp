@@ -138,10 +138,11 @@ int main(int argc, char** argv)
         ui::takeListShots(directory, dark ? "-dark" : "-light", argc > 2 ? argv[2] : "", width, height);
         ui::takePanelShots(directory, dark ? "-dark" : "-light", argc > 2 ? argv[2] : "", width, height);
         takeRename(directory, dark ? "-dark" : "-light");
-        if (argc > 2)
+        if (argc > 2 && std::string(argv[2]) != "wide")
             continue;
         take(directory, shots()[2], dark ? "-wide-dark" : "-wide-light", width * 3, height);
         ui::takeListShots(directory, dark ? "-wide-dark" : "-wide-light", "list-playing", width * 5 / 2, height);
+        ui::takePanelShots(directory, dark ? "-wide-dark" : "-wide-light", "trim-range", width * 5 / 2, height / 2);
     }
     return 0;
 }
