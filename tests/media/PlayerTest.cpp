@@ -4,12 +4,16 @@
 
 #include <chrono>
 #include <cmath>
+#include <csignal>
 #include <utility>
 
 using support::runFor;
 using support::runUntil;
 
 namespace {
+
+// Much less than a sound server or a decoder may hang, and enough for a slow machine.
+constexpr auto SOON = std::chrono::milliseconds(500);
 
 // A player that notes what it tells.
 class PlayerHandle {
@@ -188,6 +192,53 @@ TEST_F(PlayerTest, RefusesWhatItCannotPlay)
     server.kill();
     PlayerHandle silent;
     EXPECT_EQ(PLAYER_ERROR_CONNECTION_FAILED, silent.open(recording(1, false)));
+}
+
+// The first of these files once aborted the program, the second one held it for seconds.
+TEST_F(PlayerTest, DamagedFilesAbortNothingAndHoldNobody)
+{
+    for (const char* name : {"aborts.amr", "stalls.amr"}) {
+        for (int i = 0; i < (std::string(name) == "aborts.amr" ? 60 : 3); ++i) {
+            SCOPED_TRACE(i);
+            PlayerHandle player;
+            const auto begin = std::chrono::steady_clock::now();
+            const int error = player.play(std::string(MEWLO_TEST_DATA "/") + name);
+            EXPECT_LT(std::chrono::steady_clock::now() - begin, SOON);
+            runFor(i % 2 == 0 ? 0 : 0.02);
+            if (error == 0 && i == 0) {
+                EXPECT_TRUE(runUntil([&] { return player.errors + player.completed > 0; }));
+            }
+            const auto end = std::chrono::steady_clock::now();
+            player.destroy();
+            EXPECT_LT(std::chrono::steady_clock::now() - end, SOON);
+        }
+    }
+    PlayerHandle good;
+    EXPECT_EQ(0, good.play(recording(1, false)));
+    EXPECT_TRUE(runUntil([&] { return good.completed == 1; }));
+}
+
+TEST_F(PlayerTest, AHangingSoundServerHoldsNobody)
+{
+    const std::string file = recording(20, false);
+    for (const bool isPlaying : {false, true}) {
+        SCOPED_TRACE(isPlaying);
+        PlayerHandle player;
+        if (isPlaying) {
+            ASSERT_EQ(0, player.play(file));
+            EXPECT_TRUE(runUntil([&] { return player.position() > 100; }));
+        }
+        server.signal(SIGSTOP);
+        const auto begin = std::chrono::steady_clock::now();
+        (void)(isPlaying ? player_pause(player.handle) : player.play(file));
+        (void)player.position();
+        player.destroy();
+        EXPECT_LT(std::chrono::steady_clock::now() - begin, 2 * SOON);
+        server.signal(SIGCONT);
+    }
+    PlayerHandle later;
+    EXPECT_TRUE(runUntil([&] { return later.play(file) == 0; }));
+    EXPECT_TRUE(runUntil([&] { return later.position() > 100; }));
 }
 
 TEST_F(PlayerTest, StepsOverADamagedStretch)
