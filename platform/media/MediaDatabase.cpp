@@ -1,10 +1,16 @@
 #include "media/MediaDatabase.h"
 
+#include "media/DatabaseSalvage.h"
+
 #include <dlog.h>
+
+#include <sys/stat.h>
+#include <unistd.h>
 
 #include <cstdio>
 #include <ctime>
 #include <filesystem>
+#include <iterator>
 #include <utility>
 
 namespace media {
@@ -42,11 +48,37 @@ CREATE TRIGGER IF NOT EXISTS waveform_bound AFTER INSERT ON waveform BEGIN
   DELETE FROM waveform WHERE WAVEFORM_ID <= NEW.WAVEFORM_ID - 1500; END;
 )";
 
+    // What brings a database from one version (PRAGMA user_version) to the next, without losing a row.
+    constexpr const char* MIGRATIONS[] = {SCHEMA, WAVEFORM_SCHEMA};
+    constexpr int VERSION = std::size(MIGRATIONS);
+
     constexpr auto MEDIA_COLUMNS
         = "MEDIA_ID, MEDIA_PATH, MEDIA_DISPLAY_NAME, MEDIA_MIME_TYPE, MEDIA_MODE, MEDIA_STORAGE, "
           "MEDIA_SIZE, MEDIA_ADDED_TIME, MEDIA_MODIFIED_TIME, MEDIA_TIMELINE, MEDIA_DURATION";
 
     bool isDamage(int code) { return (code & 0xff) == SQLITE_CORRUPT || (code & 0xff) == SQLITE_NOTADB; }
+
+    // Anything but a file, and but nothing at all: opening some of it would wait for ever.
+    bool isSomethingElse(const std::string& path)
+    {
+        struct stat status { };
+        if (::lstat(path.c_str(), &status) != 0)
+            return false;
+        return ::stat(path.c_str(), &status) != 0 || !S_ISREG(status.st_mode);
+    }
+
+    bool exists(const std::string& path)
+    {
+        struct stat status { };
+        return ::lstat(path.c_str(), &status) == 0;
+    }
+
+    // A file without a byte, which SQLite takes for a new one.
+    bool isEmptied(const std::string& path)
+    {
+        struct stat status { };
+        return ::stat(path.c_str(), &status) == 0 && S_ISREG(status.st_mode) && status.st_size == 0;
+    }
 
     std::string tailOf(const Query& query)
     {
@@ -148,16 +180,21 @@ int Database::open()
         return SQLITE_OK;
     std::error_code ignored;
     std::filesystem::create_directories(std::filesystem::path(_path).parent_path(), ignored);
+    const bool isLost = isEmptied(_path) || (!exists(_path) && exists(_copyPath()));
     int result = _openOnce();
     if (isDamage(result)) {
-        _setAside();
-        result = _openOnce();
+        result = _replace();
+    } else if (result == SQLITE_OK && isLost) {
+        _replaced = true;
+        _restore({});
     }
     return result;
 }
 
 int Database::_openOnce()
 {
+    if (isSomethingElse(_path))
+        return SQLITE_NOTADB;
     int result = sqlite3_open_v2(
         _path.c_str(), &_db, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE | SQLITE_OPEN_FULLMUTEX, nullptr);
     if (result == SQLITE_OK) {
@@ -168,9 +205,9 @@ int Database::_openOnce()
             nullptr, nullptr);
     }
     if (result == SQLITE_OK)
-        result = sqlite3_exec(_db, SCHEMA, nullptr, nullptr, nullptr);
+        result = _migrate();
     if (result == SQLITE_OK)
-        result = sqlite3_exec(_db, WAVEFORM_SCHEMA, nullptr, nullptr, nullptr);
+        result = _checkTables();
     if (result != SQLITE_OK) {
         __dlog_print(LOG_ID_MAIN, DLOG_ERROR, "MEWLO", "media database cannot be opened: %s", sqlite3_errstr(result));
         _close();
@@ -184,14 +221,106 @@ void Database::_close()
     _db = nullptr;
 }
 
-void Database::_setAside()
+int Database::_migrate()
+{
+    const auto version = [this] {
+        Statement statement(_db, "PRAGMA user_version");
+        return statement.step() ? static_cast<int>(statement.number(0)) : -1;
+    };
+    if (version() == VERSION)
+        return SQLITE_OK;
+    // Another process may be at it as well: what counts is the version under the lock.
+    int result = sqlite3_exec(_db, "BEGIN IMMEDIATE", nullptr, nullptr, nullptr);
+    if (result != SQLITE_OK)
+        return result;
+    int known = version();
+    // A later version of this program, or somebody else's database.
+    if (known < 0 || known > VERSION)
+        result = SQLITE_NOTADB;
+    for (; result == SQLITE_OK && known < VERSION; ++known) {
+        result = sqlite3_exec(_db, MIGRATIONS[known], nullptr, nullptr, nullptr);
+        // Tables of that name which are not ours.
+        if (result == SQLITE_ERROR)
+            result = SQLITE_NOTADB;
+    }
+    if (result == SQLITE_OK)
+        result
+            = sqlite3_exec(_db, ("PRAGMA user_version=" + std::to_string(VERSION)).c_str(), nullptr, nullptr, nullptr);
+    const int end = sqlite3_exec(_db, result == SQLITE_OK ? "COMMIT" : "ROLLBACK", nullptr, nullptr, nullptr);
+    return result != SQLITE_OK ? result : end;
+}
+
+// Whether the tables are ours, with every column.
+int Database::_checkTables()
+{
+    const std::string media = std::string("SELECT ") + MEDIA_COLUMNS + " FROM media LIMIT 0";
+    for (const std::string& sql :
+        {media, std::string("SELECT BOOKMARK_ID, MEDIA_ID, BOOKMARK_MARKED_TIME, BOOKMARK_NAME FROM bookmark LIMIT 0"),
+            std::string("SELECT WAVEFORM_PATH, WAVEFORM_SAMPLES FROM waveform LIMIT 0")}) {
+        const int result = Statement(_db, sql).run();
+        if (result != SQLITE_OK)
+            return result == SQLITE_ERROR ? SQLITE_NOTADB : result;
+    }
+    return SQLITE_OK;
+}
+
+// A new database in the place of the damaged one, with what is left of it.
+int Database::_replace()
+{
+    const std::string aside = _setAside();
+    const int result = _openOnce();
+    if (result == SQLITE_OK)
+        _restore(aside);
+    return result;
+}
+
+std::string Database::_setAside()
 {
     _close();
-    const std::string aside = _path + ".damaged-" + std::to_string(std::time(nullptr));
+    std::string aside = _path + ".damaged-" + std::to_string(std::time(nullptr));
     for (const char* suffix : {"", "-wal", "-shm"})
         std::rename((_path + suffix).c_str(), (aside + suffix).c_str());
     _replaced = true;
     __dlog_print(LOG_ID_MAIN, DLOG_ERROR, "MEWLO", "the media database is damaged and was set aside");
+    return aside;
+}
+
+void Database::_restore(const std::string& aside)
+{
+    Salvage salvage = salvageDatabase(aside);
+    if (!salvage.isComplete)
+        salvage.fillFrom(salvageDatabase(_copyPath()));
+    __dlog_print(LOG_ID_MAIN, DLOG_WARN, "MEWLO", "salvaged %zu rows and %zu bookmarks", salvage.rows.size(),
+        salvage.bookmarks.size());
+    sqlite3_exec(_db, "BEGIN IMMEDIATE", nullptr, nullptr, nullptr);
+    // One by one: a row that does not fit keeps no other out.
+    for (MediaRow& row : salvage.rows) {
+        if (const std::string id = row.id; _putRow(row) == SQLITE_OK && id != row.id)
+            row.id = id;
+    }
+    for (const auto& [id, bookmark] : salvage.bookmarks)
+        _insertBookmark(id, bookmark.markedTime, bookmark.name);
+    sqlite3_exec(_db, "COMMIT", nullptr, nullptr, nullptr);
+}
+
+void Database::keepCopy()
+{
+    const std::lock_guard lock(_mutex);
+    struct stat status { };
+    if (_db == nullptr || (!_isChanged && ::stat(_copyPath().c_str(), &status) == 0))
+        return;
+    // Only what is sound itself replaces a good copy.
+    {
+        Statement check(_db, "PRAGMA quick_check(1)");
+        if (!check.step() || check.text(0) != "ok")
+            return;
+    }
+    const std::string fresh = _copyPath() + ".new";
+    ::unlink(fresh.c_str());
+    if (Statement(_db, "VACUUM INTO ?").bind(fresh).run() != SQLITE_OK)
+        return;
+    if (::chmod(fresh.c_str(), 0600) == 0 && std::rename(fresh.c_str(), _copyPath().c_str()) == 0)
+        _isChanged = false;
 }
 
 bool Database::takeReplaced()
@@ -210,8 +339,7 @@ int Database::_guarded(const Work& work)
     }
     int result = work();
     if (isDamage(result)) {
-        _setAside();
-        result = _openOnce();
+        result = _replace();
         if (result == SQLITE_OK)
             result = work();
     }
@@ -228,6 +356,7 @@ int Database::_transaction(const Work& work)
         const int end = sqlite3_exec(_db, result == SQLITE_OK ? "COMMIT" : "ROLLBACK", nullptr, nullptr, nullptr);
         if (result == SQLITE_OK && end != SQLITE_OK)
             sqlite3_exec(_db, "ROLLBACK", nullptr, nullptr, nullptr);
+        _isChanged = _isChanged || (result == SQLITE_OK && end == SQLITE_OK);
         return result != SQLITE_OK ? result : end;
     });
 }

@@ -55,8 +55,9 @@ struct FileChanges {
     std::vector<std::string> removed;
 };
 
-// The SQLite file behind the media content interface: one connection, shared by all threads under a lock. A damaged
-// file is set aside and replaced by an empty one; the caller fills it again from the recordings.
+// The SQLite file behind the media content interface: one connection, shared by all threads under a lock. Whatever else
+// is in its place (damage, another program's database, a folder) is set aside, and a new one gets what can be salvaged
+// of it and of the last good copy beside it; the caller then compares it with the recordings.
 class Database {
 public:
     explicit Database(std::string path);
@@ -66,6 +67,8 @@ public:
 
     // 0, or SQLite's code. Creates the file and its folder as needed.
     int open();
+    // Renews the good copy when something was changed since; for a quiet moment.
+    void keepCopy();
     [[nodiscard]] const std::string& path() const { return _path; }
     // Whether a damaged file was replaced since the last call.
     bool takeReplaced();
@@ -106,12 +109,18 @@ private:
     int _moveRow(const std::string& formerPath, const MediaRow& row);
     int _removePath(const std::string& path);
     int _insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name);
-    void _setAside();
+    int _migrate();
+    int _checkTables();
+    int _replace();
+    std::string _setAside();
+    void _restore(const std::string& aside);
+    [[nodiscard]] std::string _copyPath() const { return _path + ".good"; }
     void _close();
 
     std::string _path;
     sqlite3* _db = nullptr;
     bool _replaced = false;
+    bool _isChanged = false; // since the good copy
     std::recursive_mutex _mutex;
 };
 

@@ -52,6 +52,7 @@ struct Connection {
         stopWatching();
         if (opener.joinable())
             opener.join();
+        database.keepCopy();
     }
     Connection(const Connection&) = delete;
     Connection& operator=(const Connection&) = delete;
@@ -216,6 +217,7 @@ void openNow(Connection& held)
     held.database.open();
     if (held.database.takeReplaced())
         refill(held);
+    held.database.keepCopy();
 }
 
 // From now on what other programs do to the files arrives by itself.

@@ -1,9 +1,11 @@
 #include <gtest/gtest.h>
 #include <media_content.h>
 
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <functional>
 #include <thread>
 
 #include "support/DatabaseRows.h"
@@ -189,6 +191,89 @@ TEST_F(MediaDatabaseTest, DamageFoundInTheMiddleIsRepairedToo)
     ASSERT_EQ(0, media_content_connect());
     EXPECT_NE("", addRecording("new.m4a"));
     EXPECT_EQ(201u, names().size());
+}
+
+// Damage of every kind, and whatever else may be found in the place of the database: the bookmarks are there
+// afterwards, from what can still be read or from the good copy.
+TEST_F(MediaDatabaseTest, BookmarksSurviveWhateverHappensToTheDatabase)
+{
+    constexpr int RECORDINGS = 60;
+    constexpr int MARKS = 4;
+    const std::string path = _directory.file("media.db");
+    for (int i = 0; i < RECORDINGS; ++i) {
+        const std::string id = addRecording("r" + std::to_string(100 + i) + ".m4a");
+        for (unsigned int mark = 0; mark < MARKS; ++mark)
+            media_bookmark_insert_to_db(id.c_str(), mark * 10, ("a bookmark " + std::to_string(mark)).c_str());
+    }
+    media_content_disconnect();
+    const std::string good = support::readFile(path);
+    const std::string copy = support::readFile(path + ".good");
+    ASSERT_GT(good.size(), 20000u);
+    ASSERT_FALSE(copy.empty());
+
+    struct Case {
+        std::string what;
+        std::function<void()> damage;
+        bool needsCopy;
+    };
+    std::vector<Case> cases;
+    const auto write = [&](const std::string& content) { return [=] { support::writeFile(path, content); }; };
+    const auto change = [&](const char* sql) { return [=] { EXPECT_TRUE(support::execute(sql)); }; };
+    for (size_t size = 0; size < good.size(); size += good.size() / 9 + 1)
+        cases.push_back({"cut to " + std::to_string(size), write(good.substr(0, size)), true});
+    for (size_t page = 0; page * 4096 < good.size(); ++page) {
+        std::string zeroed = good;
+        zeroed.replace(page * 4096, 4096, std::string(4096, '\0'));
+        cases.push_back({"zeroed page " + std::to_string(page), write(zeroed), true});
+    }
+    unsigned int seed = 5;
+    for (int i = 0; i < 60; ++i) {
+        seed = seed * 1103515245 + 12345;
+        std::string flipped = good;
+        flipped[(seed >> 4) % flipped.size()] ^= static_cast<char>(1 << (seed >> 29));
+        cases.push_back({"flipped bit " + std::to_string((seed >> 4) % flipped.size()), write(flipped), false});
+    }
+    cases.push_back({"no column", change("ALTER TABLE media DROP COLUMN MEDIA_STORAGE"), false});
+    cases.push_back({"a later version", change("PRAGMA user_version=99"), false});
+    cases.push_back({"before there were versions", change("PRAGMA user_version=0; DROP TABLE waveform"), false});
+    cases.push_back({"another program's", change("DROP TABLE media; CREATE TABLE media(x)"), true});
+    cases.push_back({"a folder", [=] { std::filesystem::create_directory(path); }, true});
+    cases.push_back({"a pipe", [=] { ASSERT_EQ(0, ::mkfifo(path.c_str(), 0600)); }, true});
+    cases.push_back({"a link to nowhere", [=] { std::filesystem::create_symlink("/nowhere/at.all", path); }, true});
+
+    for (const bool hasCopy : {true, false}) {
+        int kept = 0;
+        for (const Case& each : cases) {
+            SCOPED_TRACE(each.what + (hasCopy ? "" : ", without a copy"));
+            for (const auto& entry : std::filesystem::directory_iterator(_directory.path()))
+                std::filesystem::remove_all(entry);
+            support::writeFile(path, good);
+            const bool isOther = each.what.starts_with("a folder") || each.what.starts_with("a pipe")
+                || each.what.starts_with("a link");
+            if (isOther)
+                std::filesystem::remove(path);
+            if (hasCopy)
+                support::writeFile(path + ".good", copy);
+            each.damage();
+            ASSERT_EQ(0, media_content_connect());
+            EXPECT_EQ(static_cast<size_t>(RECORDINGS), names().size());
+            int marks = 0;
+            for (const std::string& id : names("1", media_info_get_media_id))
+                marks += bookmarksOf(id);
+            // One flipped bit may spoil the row that it is in.
+            const int least = hasCopy || !each.needsCopy ? RECORDINGS * MARKS - MARKS : 0;
+            EXPECT_GE(marks, least);
+            EXPECT_LE(marks, RECORDINGS * MARKS + 1);
+            kept += marks;
+            EXPECT_NE("", addRecording("r100.m4a", "changed")) << "it can be written to";
+            support::writeFile(recordingPath("r100.m4a"), "x");
+            media_content_disconnect();
+            if (HasFailure())
+                break;
+        }
+        EXPECT_GT(kept, static_cast<int>(cases.size()) * RECORDINGS * MARKS * (hasCopy ? 98 : 70) / 100);
+    }
+    media_content_connect();
 }
 
 // Run by the test below in a process of its own.
