@@ -13,6 +13,7 @@
 #include "MwHandle.h"
 #include "MwLog.h"
 #include "MwMediaRow.h"
+#include "MwMoveRecord.h"
 #include "MwStagedFile.h"
 
 namespace {
@@ -102,6 +103,10 @@ MwFileMover::Outcome MwFileMover::_stageAndPublish(const std::string& source, Pl
     for (;;) {
         FilesLock lock;
         MW_CALL(media_content_lock_files, lock.out());
+        // From here to the end of the source the recording is there twice.
+        std::optional<MwMoveRecord> record;
+        if (staged.leavesSource())
+            record.emplace(source, staged.getPath(), place.path);
         const auto published = staged.publish(place.path, place.replace);
         if (published == MwStagedFile::Outcome::FAILED)
             return Outcome::FAILED;
@@ -109,6 +114,7 @@ MwFileMover::Outcome MwFileMover::_stageAndPublish(const std::string& source, Pl
             destination = place.path;
             return _moveRow(source, place, staged.leavesSource()) ? Outcome::MOVED : Outcome::FAILED;
         }
+        record.reset();
         lock.close(); // somebody took the name meanwhile, and the user may think about it for long
         auto other = _choosePlace(source, true);
         if (!other)

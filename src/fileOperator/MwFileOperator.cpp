@@ -9,6 +9,7 @@
 #include "MwFileDeleter.h"
 #include "MwFilePlaces.h"
 #include "MwLog.h"
+#include "MwMoveRecord.h"
 #include "MwStagedFile.h"
 #include "MwStorageRoots.h"
 
@@ -171,6 +172,7 @@ void MwFileOperator::_moveFiles()
     const std::string directory
         = MwFilePlaces::directoryBelow(_type == MOVE_TO_PRIVATE ? mwPrivateRoot() : mwDeviceRoot());
     MwStagedFile::sweep(directory);
+    MwMoveRecord::recover(directory);
     MwFileMover mover(
         directory, _totalBytes, _cancelRequested, [this](const std::string& path) { return _ask(path); },
         [this](uint64_t bytes) { _report(bytes); });

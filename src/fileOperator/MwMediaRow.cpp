@@ -25,6 +25,14 @@ bool moveCb(media_info_h media, void* userData)
     return false;
 }
 
+bool takeIdCb(media_info_h media, void* userData)
+{
+    char* id = nullptr;
+    if (MW_CALL(media_info_get_media_id, media, &id))
+        *static_cast<std::string*>(userData) = mwAdopt(id);
+    return false;
+}
+
 bool select(Filter& filter, const std::string& path)
 {
     if (const int result = media_filter_create(filter.out()); result != 0) {
@@ -60,6 +68,15 @@ Move move(const std::string& from, const std::string& to)
         return Move::FAILED;
     }
     return moving.outcome;
+}
+
+std::string idAt(const std::string& path)
+{
+    Filter filter;
+    std::string id;
+    if (select(filter, path))
+        MW_CALL(media_info_foreach_media_from_db, filter.get(), takeIdCb, &id);
+    return id;
 }
 
 bool remove(const std::vector<std::string>& mediaIds)

@@ -25,6 +25,8 @@ public:
     // Gives it its name, and flushes that. Without replacing, a taken name is answered; replacing is one step, so that
     // either the old or the new file is there at any time.
     [[nodiscard]] Outcome publish(const std::string& destination, bool replace);
+    // Its hidden name; empty when there is none.
+    [[nodiscard]] const std::string& getPath() const { return _path; }
     // Whether the source is still there after publishing, to be removed.
     [[nodiscard]] bool leavesSource() const { return _kind != Kind::SOURCE_ITSELF; }
 

@@ -199,6 +199,8 @@ bool MwTrimStore::_publish(Content& content)
 bool MwTrimStore::_addFile(Content& content)
 {
     const std::string directory = directoryOf(_source);
+    if (_source.rfind('.') == std::string::npos)
+        MW_LOGE("can not find extension");
     for (;;) {
         _output = _name.empty() ? MwFilePlaces::freePath(_source, directory) : directory + "/" + _name;
         content.name = _output.substr(directory.size() + 1);

@@ -12,6 +12,7 @@
 #include "MwHandle.h"
 #include "MwLog.h"
 #include "MwModel.h"
+#include "MwMoveRecord.h"
 #include "MwRecordingNotes.h"
 #include "MwSavedBookmarks.h"
 #include "MwStagedFile.h"
@@ -120,6 +121,14 @@ void catalogueWaitingNotes(const std::string& directory)
     }
 }
 
+// Moves and trims that a crash has cut off.
+void finishInterrupted(const std::string& directory)
+{
+    MwStagedFile::sweep(directory);
+    MwMoveRecord::recover(directory);
+    MwTrimStore::recover(directory);
+}
+
 std::string tellRescued(const std::vector<std::string>& names)
 {
     std::string text = mwTranslate("IDS_MW_TPOP_RECORDING_RESCUED_PS");
@@ -158,11 +167,9 @@ std::vector<std::string> MwRecordingRescue::run(MwModel& model)
         if (const int found = recorder_rescue_leftovers(temporary.c_str(), leftoverCb, &work); found < 0)
             MW_LOGE("recorder_rescue_leftovers failed : [%d]!!!", found);
         catalogueWaitingNotes(directoryOf(root));
-        MwStagedFile::sweep(directoryOf(root));
-        MwTrimStore::recover(directoryOf(root));
+        finishInterrupted(directoryOf(root));
     }
-    MwStagedFile::sweep(directoryOf(mwPrivateRoot()));
-    MwTrimStore::recover(directoryOf(mwPrivateRoot()));
+    finishInterrupted(directoryOf(mwPrivateRoot()));
     MW_CALL(media_content_scan_all);
     if (!work.rescued.empty())
         notification_status_message_post(tellRescued(work.rescued).c_str());

@@ -1,14 +1,13 @@
 #include "MwTrim.h"
 
 #include <Ecore.h>
-#include <media_content.h>
 #include <video_edit.h>
 
 #include <initializer_list>
 #include <utility>
 
-#include "MwHandle.h"
 #include "MwLog.h"
+#include "MwMediaRow.h"
 #include "MwSavedBookmarks.h"
 #include "MwText.h"
 
@@ -33,14 +32,6 @@ MwTrim::Failure failureOf(int error)
     default:
         return MwTrim::Failure::OTHER;
     }
-}
-
-bool takeIdCb(media_info_h media, void* userData)
-{
-    char* id = nullptr;
-    if (MW_CALL(media_info_get_media_id, media, &id))
-        *static_cast<std::string*>(userData) = mwAdopt(id);
-    return false;
 }
 
 void logBookmarkFailure(const char* call, int code) { MW_LOGE("%s failed : [%d]!!!", call, code); }
@@ -132,7 +123,7 @@ bool MwTrim::_execute(int command)
 {
     switch (command) {
     case CMD_INIT:
-        return _initEngine() || _fail("_initEngine");
+        return _initEngine() || _fail("_initEngine failed!!!");
     case CMD_DEINIT:
         _deinitEngine();
         _isFinished = true;
@@ -141,7 +132,7 @@ bool MwTrim::_execute(int command)
         if (_prepareEngine())
             return true;
         _deinitEngine();
-        return _fail("_prepareEngine");
+        return _fail("_prepareEngine failed!!!");
     case CMD_UNPREPARE:
         _unprepareEngine();
         return true;
@@ -150,7 +141,7 @@ bool MwTrim::_execute(int command)
             return true;
         _unprepareEngine();
         _deinitEngine();
-        return _fail("_exportEngine");
+        return _fail("_exportEngine failed!!!");
     case CMD_CANCEL:
         _cancelEngine();
         _deinitEngine();
@@ -164,7 +155,7 @@ bool MwTrim::_execute(int command)
 
 bool MwTrim::_fail(const char* what)
 {
-    MW_LOGE("%s failed!!!", what);
+    MW_LOGE("%s", what);
     _end(TRIM_EVENT_FAILED, _failure == Failure::NONE ? Failure::OTHER : _failure.load());
     return false;
 }
@@ -279,13 +270,8 @@ bool MwTrim::_getMediaInfo(const std::string& path, std::vector<MwBookmark>* boo
                                        : "mediaId is nullptr!!!");
         return false;
     }
-    MwHandle<filter_h, media_filter_destroy> filter;
-    // Exactly this path: the column itself does not tell capital letters from small ones.
-    const std::string condition = "MEDIA_PATH = \"" + mwAdopt(media_content_escape(path.c_str())) + "\" COLLATE BINARY";
-    if (!MW_CALL(media_filter_create, filter.out())
-        || !MW_CALL(media_filter_set_condition, filter.get(), condition.c_str(), MEDIA_CONTENT_COLLATE_NOCASE)
-        || !MW_CALL(media_filter_set_offset, filter.get(), 0, 1)
-        || !MW_CALL(media_info_foreach_media_from_db, filter.get(), takeIdCb, mediaId) || mediaId->empty())
+    *mediaId = MwMediaRow::idAt(path);
+    if (mediaId->empty())
         return false;
     for (MwSavedBookmark& bookmark : mwReadBookmarks(*mediaId, logBookmarkFailure)) {
         MwBookmark copy;

@@ -15,8 +15,10 @@
 #include <unistd.h>
 
 #include "MwMediaRow.h"
+#include "MwMoveRecord.h"
 #include "MwStagedFile.h"
 #include "MwStorageRoots.h"
+#include "support/FaultyCalls.h"
 #include "support/Recordings.h"
 #include "support/RunUntil.h"
 
@@ -289,14 +291,74 @@ TEST_F(FileOperatorTest, KilledAtAnyTimeEveryFileIsWholeAndKeepsItsBookmark)
     EXPECT_GT(killed, 3);
     media_content_connect();
     MwStagedFile::sweep(privateDirectory());
+    MwMoveRecord::recover(privateDirectory());
     media_content_scan_all();
     Files all = filesIn(privateDirectory());
-    all.merge(filesIn(support::recordingsDirectory()));
-    EXPECT_EQ(ids.size(), all.size());
+    Files stayed = filesIn(support::recordingsDirectory());
+    EXPECT_EQ(ids.size(), all.size() + stayed.size()) << "none is there twice";
+    all.merge(stayed);
     for (const auto& [name, id] : ids) {
         EXPECT_EQ(name, all[name]);
         EXPECT_EQ(1, bookmarksOf(id)) << name;
     }
+}
+
+// Killed before each call that changes a file or the database, in both ways of moving: there is one recording
+// afterwards, with its bookmark.
+TEST_F(FileOperatorTest, AKilledMoveLeavesOneRecordingNotTwo)
+{
+#ifdef __SANITIZE_THREAD__
+    GTEST_SKIP() << "the thread sanitizer ends forked children that start threads";
+#endif
+    std::string elsewhere = "/dev/shm/mewlo-test-XXXXXX";
+    ASSERT_NE(nullptr, ::mkdtemp(elsewhere.data()));
+    for (const std::string& directory : {privateDirectory(), elsewhere}) {
+        bool isKilled = true;
+        int point = 0;
+        while (isKilled) {
+            SCOPED_TRACE(directory + ", call " + std::to_string(++point));
+            fs::remove_all(directory);
+            fs::remove_all(support::recordingsDirectory());
+            fs::create_directories(directory);
+            const std::string id = support::addRecording("a.m4a", "content");
+            media_bookmark_insert_to_db(id.c_str(), 1, "Bookmark 1");
+            media_content_disconnect();
+            const pid_t child = ::fork();
+            if (child == 0) {
+                media_content_connect();
+                support::faults::arm("/", point, support::faults::Effect::KILL);
+                const std::atomic<bool> cancelled = false;
+                std::string destination;
+                MwFileMover mover(
+                    directory, 7, cancelled, [](const std::string&) { return MwClashAction::CANCEL; }, [](uint64_t) {});
+                (void)mover.move(recordingPath("a.m4a"), destination);
+                ::_exit(0);
+            }
+            int status = 0;
+            ::waitpid(child, &status, 0);
+            isKilled = WIFSIGNALED(status);
+            media_content_connect();
+            // What the next start does; somebody may have looked at the folders before.
+            if (point % 2 == 0)
+                media_content_scan_all();
+            MwStagedFile::sweep(directory);
+            MwMoveRecord::recover(directory);
+            media_content_scan_all();
+            const Files there = filesIn(directory);
+            const Files here = filesIn(support::recordingsDirectory());
+            EXPECT_EQ(1U, there.size() + here.size());
+            EXPECT_EQ("content", (there.empty() ? here : there).at("a.m4a"));
+            int marks = 0;
+            for (const auto& [path, row] : rows())
+                marks += bookmarksOf(row);
+            EXPECT_EQ(1, marks);
+            media_info_delete_from_db(id.c_str());
+            if (HasFailure())
+                break;
+        }
+        EXPECT_GT(point, 5);
+    }
+    fs::remove_all(elsewhere);
 }
 
 TEST_F(FileOperatorTest, InterruptedMoveIsEndedByTheNextOne)
