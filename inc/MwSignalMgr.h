@@ -21,6 +21,7 @@ public:
         POWER_STATE_CHANGED,
         THEME_CHANGED,
         CALL_REJECT_CHANGED,
+        MICROPHONE_BACK,
     };
 
     static MwSignalMgr* getInstance();

@@ -25,7 +25,7 @@ namespace {
     // Keyboards have one key for play and pause; it bears the name of play.
     constexpr Named KEYBOARD[] = {{"Play", MEDIA_KEY_PLAYPAUSE}, {"Pause", MEDIA_KEY_PAUSE}, {"Stop", MEDIA_KEY_STOP},
         {"Next", MEDIA_KEY_NEXT}, {"Prev", MEDIA_KEY_PREVIOUS}, {"Forward", MEDIA_KEY_FASTFORWARD},
-        {"Rewind", MEDIA_KEY_REWIND}, {"Media", MEDIA_KEY_MEDIA}};
+        {"Rewind", MEDIA_KEY_REWIND}, {"Media", MEDIA_KEY_MEDIA}, {"Record", MEDIA_KEY_RECORD}};
 
     template <size_t Count>
     std::optional<media_key_e> keyNamed(const Named (&table)[Count], const std::string& name)
@@ -125,6 +125,7 @@ host::Mpris::State RemoteControl::_recorderState(int recorder) const
     state.status = recorder == RECORDING ? "Playing" : "Paused";
     state.title = stateTree().read(KEY_TITLE).value_or("");
     state.canSkip = false;
+    state.hasPosition = _playback.position != nullptr;
     return state;
 }
 
@@ -142,6 +143,7 @@ host::Mpris::State RemoteControl::_playerState() const
     state.title = track.title;
     state.length = track.duration;
     state.canSeek = true;
+    state.hasPosition = true;
     return state;
 }
 

@@ -42,6 +42,12 @@ namespace {
             sink(VCONFKEY_SYSMAN_EARJACK, now.isHeadsetPlugged ? "1" : "0");
     }
 
+    void reportMicrophone(const host::PulseSnapshot& before, const host::PulseSnapshot& now)
+    {
+        if (before.microphones.empty() != now.microphones.empty())
+            sink(VCONFKEY_MEWLO_MICROPHONE, now.microphones.empty() ? "0" : "1");
+    }
+
     // State keys end with the session; this fact does not.
     void tellPrivateStorage()
     {
@@ -67,6 +73,8 @@ namespace {
                 tellPrivateStorage();
             if (isWanted("earjack"))
                 _earjackListener = host::PulseWatch::instance().addListener(reportEarjack);
+            if (isWanted("microphone"))
+                _microphoneListener = host::PulseWatch::instance().addListener(reportMicrophone);
             _recorderWatch = stateTree().watch(KEY_RECORDER_STATE, [this](const std::string&) { _updateBusy(); });
             _lockWatch = stateTree().watch(VCONFKEY_IDLE_LOCK_STATE, [this](const std::string&) { _lockChanged(); });
         }
@@ -74,8 +82,9 @@ namespace {
         {
             stateTree().unwatch(_recorderWatch);
             stateTree().unwatch(_lockWatch);
-            if (_earjackListener != 0)
-                host::PulseWatch::instance().removeListener(_earjackListener);
+            for (const int listener : {_earjackListener, _microphoneListener})
+                if (listener != 0)
+                    host::PulseWatch::instance().removeListener(listener);
         }
         HostWatchers(const HostWatchers&) = delete;
         HostWatchers& operator=(const HostWatchers&) = delete;
@@ -121,6 +130,7 @@ namespace {
         host::LocaleWatch _locale{sink};
         host::DisplayWatch _display{sink};
         int _earjackListener = 0;
+        int _microphoneListener = 0;
         KeyTree::WatchId _recorderWatch = 0;
         KeyTree::WatchId _lockWatch = 0;
     };

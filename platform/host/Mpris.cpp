@@ -96,7 +96,7 @@ namespace {
     int readPosition(sd_bus*, const char*, const char*, const char*, sd_bus_message* reply, void* self, sd_bus_error*)
     {
         const auto* mpris = static_cast<const Mpris*>(self);
-        const int position = mpris->state().canSeek ? mpris->handlers().position() : 0;
+        const int position = mpris->state().hasPosition ? mpris->handlers().position() : 0;
         return sd_bus_message_append(reply, "x", position * MICROSECONDS);
     }
 

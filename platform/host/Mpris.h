@@ -18,6 +18,7 @@ public:
         int length = 0; // milliseconds, 0 when unknown
         bool canSkip = true; // to the next and the previous one
         bool canSeek = false;
+        bool hasPosition = false;
         bool operator==(const State&) const = default;
     };
     struct Handlers {

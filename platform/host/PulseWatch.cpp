@@ -107,6 +107,8 @@ struct PulseWatch::Query {
     }
     void note(const pa_source_info& info)
     {
+        if (info.monitor_of_sink == PA_INVALID_INDEX)
+            found.microphones.insert(info.name);
         if (defaultSource == info.name)
             found.isHeadsetIn = isHeadsetInUse(info);
     }

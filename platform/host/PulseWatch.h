@@ -6,6 +6,7 @@
 #include <map>
 #include <memory>
 #include <mutex>
+#include <set>
 #include <string>
 
 struct pa_threaded_mainloop;
@@ -24,6 +25,7 @@ struct PulseSnapshot {
     bool isHeadsetIn = false;
     bool isHeadsetPlugged = false;
     std::string defaultSink;
+    std::set<std::string> microphones; // names of the sources that are no monitor of an output
 
     bool operator==(const PulseSnapshot&) const = default;
 };

@@ -11,7 +11,7 @@ namespace {
 
     constexpr std::string_view PREFIX = "XF86Audio";
     constexpr const char* KEYS[] = {"XF86AudioPlay", "XF86AudioStop", "XF86AudioPause", "XF86AudioPrev",
-        "XF86AudioNext", "XF86AudioForward", "XF86AudioRewind", "XF86AudioMedia"};
+        "XF86AudioNext", "XF86AudioForward", "XF86AudioRewind", "XF86AudioMedia", "XF86AudioRecord"};
 
 }
 

@@ -12,6 +12,7 @@ enum media_key_e {
     MEDIA_KEY_REWIND = 6,
     MEDIA_KEY_PLAYPAUSE = 7,
     MEDIA_KEY_MEDIA = 8,
+    MEDIA_KEY_RECORD = 9,
 };
 enum media_key_event_e { MEDIA_KEY_STATUS_PRESSED = 0, MEDIA_KEY_STATUS_RELEASED = 1 };
 typedef void (*media_key_event_cb)(media_key_e key, media_key_event_e status, void* user_data);

@@ -1,5 +1,6 @@
 // What remote controls (MPRIS) show of playback beside its state, and their wish to go to another place. While nothing
-// is played, or a recording runs, the callbacks are not asked. Main loop, except remote_player_seeked. Milliseconds.
+// is played the callbacks are not asked, and while a recording runs only the position is: its length so far. Main loop,
+// except remote_player_seeked. Milliseconds.
 #pragma once
 
 typedef struct {

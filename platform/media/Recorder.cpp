@@ -220,6 +220,7 @@ int Recorder::_startOn(std::shared_ptr<Recording> recording)
         _discard();
         return errorFor(recording->trouble());
     }
+    _microphone = _pipeline->microphone();
     _postStatus(0, recording->file().size());
     _isAnnounced = true;
     _setState(RECORDER_STATE_RECORDING);

@@ -95,6 +95,7 @@ private:
     void _inspect(Recording& recording, bool isSecond);
     void _inspectStorage(Recording& recording);
     void _watchMicrophone(const Recording& recording);
+    bool _isOnForeignMonitor();
     void _endInterrupted(const std::shared_ptr<Recording>& recording);
     void _reportEnd(Trouble trouble, recorder_state_e before, int fileError);
     std::shared_ptr<Recording> _current();
@@ -114,6 +115,7 @@ private:
     bool _isEndedByPolicy = false; // the file is complete and waits for a commit, which finds nothing to do
     int _silentTicks = 0;
     uint64_t _samplesAtTick = 0;
+    std::string _microphone; // in use at the last look
 
     std::mutex _keeperMutex; // guards the next three; nothing else is locked under it
     std::condition_variable _keeperWake;

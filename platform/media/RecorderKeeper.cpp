@@ -107,7 +107,7 @@ void Recorder::_inspect(Recording& recording, bool isSecond)
     if (!lock || _state != RECORDER_STATE_RECORDING || _current().get() != &recording)
         return;
     _watchMicrophone(recording);
-    if (_silentTicks >= SILENT_TICKS)
+    if (_silentTicks >= SILENT_TICKS || _isOnForeignMonitor())
         recording.raise(Trouble::DEVICE_LOST);
 }
 
@@ -133,6 +133,17 @@ void Recorder::_watchMicrophone(const Recording& recording)
     const bool isSilent = recording.isCapturing() && samples == _samplesAtTick && !isStorageStalled;
     _silentTicks = isSilent ? _silentTicks + 1 : 0;
     _samplesAtTick = samples;
+}
+
+// A server whose microphone is pulled moves us to what the speakers play. Who moved us cannot be asked; a microphone
+// that is still there was left on purpose.
+bool Recorder::_isOnForeignMonitor()
+{
+    const std::string before = std::exchange(_microphone, _pipeline->microphone());
+    if (_microphone.empty() || _microphone == before)
+        return false;
+    const auto sound = host::PulseWatch::instance().refresh();
+    return sound.isConnected && !sound.microphones.contains(before) && !sound.microphones.contains(_microphone);
 }
 
 void Recorder::_endInterrupted(const std::shared_ptr<Recording>& recording)

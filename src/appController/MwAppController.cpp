@@ -81,6 +81,8 @@ bool MwAppController::initialize(MwModel* model, panekit::WWindowController* win
     _windowController = windowController;
     _lifeCycleListener = MwSignalMgr::getInstance()->getLifeCycleSignal().addListener(
         [this](MwSignalMgr::LifeCycle lifeCycle) { _lifeCycleChanged(lifeCycle); });
+    _systemInfoListener = MwSignalMgr::getInstance()->getSystemInfoSignal().addListener(
+        [this](MwSignalMgr::SystemInfo info) { _systemInfoChanged(info); });
     _initAsyncCmdControl();
     if (!_soundSession)
         _soundSession = std::make_unique<MwSoundSession>();
@@ -127,8 +129,10 @@ void MwAppController::deinitialize()
     _soundSession.reset();
     _avrcp.reset();
     _releaseLock();
-    if (MwSignalMgr* signals = MwSignalMgr::existing(); signals != nullptr)
+    if (MwSignalMgr* signals = MwSignalMgr::existing(); signals != nullptr) {
         mwForget(signals->getLifeCycleSignal(), _lifeCycleListener);
+        mwForget(signals->getSystemInfoSignal(), _systemInfoListener);
+    }
     _playerUpdatedSignal.removeAll();
     _recorderUpdatedSignal.removeAll();
     _mainLoopPipe.close(); // results still on their way are freed; nobody waits for them any more

@@ -119,6 +119,7 @@ private:
     bool _replyWithRecording();
     void _recorderLimitReached(MwRecorder::LimitType type);
     void _recorderInterrupted();
+    void _systemInfoChanged(MwSignalMgr::SystemInfo info);
     void _stoppedByItself(Result result);
     bool _saveRecordingFile();
     bool _checkRecordedFileDir();
@@ -153,6 +154,9 @@ private:
     void _mediaKeyPressed(media_key_e key);
     void _mediaKeyReleased(media_key_e key);
     void _toggleRecording();
+    void _pauseRecordingByKey();
+    void _resumeRecordingByKey();
+    void _stopRecordingByKey();
     void _togglePlaying();
     void _pausePlayingByKey();
     void _resumePlayingByKey();
@@ -185,6 +189,8 @@ private:
     std::unique_ptr<MwAvrcp> _avrcp;
     bool _resumeAfterInterruption = false;
     unsigned int _lifeCycleListener = 0;
+    unsigned int _systemInfoListener = 0;
+    bool _missesMicrophone = false; // the last recording ended without one; main loop
     unsigned int _recorderErrorListener = 0;
     unsigned int _recorderInterruptedListener = 0;
     unsigned int _recorderLimitListener = 0;

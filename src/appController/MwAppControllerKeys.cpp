@@ -67,14 +67,18 @@ void MwAppController::_mediaKeyReleased(media_key_e key)
     switch (key) {
     case MEDIA_KEY_PLAY:
         _resumePlayingByKey();
-        _toggleRecording();
+        _resumeRecordingByKey();
         break;
     case MEDIA_KEY_STOP:
         _pausePlayingByKey();
+        _stopRecordingByKey();
         break;
     case MEDIA_KEY_PAUSE:
         _pausePlayingByKey();
-        _toggleRecording();
+        _pauseRecordingByKey();
+        break;
+    case MEDIA_KEY_RECORD:
+        _resumeRecordingByKey();
         break;
     case MEDIA_KEY_PREVIOUS:
         _playOtherByKey(PLAY_PREVIOUS);
@@ -108,9 +112,29 @@ void MwAppController::_dispatchByKey(Command command, const char* failure)
 void MwAppController::_toggleRecording()
 {
     if (_model->getRecorderState() == MwRecorder::REC_STATE_RECORDING)
+        _pauseRecordingByKey();
+    else
+        _resumeRecordingByKey();
+}
+
+void MwAppController::_pauseRecordingByKey()
+{
+    if (_model->getRecorderState() == MwRecorder::REC_STATE_RECORDING)
         _dispatchByKey(PAUSE_RECORDING, "pause recording failed");
-    else if (_model->getRecorderState() == MwRecorder::REC_STATE_PAUSED)
+}
+
+void MwAppController::_resumeRecordingByKey()
+{
+    if (_model->getRecorderState() == MwRecorder::REC_STATE_PAUSED)
         _dispatchByKey(RESUME_RECORDING, "resume recording failed");
+}
+
+// On the worker: the window does not wait for the save.
+void MwAppController::_stopRecordingByKey()
+{
+    const int state = _model->getRecorderState();
+    if (state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED)
+        _emitSignalAfterStopRecording(false);
 }
 
 void MwAppController::_togglePlaying()

@@ -5,6 +5,7 @@
 #include <media_content.h>
 #include <notification.h>
 #include <recorder_leftover.h>
+#include <vconf.h>
 
 #include <cerrno>
 #include <cstdio>
@@ -382,8 +383,17 @@ void MwAppController::_recorderLimitReached(MwRecorder::LimitType type)
 
 void MwAppController::_recorderInterrupted()
 {
+    int microphone = 1;
+    vconf_get_int(VCONFKEY_MEWLO_MICROPHONE, &microphone);
+    _missesMicrophone = microphone == 0;
     _stopReason = "IDS_MW_TPOP_RECORDING_INTERRUPTED_WHAT_WAS_RECORDED_IS_SAVED";
     _emitSignalAfterStopRecording(true);
+}
+
+void MwAppController::_systemInfoChanged(MwSignalMgr::SystemInfo info)
+{
+    if (info == MwSignalMgr::MICROPHONE_BACK && std::exchange(_missesMicrophone, false))
+        mwPost("IDS_MW_TPOP_A_MICROPHONE_IS_CONNECTED_AGAIN");
 }
 
 void MwAppController::_emitSignalAfterStopRecording(bool interrupted)

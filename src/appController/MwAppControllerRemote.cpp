@@ -15,7 +15,10 @@ bool MwAppController::_remoteTrackCb(remote_player_track_s* track, void* userDat
 
 int MwAppController::_remotePositionCb(void* userData)
 {
-    return static_cast<int>(static_cast<const MwAppController*>(userData)->_model->getCurrentPlayPosition());
+    const MwModel& model = *static_cast<const MwAppController*>(userData)->_model;
+    const int recorder = model.getRecorderState();
+    const bool records = recorder == MwRecorder::REC_STATE_RECORDING || recorder == MwRecorder::REC_STATE_PAUSED;
+    return records ? static_cast<int>(model.getElapsedTime()) : static_cast<int>(model.getCurrentPlayPosition());
 }
 
 void MwAppController::_remoteSeekCb(int position, void* userData)

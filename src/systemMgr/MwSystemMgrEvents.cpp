@@ -34,9 +34,9 @@ struct MwSystemMgr::KeyWatch {
     const char* failure;
 };
 
-const std::array<MwSystemMgr::KeyWatch, 6>& MwSystemMgr::_keyWatches()
+const std::array<MwSystemMgr::KeyWatch, 7>& MwSystemMgr::_keyWatches()
 {
-    static const std::array<KeyWatch, 6> watches = {{
+    static const std::array<KeyWatch, 7> watches = {{
         {VCONFKEY_SYSMAN_MMC_STATUS, _mmcStatusChangedCb,
             "vconf_notify_key_changed(VCONFKEY_SYSMAN_MMC_STATUS) failed"},
         {VCONFKEY_IDLE_LOCK_STATE, _lockscreenStateChangedCb,
@@ -47,6 +47,7 @@ const std::array<MwSystemMgr::KeyWatch, 6>& MwSystemMgr::_keyWatches()
         {VCONFKEY_SYSMAN_EARJACK, _earjackStateChangedCb, "vconf_notify_key_changed(VCONFKEY_SYSMAN_EARJACK) failed"},
         {VCONFKEY_CALL_RECORDING_REJECT, _callRejectStateChangedCb,
             "vconf_notify_key_changed(VCONFKEY_CALL_RECORDING_REJECT) failed"},
+        {VCONFKEY_MEWLO_MICROPHONE, _microphoneChangedCb, "vconf_notify_key_changed(VCONFKEY_MEWLO_MICROPHONE) failed"},
     }};
     return watches;
 }
@@ -148,6 +149,14 @@ void MwSystemMgr::_callRejectStateChangedCb(keynode_t*, void* userData)
         return;
     MW_LOGI("call reject state changed!");
     emitSystemInfo(MwSignalMgr::CALL_REJECT_CHANGED);
+}
+
+void MwSystemMgr::_microphoneChangedCb(keynode_t* node, void* userData)
+{
+    if (selfIsMissing(userData))
+        return;
+    if (vconf_keynode_get_int(node) != 0)
+        emitSystemInfo(MwSignalMgr::MICROPHONE_BACK);
 }
 
 void MwSystemMgr::_mediaDBUpdatedCb(media_content_error_e, int pid, media_content_db_update_item_type_e updateItem,

@@ -64,6 +64,26 @@ TEST_F(RecorderTest, AHangingSoundServerHoldsNeitherFileNorCaller)
     EXPECT_TRUE(runUntil([&] { return recorder_prepare(late.handle) == 0; }));
 }
 
+TEST_F(RecorderTest, AMonitorThatNobodyChoseEndsTheRecording)
+{
+    (void)server.load("module-rescue-streams");
+    RecorderHandle recorder(temporary);
+    ASSERT_EQ(0, recorder.prepareAndStart());
+    ASSERT_TRUE(recorder.recordUntil(300));
+    std::string stream = server.control("list short source-outputs | grep native | cut -f1");
+    stream.resize(stream.find_last_not_of('\n') + 1);
+    for (const char* chosen : {"spk.monitor", "micsrc"}) {
+        EXPECT_EQ("", server.control("move-source-output " + stream + " " + chosen));
+        ASSERT_TRUE(recorder.recordUntil(recorder.told.elapsed.back() + 1500)) << chosen;
+    }
+    EXPECT_TRUE(recorder.told.interruptions.empty()) << "the user's own choice";
+    server.unload("module-remap-source");
+    ASSERT_TRUE(runUntil([&] { return !recorder.told.interruptions.empty(); }, 5));
+    EXPECT_EQ(std::vector{RECORDER_POLICY_DEVICE_LOST}, recorder.told.interruptions);
+    EXPECT_GE(probedDuration(temporary), 3000);
+    EXPECT_TRUE(decodesCleanly(temporary));
+}
+
 TEST_F(SourceTest, ADeletedFolderEndsTheRecordingAndLosesNothing)
 {
     for (const bool isFolder : {false, true}) {

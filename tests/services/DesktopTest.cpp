@@ -155,6 +155,7 @@ TEST_F(MprisTest, ShowsAndMovesThePlaceInARecording)
     EXPECT_TRUE(runUntil([&] { return playerctl({"metadata", "title"}) == "Memo 007"; }));
     playerctl({"position", "9"});
     EXPECT_EQ(3u, seeks.size()) << "a recording cannot be moved in";
+    EXPECT_EQ("4.0", playerctl({"position"}).substr(0, 3)) << "but its time counts";
     remote_player_set_callbacks(nullptr, nullptr);
 }
 

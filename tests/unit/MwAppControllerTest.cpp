@@ -371,19 +371,28 @@ TEST_F(MwAppControllerTest, PauseInRequestModeSavesRepliesAndExits)
 
 TEST_F(MwAppControllerTest, MediaKeysDriveTheRecording)
 {
-    startRecording();
-    for (const media_key_e toggle : {MEDIA_KEY_PAUSE, MEDIA_KEY_PLAY, MEDIA_KEY_PLAYPAUSE, MEDIA_KEY_MEDIA}) {
-        const int before = state();
-        key(toggle, MEDIA_KEY_STATUS_PRESSED);
-        EXPECT_EQ(before, state());
-        key(toggle);
-        EXPECT_NE(before, state()) << toggle;
-    }
+    constexpr int RUNS = MwRecorder::REC_STATE_RECORDING, RESTS = MwRecorder::REC_STATE_PAUSED;
+    startRecording(5000);
+    struct {
+        media_key_e key;
+        int afterRunning;
+        int afterResting;
+    } const cases[] = {{MEDIA_KEY_PLAY, RUNS, RUNS}, {MEDIA_KEY_PAUSE, RESTS, RESTS},
+        {MEDIA_KEY_PLAYPAUSE, RESTS, RUNS}, {MEDIA_KEY_MEDIA, RESTS, RUNS}, {MEDIA_KEY_RECORD, RUNS, RUNS},
+        {MEDIA_KEY_NEXT, RUNS, RESTS}, {MEDIA_KEY_FASTFORWARD, RUNS, RESTS}};
+    for (const auto& c : cases)
+        for (const auto& [before, after] : {std::pair{RUNS, c.afterRunning}, {RESTS, c.afterResting}}) {
+            if (state() != before)
+                dispatch(before == RUNS ? MwAppController::RESUME_RECORDING : MwAppController::PAUSE_RECORDING);
+            key(c.key, MEDIA_KEY_STATUS_PRESSED);
+            EXPECT_EQ(before, state());
+            key(c.key);
+            EXPECT_EQ(after, state()) << c.key << " while " << before;
+        }
+    EXPECT_EQ(5000, fakes::desktop.remote.position(fakes::desktop.remoteData));
     key(MEDIA_KEY_STOP);
-    key(MEDIA_KEY_NEXT);
-    key(MEDIA_KEY_FASTFORWARD, MEDIA_KEY_STATUS_PRESSED);
-    key(MEDIA_KEY_FASTFORWARD);
-    EXPECT_EQ(MwRecorder::REC_STATE_RECORDING, state());
+    EXPECT_TRUE(support::runUntil([&] { return state() == MwRecorder::REC_STATE_READY; }));
+    EXPECT_TRUE(std::filesystem::exists(_controller.getLastSavedPath()));
     EXPECT_FALSE(calls.has("player_"));
 }
 
@@ -482,6 +491,7 @@ TEST_F(MwPlaybackTest, ResumesAfterACallButNotAfterAnUnpluggedHeadset)
         EXPECT_EQ(resumes ? MwPlayer::PLAY_STATE_PLAYING : MwPlayer::PLAY_STATE_PAUSED, playing()) << code;
         EXPECT_EQ(resumes, !calls.has("device_power_release_lock")) << "locked while it plays";
         dispatch(MwAppController::STOP_PLAYING);
+        EXPECT_TRUE(support::runUntil([] { return calls.has("bt_avrcp_target_notify_player_state 0"); }));
     }
 }
 

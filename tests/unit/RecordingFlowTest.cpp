@@ -214,6 +214,22 @@ TEST_F(RecordingFlowTest, AStopThatMeetsTheRecordersOwnIsASuccess)
     EXPECT_FALSE(stop()) << "nothing was saved";
 }
 
+TEST_F(RecordingFlowTest, AMicrophoneThatIsBackIsToldWhereItWasMissed)
+{
+    const auto& back = MwSignalMgr::MICROPHONE_BACK;
+    for (const bool isMissing : {true, false}) {
+        startRecording();
+        vconf_set_int(VCONFKEY_MEWLO_MICROPHONE, isMissing ? 0 : 1);
+        interrupt();
+        EXPECT_TRUE(isReadySoon());
+        MwSignalMgr::getInstance()->getSystemInfoSignal().emit(back);
+        const std::string told = mwTranslate("IDS_MW_TPOP_A_MICROPHONE_IS_CONNECTED_AGAIN");
+        EXPECT_EQ(isMissing, calls.has("post " + told));
+        EXPECT_NE("", told);
+        calls.clear();
+    }
+}
+
 TEST_F(RecordingFlowTest, ARunningRecordingKeepsItsName)
 {
     startRecording();

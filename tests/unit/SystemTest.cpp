@@ -79,6 +79,8 @@ TEST_F(MwSystemMgrTest, KeysBecomeEvents)
     EXPECT_EQ(List{MwSignalMgr::UPS_MODE_CHANGED}, after(VCONFKEY_SETAPPL_PSMODE, 7));
     EXPECT_EQ(List{MwSignalMgr::CALL_REJECT_CHANGED}, after(VCONFKEY_CALL_RECORDING_REJECT, 1));
     EXPECT_TRUE(_system->getRejectCall());
+    EXPECT_EQ(List{}, after(VCONFKEY_MEWLO_MICROPHONE, 0));
+    EXPECT_EQ(List{MwSignalMgr::MICROPHONE_BACK}, after(VCONFKEY_MEWLO_MICROPHONE, 1));
     fakes::sound.deviceChanged(SOUND_DEVICE_IN_MIC, SOUND_DEVICE_OUT_SPEAKER, fakes::sound.userData);
     _events.clear();
     std::thread([] {

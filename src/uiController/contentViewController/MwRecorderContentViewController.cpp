@@ -201,6 +201,7 @@ void MwRecorderContentViewController::_systemInfoChanged(MwSignalMgr::SystemInfo
     case MwSignalMgr::POWER_STATE_CHANGED:
     case MwSignalMgr::THEME_CHANGED:
     case MwSignalMgr::CALL_REJECT_CHANGED:
+    case MwSignalMgr::MICROPHONE_BACK:
         return;
     }
 }

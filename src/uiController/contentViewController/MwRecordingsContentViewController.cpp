@@ -195,6 +195,7 @@ void MwRecordingsContentViewController::_onSystemInfoSignal(MwSignalMgr::SystemI
     case MwSignalMgr::MINI_CONTROLLER_RECORDING_SAVED:
     case MwSignalMgr::POWER_STATE_CHANGED:
     case MwSignalMgr::CALL_REJECT_CHANGED:
+    case MwSignalMgr::MICROPHONE_BACK:
         return;
     }
 }
