@@ -1,5 +1,6 @@
 #include "callmgr.h"
 
+#include "host/PulseWatch.h"
 #include "state/Keys.h"
 #include "state/Trees.h"
 
@@ -25,6 +26,9 @@ int cm_get_call_status(cm_client_h client, cm_call_status_e* status)
     if (client == nullptr || status == nullptr)
         return INVALID_PARAMETER;
     *status = static_cast<cm_call_status_e>(platform::stateInt(platform::KEY_CALL_STATUS).value_or(0));
+    // A call of a program on this machine is one as well.
+    if (*status == CM_CALL_STATUS_IDLE && host::PulseWatch::instance().snapshot().hasCall)
+        *status = static_cast<cm_call_status_e>(1);
     return NONE;
 }
 

@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <cstdlib>
 #include <cstring>
 #include <utility>
@@ -40,6 +41,16 @@ namespace {
     bool isOurs(const pa_proplist* properties)
     {
         return property(properties, PA_PROP_APPLICATION_PROCESS_ID) == std::to_string(getpid());
+    }
+
+    // What others listen for (a meeting, a meter, a voice command) is no recording.
+    bool isRecorder(const pa_proplist* properties)
+    {
+        constexpr std::array<const char*, 9> RECORDERS
+            = {"parec", "parecord", "pacat", "pw-record", "pw-cat", "arecord", "ffmpeg", "rec", "sox"};
+        const std::string program = property(properties, PA_PROP_APPLICATION_PROCESS_BINARY);
+        return property(properties, PA_PROP_MEDIA_ROLE) == "production"
+            || std::find(RECORDERS.begin(), RECORDERS.end(), program) != RECORDERS.end();
     }
 
     std::string currentServer()
@@ -119,11 +130,13 @@ struct PulseWatch::Query {
     }
     void note(const pa_source_output_info& info)
     {
-        // Without a client it belongs to a module; "peaks" is a level meter.
-        const bool isMeter = info.resample_method != nullptr && std::strcmp(info.resample_method, "peaks") == 0;
+        // Without a client it belongs to a module; "peaks" is a level meter, which PipeWire tells by a property.
+        const bool isMeter = (info.resample_method != nullptr && std::strcmp(info.resample_method, "peaks") == 0)
+            || property(info.proplist, "resample.peaks") == "true";
         if (info.client == PA_INVALID_INDEX || info.corked != 0 || isMeter || isOurs(info.proplist))
             return;
-        found.othersRecord = true;
+        found.othersListen = true;
+        found.othersRecord = found.othersRecord || isRecorder(info.proplist);
         noteRole(info.proplist);
     }
 

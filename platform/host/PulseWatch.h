@@ -20,7 +20,8 @@ struct PulseSnapshot {
     bool hasCall = false; // an active stream of the role phone
     bool hasAlarm = false;
     bool hasNotification = false; // roles event and notification
-    bool othersRecord = false; // an application captures sound now
+    bool othersRecord = false; // a recorder captures sound now, by its role or its name
+    bool othersListen = false; // any application does
     bool isHeadsetOut = false; // the default output is a wired headset or headphone
     bool isHeadsetIn = false;
     bool isHeadsetPlugged = false;

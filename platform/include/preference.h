@@ -12,6 +12,8 @@ typedef void (*preference_changed_cb)(const char* key, void* user_data);
 
 // Whether, and how, the user has set up the private storage: 0 not at all. Told to every session as a state key.
 #define PREFERENCE_PRIVATE_METHOD "PrivateStorageMethod"
+// Whether any program that listens counts as another recorder, which refuses a start.
+#define PREFERENCE_STRICT_RECORDERS "StrictRecorders"
 
 extern "C" {
 int preference_get_int(const char* key, int* value);

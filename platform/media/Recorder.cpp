@@ -1,5 +1,6 @@
 #include "media/Recorder.h"
 
+#include "media/LiveCall.h"
 #include "media/WaveformCache.h"
 
 #include "host/PulseWatch.h"
@@ -106,7 +107,7 @@ RecorderFormat Recorder::_format() const
 int Recorder::_refusal(std::chrono::milliseconds limit) const
 {
     const auto sound = host::PulseWatch::instance().refresh(limit);
-    if (sound.hasCall)
+    if (isCallLive(sound))
         return RECORDER_ERROR_SOUND_POLICY_BY_CALL;
     return sound.hasAlarm ? RECORDER_ERROR_SOUND_POLICY_BY_ALARM : RECORDER_ERROR_NONE;
 }

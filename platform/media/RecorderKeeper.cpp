@@ -1,5 +1,7 @@
 #include "media/Recorder.h"
 
+#include "media/LiveCall.h"
+
 #include "host/PulseWatch.h"
 #include "media/RecordingClaims.h"
 #include "state/Log.h"
@@ -102,6 +104,7 @@ void Recorder::_inspect(Recording& recording, bool isSecond)
 {
     if (isSecond)
         _inspectStorage(recording);
+    _noteSound(isCallLive(host::PulseWatch::instance().snapshot())); // the modem's, too
     // An operation under way moves the samples itself.
     const std::unique_lock lock(_operation, std::try_to_lock);
     if (!lock || _state != RECORDER_STATE_RECORDING || _current().get() != &recording)

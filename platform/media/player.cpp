@@ -2,8 +2,11 @@
 
 #include "host/PulseWatch.h"
 #include "media/FileDuration.h"
+#include "media/LiveCall.h"
 #include "media/MainLoopMailbox.h"
 #include "media/PlayerPipeline.h"
+#include "state/Keys.h"
+#include "state/Trees.h"
 
 #include <unistd.h>
 
@@ -33,7 +36,7 @@ struct Slot {
 
 player_interrupted_code_e interruptionCode(const host::PulseSnapshot& sound)
 {
-    if (sound.hasCall)
+    if (media::isCallLive(sound))
         return PLAYER_INTERRUPTED_BY_CALL;
     if (sound.hasAlarm)
         return PLAYER_INTERRUPTED_BY_ALARM;
@@ -52,7 +55,11 @@ int fileError(const std::string& path)
 // Main loop only. Every callback is the last step of the function that makes it: it may destroy the player.
 struct player_s {
     player_s();
-    ~player_s() { host::PulseWatch::instance().removeListener(_headsetListener); }
+    ~player_s()
+    {
+        host::PulseWatch::instance().removeListener(_soundListener);
+        platform::stateTree().unwatch(_callWatch);
+    }
     player_s(const player_s&) = delete;
     player_s& operator=(const player_s&) = delete;
 
@@ -75,6 +82,7 @@ private:
     PlayerPipeline::Events _events();
     void _interrupt(player_interrupted_code_e code);
     void _onRequested(bool shallPause);
+    void _yield(bool isBusy);
     void _onFailed(bool isSink);
     void _onSeekDone();
     int _open();
@@ -86,16 +94,27 @@ private:
     bool _isSeeking = false; // until the first "done" of a burst; the rest belongs to it
     Slot<player_seek_completed_cb> _seekDone;
     int _lastPosition = 0;
-    bool _isInterrupted = false; // paused on the sound server's request
-    int _headsetListener = 0;
+    bool _isInterrupted = false; // paused for another stream
+    int _soundListener = 0;
+    platform::KeyTree::WatchId _callWatch = 0;
     media::MainLoopMailbox _mailbox;
 };
 
 player_s::player_s()
 {
-    _headsetListener = host::PulseWatch::instance().addListener([this](const auto& before, const auto& now) {
+    _soundListener = host::PulseWatch::instance().addListener([this](const auto& before, const auto& now) {
         if (before.isHeadsetOut && now.isConnected && !now.isHeadsetOut)
             _mailbox.post([this] { _interrupt(PLAYER_INTERRUPTED_BY_EARJACK_UNPLUG); });
+        // Not every sound server asks for a pause itself.
+        const bool isBusy = now.hasCall || now.hasAlarm;
+        if (isBusy != (before.hasCall || before.hasAlarm))
+            _mailbox.post([this, isBusy] { _yield(isBusy); });
+    });
+    // The modem knows of calls that no stream tells.
+    _callWatch = platform::stateTree().watch(platform::KEY_CALL_STATUS, [this](const std::string&) {
+        const auto sound = host::PulseWatch::instance().snapshot();
+        const bool isBusy = media::isCallLive(sound) || sound.hasAlarm;
+        _mailbox.post([this, isBusy] { _yield(isBusy); });
     });
 }
 
@@ -247,6 +266,17 @@ void player_s::_onRequested(bool shallPause)
         return _interrupt(interruptionCode(host::PulseWatch::instance().refresh()));
     }
     if (!shallPause && std::exchange(_isInterrupted, false) && state == PLAYER_STATE_PAUSED)
+        interrupted(PLAYER_INTERRUPTED_COMPLETED);
+}
+
+// Whoever tells first pauses, and once; as with the end.
+void player_s::_yield(bool isBusy)
+{
+    if (isBusy && state == PLAYER_STATE_PLAYING) {
+        _isInterrupted = true;
+        return _interrupt(interruptionCode(host::PulseWatch::instance().snapshot()));
+    }
+    if (!isBusy && std::exchange(_isInterrupted, false) && state == PLAYER_STATE_PAUSED)
         interrupted(PLAYER_INTERRUPTED_COMPLETED);
 }
 

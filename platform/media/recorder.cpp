@@ -1,5 +1,7 @@
 #include <recorder.h>
 
+#include <preference.h>
+
 #include "host/PulseWatch.h"
 #include "media/Recorder.h"
 
@@ -204,6 +206,9 @@ int recorder_is_in_recording(int kind, bool* in_recording)
 {
     if (in_recording == nullptr)
         return RECORDER_ERROR_INVALID_PARAMETER;
-    *in_recording = kind == KIND_AUDIO && host::PulseWatch::instance().refresh().othersRecord;
+    const auto sound = host::PulseWatch::instance().refresh();
+    bool isStrict = false;
+    (void)preference_get_boolean(PREFERENCE_STRICT_RECORDERS, &isStrict);
+    *in_recording = kind == KIND_AUDIO && (isStrict ? sound.othersListen : sound.othersRecord);
     return RECORDER_ERROR_NONE;
 }

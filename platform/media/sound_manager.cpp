@@ -1,6 +1,7 @@
 #include <sound_manager.h>
 
 #include "host/PulseWatch.h"
+#include "media/LiveCall.h"
 #include "media/MainLoopMailbox.h"
 
 #include <memory>
@@ -61,7 +62,7 @@ std::unique_ptr<RouteNotifier>& notifier()
 int arbitrate()
 {
     const auto sound = host::PulseWatch::instance().refresh();
-    if (sound.hasCall)
+    if (media::isCallLive(sound))
         return SOUND_MANAGER_ERROR_POLICY_BLOCKED_BY_CALL;
     return sound.hasAlarm ? SOUND_MANAGER_ERROR_POLICY_BLOCKED_BY_ALARM : SOUND_MANAGER_ERROR_NONE;
 }

@@ -1,6 +1,7 @@
 #include "RecorderFixture.h"
 
 #include <player.h>
+#include <vconf.h>
 
 #include <chrono>
 #include <cmath>
@@ -285,6 +286,39 @@ TEST_F(PlayerTest, PausesForCallsAlarmsAndNotifications)
         ASSERT_EQ(0, player_start(player.handle));
         runFor(0.05);
     }
+}
+
+// Whoever knows of a call, a stream or the modem, pauses once; the sound server need not ask for it.
+TEST_F(PlayerTest, PausesForCallsThatNobodyAsksItToPauseFor)
+{
+    server.unload("module-role-cork");
+    support::writeTone(directory.file("ring.wav"), 20, 0.2);
+    PlayerHandle player;
+    ASSERT_EQ(0, player.play(recording(20, false)));
+    const auto expectPause = [&](player_interrupted_code_e code) {
+        EXPECT_TRUE(runUntil([&] { return !player.interruptions.empty(); }));
+        EXPECT_EQ(std::vector{code}, player.interruptions);
+        EXPECT_EQ(PLAYER_STATE_PAUSED, player.stateWhenInterrupted);
+    };
+    const auto expectEnd = [&] {
+        EXPECT_TRUE(runUntil([&] { return player.interruptions.size() == 2; }));
+        EXPECT_EQ(PLAYER_INTERRUPTED_COMPLETED, player.interruptions.back());
+        player.interruptions.clear();
+        EXPECT_EQ(0, player_start(player.handle));
+    };
+    for (const auto& [role, code] :
+        {std::pair{"phone", PLAYER_INTERRUPTED_BY_CALL}, {"alarm", PLAYER_INTERRUPTED_BY_ALARM}}) {
+        SCOPED_TRACE(role);
+        {
+            const auto ring = server.playAs(role, directory.file("ring.wav"));
+            expectPause(code);
+        }
+        expectEnd();
+    }
+    vconf_set_int("memory/telephony/call_status", 1);
+    expectPause(PLAYER_INTERRUPTED_BY_CALL);
+    vconf_set_int("memory/telephony/call_status", 0);
+    expectEnd();
 }
 
 TEST_F(PlayerTest, PausesWhenTheHeadsetIsUnplugged)

@@ -1,5 +1,8 @@
 #include "RecorderFixture.h"
 
+#include <preference.h>
+#include <vconf.h>
+
 #include <algorithm>
 #include <chrono>
 #include <cmath>
@@ -176,6 +179,44 @@ TEST_F(RecorderTest, PausedRecorderLeavesTheMicrophoneToOthers)
     }
     EXPECT_TRUE(runUntil([&] { return recorder_is_in_recording(0, &inRecording) == 0 && !inRecording; }));
     EXPECT_EQ(0, recorder_commit(recorder.handle));
+}
+
+TEST_F(RecorderTest, OnlyARecorderIsAnotherRecorder)
+{
+    const struct {
+        std::vector<std::string> properties;
+        bool isRecorder;
+    } others[] = {{{}, true}, {{"application.process.binary=browser"}, false},
+        {{"application.process.binary=browser", "media.role=production"}, true}, {{"resample.peaks=true"}, false}};
+    for (const auto& other : others) {
+        std::vector<std::string> command{"parecord", "--device=micsrc", "--raw"};
+        for (const std::string& property : other.properties)
+            command.push_back("--property=" + property);
+        command.emplace_back("/dev/null");
+        SCOPED_TRACE(command[command.size() - 2]);
+        const support::Program program(command);
+        ASSERT_TRUE(runUntil([&] { return !server.control("list short source-outputs").empty(); }));
+        const auto answer = [] {
+            bool isRecording = false;
+            (void)recorder_is_in_recording(0, &isRecording);
+            return isRecording;
+        };
+        if (other.isRecorder) {
+            EXPECT_TRUE(runUntil(answer));
+        } else {
+            runFor(0.2);
+            EXPECT_FALSE(answer());
+        }
+        // The old rule, by choice: whoever listens; but a level meter never.
+        preference_set_boolean(PREFERENCE_STRICT_RECORDERS, true);
+        EXPECT_EQ(other.properties != std::vector<std::string>{"resample.peaks=true"}, answer());
+        preference_set_boolean(PREFERENCE_STRICT_RECORDERS, false);
+    }
+    vconf_set_int("memory/telephony/call_status", 1);
+    RecorderHandle recorder(temporary);
+    EXPECT_EQ(RECORDER_ERROR_SOUND_POLICY_BY_CALL, recorder.prepareAndStart()) << "a call that the modem knows of";
+    vconf_set_int("memory/telephony/call_status", 0);
+    EXPECT_EQ(0, recorder.prepareAndStart());
 }
 
 TEST_F(RecorderTest, OperationsWorkOnAThreadWhileTheMainLoopWaits)

@@ -1,0 +1,13 @@
+#include "media/LiveCall.h"
+
+#include "state/Keys.h"
+#include "state/Trees.h"
+
+namespace media {
+
+bool isCallLive(const host::PulseSnapshot& sound)
+{
+    return sound.hasCall || platform::stateInt(platform::KEY_CALL_STATUS).value_or(0) > 0;
+}
+
+}
