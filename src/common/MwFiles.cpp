@@ -14,6 +14,13 @@ namespace {
 
 constexpr mode_t OPEN_TO_ALL = 0777;
 
+// A place of everybody's, such as a shared root; what lies in a home follows the umask.
+bool isShared(const std::string& directory)
+{
+    struct stat status { };
+    return ::stat(directory.c_str(), &status) == 0 && (status.st_mode & S_IWOTH) != 0;
+}
+
 bool makeDirectory(const std::string& path)
 {
     if (ecore_file_is_dir(path.c_str()) != EINA_FALSE)
@@ -22,7 +29,7 @@ bool makeDirectory(const std::string& path)
         MW_LOGE("ecore_file_mkdir failed!");
         return false;
     }
-    if (::chmod(path.c_str(), OPEN_TO_ALL) != 0)
+    if (isShared(path.substr(0, path.rfind('/') + 1)) && ::chmod(path.c_str(), OPEN_TO_ALL) != 0)
         MW_LOGE("chmod failed!");
     return true;
 }

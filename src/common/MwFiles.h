@@ -11,7 +11,7 @@ enum class Move { DONE, EXISTS, FAILED };
 Move moveWithoutOverwriting(const std::string& from, const std::string& to);
 // Flushes the directory that holds the path, so that the name itself survives a power cut.
 void flushDirectoryOf(const std::string& path);
-// Creates a directory and every missing ancestor, each open to all users of the storage.
+// Creates a directory and every missing ancestor: open to all below a place that all may write, else after the umask.
 bool makeDirectories(const std::string& path);
 
 }

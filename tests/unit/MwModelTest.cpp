@@ -7,10 +7,12 @@
 #include <filesystem>
 #include <sys/stat.h>
 
+#include "MwFiles.h"
 #include "MwRecordingNotes.h"
 #include "MwText.h"
 #include "fakes/Fakes.h"
 #include "support/Recordings.h"
+#include "support/TempDir.h"
 
 namespace {
 
@@ -208,6 +210,23 @@ TEST_F(MwModelTest, NotesAreTheOwnersAndFollowNoLink)
     ASSERT_EQ(0, mkfifo(path.c_str(), 0600));
     EXPECT_FALSE(MwRecordingNotes::load(path)) << "and a pipe holds nobody";
     std::filesystem::remove(path);
+}
+
+TEST_F(MwModelTest, FoldersAreOpenToAllOnlyBelowASharedPlace)
+{
+    const support::TempDir directory;
+    const mode_t before = umask(027);
+    for (const auto& [root, made] : std::map<mode_t, mode_t>{{0700, 0750}, {0755, 0750}, {0777, 0777}, {01777, 0777}}) {
+        ASSERT_EQ(0, chmod(directory.file("").c_str(), root));
+        EXPECT_TRUE(MwFiles::makeDirectories(directory.file("Sounds/Mewlo")));
+        for (const char* name : {"Sounds", "Sounds/Mewlo"}) {
+            struct stat status { };
+            EXPECT_EQ(0, stat(directory.file(name).c_str(), &status));
+            EXPECT_EQ(made, status.st_mode & 07777) << name << std::oct << " below " << root;
+        }
+        std::filesystem::remove_all(directory.file("Sounds"));
+    }
+    umask(before);
 }
 
 TEST_F(MwModelTest, StorageFollowsTheCardAndTheChoice)
