@@ -62,6 +62,7 @@ int player_unprepare(player_h player);
 int player_start(player_h player);
 int player_pause(player_h player);
 int player_stop(player_h player);
+// 0 when the file does not tell it.
 int player_get_duration(player_h player, int* milliseconds);
 int player_get_play_position(player_h player, int* milliseconds);
 int player_set_play_position(

@@ -17,6 +17,14 @@ namespace {
 
     constexpr int MOST_BOXES = 20000; // more than any honest file has side by side
     constexpr std::array<unsigned char, 16> AMR_FRAME_BYTES = {13, 14, 16, 18, 20, 21, 27, 32, 6, 1, 1, 1, 1, 1, 1, 1};
+    constexpr std::array<unsigned char, 16> AMR_WIDE_FRAME_BYTES
+        = {18, 24, 33, 37, 41, 47, 51, 59, 61, 6, 1, 1, 1, 1, 1, 1};
+    constexpr auto AMR_WIDE_MAGIC = "#!AMR-WB\n";
+    constexpr off_t AMR_WIDE_DATA_START = 9;
+    constexpr std::array<uint32_t, 13> ADTS_RATES
+        = {96000, 88200, 64000, 48000, 44100, 32000, 24000, 22050, 16000, 12000, 11025, 8000, 7350};
+    constexpr size_t ADTS_HEAD = 7;
+    constexpr off_t MOST_FRAGMENT_INDEX = 1 << 24;
     constexpr unsigned AMR_PADDING_BITS = 0x83;
     constexpr size_t BLOCK = 65536;
 
@@ -119,65 +127,193 @@ namespace {
         return sound;
     }
 
-    // Units of the movie; none for a track of something else.
-    std::optional<uint64_t> soundLength(int fd, const Box& track)
+    // A track of sound: as long as the movie's index says, and what its fragments need to tell more.
+    struct Sound {
+        uint64_t length = 0; // units of the movie
+        uint64_t identifier = 0;
+        uint64_t scale = 0; // units a second of the fragments
+        uint64_t frameLength = 0; // of a fragment that does not tell
+    };
+
+    std::optional<Sound> soundOf(int fd, const Box& track)
     {
-        std::optional<uint64_t> length;
+        Sound found;
         bool sound = false;
         visitBoxes(fd, track.content, track.end, [&](const Box& box) {
             constexpr size_t IDENTIFIER = 8; // of the track, and nothing
             if (box.is("tkhd")) {
-                if (const auto times = timesOf(fd, box, IDENTIFIER))
-                    length = times->duration;
+                const Times times = timesOf(fd, box, IDENTIFIER).value_or(Times());
+                found.length = times.duration;
+                found.identifier = times.first;
             }
-            sound = sound || (box.is("mdia") && isSound(fd, box));
+            if (box.is("mdia")) {
+                sound = sound || isSound(fd, box);
+                visitBoxes(fd, box.content, box.end, [&](const Box& inner) {
+                    if (inner.is("mdhd"))
+                        found.scale = timesOf(fd, inner, 4).value_or(Times()).first;
+                    return true;
+                });
+            }
             return true;
         });
-        return sound && length.value_or(0) > 0 ? length : std::nullopt;
+        return sound ? std::optional<Sound>(found) : std::nullopt;
     }
 
-    // As long as its sound is heard; else what the whole says.
-    std::optional<int> soundDuration(int fd, const Box& movie)
+    // A number in a box; 0 behind its end.
+    uint64_t numberAt(int fd, const Box& box, off_t place)
     {
-        std::optional<Times> whole;
-        std::optional<uint64_t> sound;
-        visitBoxes(fd, movie.content, movie.end, [&](const Box& box) {
-            constexpr size_t SCALE = 4;
-            if (box.is("mvhd"))
-                whole = timesOf(fd, box, SCALE);
-            if (box.is("trak") && !sound)
-                sound = soundLength(fd, box);
+        std::array<unsigned char, 4> bytes{};
+        const bool isInside = box.content + place + 4 <= box.end;
+        return isInside && readAt(fd, bytes.data(), bytes.size(), box.content + place) ? bigEndian(bytes.data(), 4) : 0;
+    }
+
+    uint64_t defaultFrameLength(int fd, const Box& extension, uint64_t track)
+    {
+        uint64_t length = 0;
+        visitBoxes(fd, extension.content, extension.end, [&](const Box& box) {
+            if (box.is("trex") && numberAt(fd, box, 4) == track)
+                length = numberAt(fd, box, 12);
             return true;
         });
-        return whole ? milliseconds(sound.value_or(whole->duration), whole->first) : std::nullopt;
+        return length;
+    }
+
+    uint64_t runLength(int fd, const Box& run, uint64_t frameLength)
+    {
+        const uint64_t flags = numberAt(fd, run, 0);
+        const uint64_t count = numberAt(fd, run, 4);
+        if ((flags & 0x100) == 0)
+            return count * frameLength;
+        off_t begin = run.content + 8;
+        begin += ((flags & 1) != 0 ? 4 : 0) + ((flags & 4) != 0 ? 4 : 0);
+        off_t entry = 4;
+        for (const unsigned flag : {0x200, 0x400, 0x800})
+            entry += (flags & flag) != 0 ? 4 : 0;
+        const off_t size = run.end - begin;
+        if (size <= 0 || size > MOST_FRAGMENT_INDEX || static_cast<uint64_t>(size / entry) < count)
+            return 0;
+        std::vector<unsigned char> entries(static_cast<size_t>(size));
+        if (!readAt(fd, entries.data(), entries.size(), begin))
+            return 0;
+        uint64_t sum = 0;
+        for (uint64_t i = 0; i < count; ++i)
+            sum += bigEndian(entries.data() + i * static_cast<uint64_t>(entry), 4);
+        return sum;
+    }
+
+    uint64_t fragmentLength(int fd, const Box& fragment, const Sound& sound)
+    {
+        uint64_t sum = 0;
+        visitBoxes(fd, fragment.content, fragment.end, [&](const Box& part) {
+            uint64_t frameLength = sound.frameLength;
+            bool isMeant = false;
+            visitBoxes(fd, part.content, part.is("traf") ? part.end : part.content, [&](const Box& box) {
+                if (box.is("tfhd")) {
+                    const uint64_t flags = numberAt(fd, box, 0);
+                    isMeant = numberAt(fd, box, 4) == sound.identifier;
+                    if ((flags & 8) != 0)
+                        frameLength = numberAt(fd, box, 8 + ((flags & 1) != 0 ? 8 : 0) + ((flags & 2) != 0 ? 4 : 0));
+                }
+                if (box.is("trun") && isMeant)
+                    sum += runLength(fd, box, frameLength);
+                return true;
+            });
+            return true;
+        });
+        return sum;
     }
 
     struct Movie {
-        std::optional<int> duration;
+        std::optional<int> duration; // of its sound as the index tells it; else of the whole
+        std::optional<Sound> sound;
+        uint64_t fragments = 0; // length of the sound in them
         bool hasData = false;
         bool isFragmented = false;
         bool isExact = false;
     };
 
+    void readIndex(int fd, const Box& index, Movie& movie)
+    {
+        std::optional<Times> whole;
+        visitBoxes(fd, index.content, index.end, [&](const Box& box) {
+            constexpr size_t SCALE = 4;
+            if (box.is("mvhd"))
+                whole = timesOf(fd, box, SCALE);
+            if (box.is("trak") && !movie.sound)
+                movie.sound = soundOf(fd, box);
+            if (box.is("mvex") && movie.sound)
+                movie.sound->frameLength = defaultFrameLength(fd, box, movie.sound->identifier);
+            return true;
+        });
+        if (!whole)
+            return;
+        const bool isTold = movie.sound && movie.sound->length > 0;
+        movie.duration = milliseconds(isTold ? movie.sound->length : whole->duration, whole->first);
+    }
+
     Movie readMovie(int fd)
     {
         Movie movie;
         movie.isExact = visitBoxes(fd, 0, sizeOf(fd), [&](const Box& box) {
-            movie.isFragmented = movie.isFragmented || box.is("moof");
             movie.hasData = movie.hasData || box.is("mdat");
             if (box.is("moov"))
-                movie.duration = soundDuration(fd, box);
-            return !movie.isFragmented;
+                readIndex(fd, box, movie);
+            if (box.is("moof")) {
+                movie.isFragmented = true;
+                movie.fragments += movie.sound ? fragmentLength(fd, box, *movie.sound) : 0;
+            }
+            return true;
         });
         return movie;
     }
 
-    std::optional<int> amrDuration(int fd)
+    // What lies behind the last box is nobody's business.
+    std::optional<int> movieDuration(int fd)
     {
-        const AmrFrames frames = walkAmr(fd);
+        const Movie movie = readMovie(fd);
+        if (!movie.hasData)
+            return {};
+        if (!movie.isFragmented)
+            return movie.duration;
+        const auto fragments = milliseconds(movie.fragments, movie.sound ? movie.sound->scale : 0);
+        const int longest = std::max(fragments.value_or(0), movie.duration.value_or(0));
+        return longest > 0 ? std::optional<int>(longest) : std::nullopt;
+    }
+
+    std::optional<int> adtsDuration(int fd)
+    {
+        std::vector<unsigned char> block(BLOCK);
+        const off_t size = sizeOf(fd);
+        off_t begin = 0; // of the block in the file
+        size_t filled = 0;
+        uint64_t samples = 0;
+        uint32_t rate = 0;
+        for (off_t at = 0; at + static_cast<off_t>(ADTS_HEAD) <= size;) {
+            if (at + static_cast<off_t>(ADTS_HEAD) > begin + static_cast<off_t>(filled)) {
+                begin = at;
+                filled = static_cast<size_t>(std::min<off_t>(BLOCK, size - at));
+                if (!readAt(fd, block.data(), filled, at))
+                    return {};
+            }
+            const unsigned char* head = block.data() + (at - begin);
+            const size_t index = head[2] >> 2 & 15;
+            const auto length = static_cast<off_t>(bigEndian(head + 3, 3) >> 5 & 0x1FFF);
+            if (head[0] != 0xFF || (head[1] & 0xF6) != 0xF0 || index >= ADTS_RATES.size()
+                || length < static_cast<off_t>(ADTS_HEAD))
+                return {};
+            rate = ADTS_RATES[index];
+            samples += 1024 * ((head[6] & 3) + 1u);
+            at += length;
+        }
+        return milliseconds(samples, rate);
+    }
+
+    std::optional<int> amrDuration(int fd, FileKind kind)
+    {
+        const AmrFrames frames = walkAmr(fd, kind);
         const uint64_t length = frames.count * AMR_FRAME_MS;
         // A torn last frame is what a crash leaves; anything longer is damage.
-        const bool isDamaged = sizeOf(fd) - frames.end >= AMR_FRAME_BYTES[7];
+        const bool isDamaged = sizeOf(fd) - frames.end >= (kind == FileKind::AMR ? 32 : 61);
         return isDamaged || frames.count == 0 || length > INT_MAX ? std::nullopt
                                                                   : std::optional<int>(static_cast<int>(length));
     }
@@ -186,18 +322,24 @@ namespace {
 
 FileKind kindOf(int fd)
 {
-    std::array<char, 8> head{};
-    if (!readAt(fd, head.data(), head.size(), 0))
+    std::array<char, AMR_WIDE_DATA_START> head{};
+    if (!readAt(fd, head.data(), 8, 0))
         return FileKind::UNKNOWN;
     if (std::memcmp(head.data(), AMR_MAGIC, AMR_DATA_START) == 0)
         return FileKind::AMR;
+    if (readAt(fd, head.data(), head.size(), 0) && std::memcmp(head.data(), AMR_WIDE_MAGIC, head.size()) == 0)
+        return FileKind::AMR_WIDE;
+    if (head[0] == '\xFF' && (head[1] & 0xF6) == 0xF0)
+        return FileKind::ADTS;
     return std::memcmp(head.data() + 4, "ftyp", 4) == 0 ? FileKind::MP4 : FileKind::UNKNOWN;
 }
 
-AmrFrames walkAmr(int fd)
+AmrFrames walkAmr(int fd, FileKind kind)
 {
+    const bool isWide = kind == FileKind::AMR_WIDE;
+    const auto& bytes = isWide ? AMR_WIDE_FRAME_BYTES : AMR_FRAME_BYTES;
     std::vector<unsigned char> block(BLOCK);
-    AmrFrames frames{0, AMR_DATA_START, true};
+    AmrFrames frames{0, isWide ? AMR_WIDE_DATA_START : AMR_DATA_START, true};
     const off_t size = sizeOf(fd);
     while (frames.end < size) {
         const auto want = std::min<off_t>(BLOCK, size - frames.end);
@@ -206,7 +348,7 @@ AmrFrames walkAmr(int fd)
         off_t at = 0;
         while (at < want) {
             const unsigned char head = block[static_cast<size_t>(at)];
-            const off_t length = AMR_FRAME_BYTES[head >> 3 & 15];
+            const off_t length = bytes[head >> 3 & 15];
             if ((head & AMR_PADDING_BITS) != 0 || at + length > want)
                 break;
             at += length;
@@ -222,13 +364,14 @@ AmrFrames walkAmr(int fd)
 
 std::optional<int> durationOf(int fd)
 {
-    switch (kindOf(fd)) {
+    switch (const FileKind kind = kindOf(fd)) {
     case FileKind::AMR:
-        return amrDuration(fd);
-    case FileKind::MP4: {
-        const Movie movie = readMovie(fd);
-        return movie.hasData && movie.isExact && !movie.isFragmented ? movie.duration : std::nullopt;
-    }
+    case FileKind::AMR_WIDE:
+        return amrDuration(fd, kind);
+    case FileKind::ADTS:
+        return adtsDuration(fd);
+    case FileKind::MP4:
+        return movieDuration(fd);
     case FileKind::UNKNOWN:
         break;
     }
@@ -241,6 +384,12 @@ std::optional<int> durationOf(const std::string& path)
     return file ? durationOf(file.get()) : std::nullopt;
 }
 
-bool isCompleteMp4(int fd) { return kindOf(fd) == FileKind::MP4 && durationOf(fd).has_value(); }
+bool isCompleteMp4(int fd)
+{
+    if (kindOf(fd) != FileKind::MP4)
+        return false;
+    const Movie movie = readMovie(fd);
+    return movie.isExact && movie.hasData && !movie.isFragmented && movie.duration;
+}
 
 }

@@ -8,14 +8,14 @@
 
 namespace media {
 
-enum class FileKind { UNKNOWN, MP4, AMR };
+enum class FileKind { UNKNOWN, MP4, AMR, AMR_WIDE, ADTS };
 
 // What a recording's file itself tells; built for hostile input: every read is bounded by the file, memory by a block.
 FileKind kindOf(int fd);
-// Milliseconds; none for a damaged, unfinished or foreign file.
+// Milliseconds of sound; none for a damaged, unfinished or foreign file.
 std::optional<int> durationOf(int fd);
 std::optional<int> durationOf(const std::string& path);
-// Whether an MP4 file has its index and its boxes fill it exactly.
+// Whether an MP4 file has its whole index and its boxes fill it exactly.
 bool isCompleteMp4(int fd);
 
 struct AmrFrames {
@@ -26,6 +26,7 @@ struct AmrFrames {
 constexpr auto AMR_MAGIC = "#!AMR\n";
 constexpr off_t AMR_DATA_START = 6;
 constexpr int AMR_FRAME_MS = 20;
-AmrFrames walkAmr(int fd);
+// The frames of one of the two kinds of AMR.
+AmrFrames walkAmr(int fd, FileKind kind = FileKind::AMR);
 
 }

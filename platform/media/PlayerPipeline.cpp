@@ -40,6 +40,8 @@ namespace {
             return {AAC_CHAIN, ANY_DECODER};
         case FileKind::AMR:
             return {"amrparse ! amrnbdec"};
+        case FileKind::AMR_WIDE:
+        case FileKind::ADTS:
         case FileKind::UNKNOWN:
             break;
         }

@@ -131,6 +131,8 @@ namespace {
         switch (kindOf(file)) {
         case FileKind::AMR:
             return rebuildAmr(file, journal, makeJournalHeader(RECORDER_FILE_FORMAT_AMR, 8000, 1, 12200));
+        case FileKind::AMR_WIDE:
+        case FileKind::ADTS:
         case FileKind::MP4:
         case FileKind::UNKNOWN:
             break;

@@ -380,8 +380,8 @@ int player_get_duration(player_h player, int* milliseconds)
         return PLAYER_ERROR_INVALID_PARAMETER;
     if (player->state == PLAYER_STATE_IDLE)
         return PLAYER_ERROR_INVALID_STATE;
-    *milliseconds = player->duration();
-    return *milliseconds >= 0 ? PLAYER_ERROR_NONE : PLAYER_ERROR_INVALID_OPERATION;
+    *milliseconds = std::max(player->duration(), 0);
+    return PLAYER_ERROR_NONE;
 }
 
 int player_get_play_position(player_h player, int* milliseconds)

@@ -64,6 +64,8 @@ public:
     // Milliseconds, 0 when unknown.
     [[nodiscard]] unsigned int getCurrentPlayDuration() const;
     [[nodiscard]] static std::string getDurationText(unsigned int milliseconds, bool withHours);
+    // How long a recording is, at least one second; dashes when nobody knows.
+    [[nodiscard]] static std::string getLengthText(int milliseconds);
 
     // Storage. From hold to release, for one recording, type, root and all paths stay what they are, whatever happens
     // to the card and the choice.

@@ -12,6 +12,8 @@ namespace {
 constexpr auto RECORDED_FILES_CONDITION = "MEDIA_MIME_TYPE=\"audio/AMR\" OR MEDIA_MIME_TYPE=\"audio/3gpp\" OR "
                                           "(MEDIA_MIME_TYPE=\"audio/mp4\" AND MEDIA_MODE=10)";
 
+constexpr auto UNKNOWN_LENGTH = "--:--";
+
 using Filter = MwHandle<filter_h, media_filter_destroy>;
 using AudioMeta = MwHandle<audio_meta_h, audio_meta_destroy>;
 using Extractor = MwHandle<metadata_extractor_h, metadata_extractor_destroy>;
@@ -240,4 +242,11 @@ std::string MwModel::getDurationText(unsigned int milliseconds, bool withHours)
     if (withHours)
         return mwFormat("00:%02d:%02d", static_cast<int>(minutes), static_cast<int>(seconds));
     return mwFormat("%02d:%02d", static_cast<int>(minutes), static_cast<int>(seconds));
+}
+
+std::string MwModel::getLengthText(int milliseconds)
+{
+    constexpr int SHORTEST_SHOWN = 1000;
+    return milliseconds > 0 ? getDurationText(static_cast<unsigned int>(std::max(milliseconds, SHORTEST_SHOWN)), false)
+                            : UNKNOWN_LENGTH;
 }

@@ -1,5 +1,7 @@
 #include "RecorderFixture.h"
 
+#include "support/Amr.h"
+
 #include <metadata_extractor.h>
 
 #include <chrono>
@@ -55,6 +57,16 @@ TEST_F(MetadataTest, ReadsDurations)
     (void)support::outputOf(
         "ffmpeg -v error -f lavfi -i sine=d=3 -c:a aac -movflags +faststart " + directory.file("other.m4a"));
     EXPECT_NEAR(3000, durationOf(directory.file("other.m4a")), 30);
+    // Fragments, frames without a box, bytes behind the last box.
+    const std::string sine = "ffmpeg -v error -f lavfi -i sine=d=3 -c:a aac ";
+    (void)support::outputOf(sine + "-movflags frag_keyframe+empty_moov " + directory.file("one.m4a"));
+    (void)support::outputOf(sine + "-movflags frag_keyframe+empty_moov+default_base_moof -frag_duration 500000 "
+        + directory.file("six.m4a"));
+    (void)support::outputOf(sine + "-f adts " + directory.file("frames.m4a"));
+    support::writeFile(directory.file("tail.m4a"), support::readFile(directory.file("other.m4a")) + "and more");
+    for (const char* name : {"one.m4a", "six.m4a", "frames.m4a", "tail.m4a"})
+        EXPECT_NEAR(3000, durationOf(directory.file(name)), 50) << name;
+    EXPECT_EQ(1000, durationOfContent(support::wideAmr(50)));
     // Long durations take 64 bits: 40 hours at 44100 a second.
     const std::string zeros(20, '\0');
     const std::string header = std::string("\1\0\0\0", 4) + zeros.substr(0, 16) + std::string("\0\0\xac\x44", 4)

@@ -1,5 +1,7 @@
 #include "RecorderFixture.h"
 
+#include "support/Amr.h"
+
 #include <player.h>
 #include <vconf.h>
 
@@ -253,6 +255,25 @@ TEST_F(PlayerTest, AHangingSoundServerHoldsNobody)
     PlayerHandle later;
     EXPECT_TRUE(runUntil([&] { return later.play(file) == 0; }));
     EXPECT_TRUE(runUntil([&] { return later.position() > 100; }));
+}
+
+TEST_F(PlayerTest, PlaysFilesOfOthers)
+{
+    const std::string sine = "ffmpeg -v error -f lavfi -i sine=d=1 -c:a aac ";
+    (void)support::outputOf(sine + "-f adts " + directory.file("frames.m4a"));
+    (void)support::outputOf(sine + "-f mp3 -c:a libmp3lame " + directory.file("other.m4a"));
+    (void)support::outputOf(sine + "-movflags frag_keyframe+empty_moov " + directory.file("fragments.m4a"));
+    support::writeFile(directory.file("tail.m4a"), support::readFile(recording(1, false)) + "and more");
+    support::writeFile(directory.file("wide.amr"), support::wideAmr(50));
+    for (const char* name : {"frames.m4a", "other.m4a", "fragments.m4a", "tail.m4a", "wide.amr"}) {
+        SCOPED_TRACE(name);
+        PlayerHandle player;
+        ASSERT_EQ(0, player.play(directory.file(name)));
+        int duration = -1;
+        EXPECT_EQ(0, player_get_duration(player.handle, &duration)) << "unknown is no failure";
+        EXPECT_TRUE(runUntil([&] { return player.completed + player.errors > 0; }));
+        EXPECT_EQ(1, player.completed);
+    }
 }
 
 TEST_F(PlayerTest, StepsOverADamagedStretch)

@@ -29,4 +29,13 @@ inline bool makeAmr(const std::string& to, int seconds)
     return std::system(command.c_str()) == 0 && encodeAmr(to + ".wav", to);
 }
 
+// Wide-band silence, 20 ms a frame.
+inline std::string wideAmr(int frames)
+{
+    std::string content = "#!AMR-WB\n";
+    for (int i = 0; i < frames; ++i)
+        content += '\4' + std::string(17, '\0');
+    return content;
+}
+
 }

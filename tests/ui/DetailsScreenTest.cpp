@@ -36,8 +36,8 @@ TEST(DetailsTextTest, SizesAndLengths)
         {3 << 20, "3.0 MB"}, {2.5 * (1 << 30), "2.5 GB"}, {1024.0 * (1 << 30), ""}};
     for (const auto& [bytes, text] : sizes)
         EXPECT_EQ(text, mwSizeText(bytes));
-    const std::pair<int, const char*> lengths[] = {{400, "00:01"}, {-1, "00:01"}, {61999, "01:01"}, {3599999, "59:59"},
-        {3600000, "01:00:00"}, {360061000, "100:01:01"}};
+    const std::pair<int, const char*> lengths[] = {{400, "00:01"}, {0, "--:--"}, {-1, "--:--"}, {61999, "01:01"},
+        {3599999, "59:59"}, {3600000, "01:00:00"}, {360061000, "100:01:01"}};
     for (const auto& [duration, text] : lengths)
         EXPECT_EQ(text, mwLengthText(duration));
 }

@@ -251,7 +251,8 @@ TEST_F(RecordingsScreenTest, RowsSayLengthFormatAndNameSafely)
 {
     media_content_connect();
     const std::string wild = "<b>\"50%\" & \xff\n\xe2\x80\xaeTiger.m4a";
-    support::enterRows({{"/x/Memo.amr", 400, 30}, {"/x/Memo.m4a", 3723000, 20}, {"/x/" + wild, 1999, 10}});
+    support::enterRows(
+        {{"/x/Memo.amr", 400, 30}, {"/x/Memo.m4a", 3723000, 20}, {"/x/Odd.m4a", 0, 15}, {"/x/" + wild, 1999, 10}});
     media_content_disconnect();
     RecordingsScreen screen;
     screen.open();
@@ -259,6 +260,7 @@ TEST_F(RecordingsScreenTest, RowsSayLengthFormatAndNameSafely)
     EXPECT_EQ("", screen.text("Memo.m4a", MMS));
     EXPECT_EQ("00:01", screen.text("Memo.amr", DURATION));
     EXPECT_EQ("01:02:03", screen.text("Memo.m4a", DURATION));
+    EXPECT_EQ("--:--", screen.text("Odd.m4a", DURATION));
     EXPECT_EQ("&lt;b&gt;&quot;50%&quot; &amp; \xef\xbf\xbd  Tiger", mwDisplayMarkup(mwWithoutExtension(wild)));
     EXPECT_EQ(".hidden", mwWithoutExtension(".hidden"));
     screen.tap("Memo.amr");

@@ -11,7 +11,6 @@
 
 namespace {
 
-constexpr int SHORTEST_SHOWN = 1000; // milliseconds
 constexpr double UNIT = 1024.0;
 
 bool isInside(const std::string& folder, const std::string& root)
@@ -51,7 +50,4 @@ std::string mwSizeText(double bytes)
     return divisions < NAMES.size() ? mwFormat("%.1f %s", bytes, NAMES[divisions]) : std::string();
 }
 
-std::string mwLengthText(int duration)
-{
-    return MwModel::getDurationText(static_cast<unsigned int>(std::max(duration, SHORTEST_SHOWN)), false);
-}
+std::string mwLengthText(int duration) { return MwModel::getLengthText(duration); }

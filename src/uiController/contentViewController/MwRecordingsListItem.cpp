@@ -36,7 +36,6 @@ constexpr auto CURRENT_DETAIL_COLOR = "ATO005";
 constexpr auto RADIO_KEY = "radio";
 constexpr auto IMAGE_FILE = "edje/MwImages.edj";
 constexpr int MARK_SIZE = 49; // design units
-constexpr int SHORTEST_SHOWN = 1000; // milliseconds
 constexpr std::string_view MMS_EXTENSION = ".amr";
 const std::string NO_PATH;
 
@@ -139,10 +138,7 @@ std::string MwRecordingsListItem::_dateText() const
     return mwDisplayMarkup(mwDateText(getGenlist(), _info->modifiedTime, MwICU::DATE));
 }
 
-std::string MwRecordingsListItem::_durationText() const
-{
-    return MwModel::getDurationText(static_cast<unsigned int>(std::max(_info->duration, SHORTEST_SHOWN)), false);
-}
+std::string MwRecordingsListItem::_durationText() const { return MwModel::getLengthText(_info->duration); }
 
 Evas_Object* MwRecordingsListItem::getContent(Evas_Object* genlist, const char* part)
 {

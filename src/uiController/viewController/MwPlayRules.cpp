@@ -19,10 +19,7 @@ constexpr auto UNTRIMMABLE_EXTENSION = ".3ga";
 
 double mwPlayRefreshPeriod(unsigned int duration) { return duration > LONG_RECORDING ? LONG_PERIOD : PERIOD; }
 
-std::string mwPlayTotalText(unsigned int duration)
-{
-    return MwModel::getDurationText(std::max(duration, SHORTEST_SHOWN), false);
-}
+std::string mwPlayTotalText(unsigned int duration) { return MwModel::getLengthText(static_cast<int>(duration)); }
 
 std::string mwPlayPositionText(unsigned int position, unsigned int duration)
 {
