@@ -31,17 +31,17 @@ bool appendEntry(sd_bus_message* message, const std::string& key, const std::vec
 
 void bundle_s::set(const std::string& key, std::vector<std::string> values)
 {
-    const auto found = std::find_if(entries.begin(), entries.end(), [&](const auto& e) { return e.first == key; });
-    if (found != entries.end())
-        found->second = std::move(values);
-    else
+    const auto [place, isNew] = places.try_emplace(key, entries.size());
+    if (isNew)
         entries.emplace_back(key, std::move(values));
+    else
+        entries[place->second].second = std::move(values);
 }
 
 const std::vector<std::string>* bundle_s::find(const std::string& key) const
 {
-    const auto found = std::find_if(entries.begin(), entries.end(), [&](const auto& e) { return e.first == key; });
-    return found != entries.end() ? &found->second : nullptr;
+    const auto found = places.find(key);
+    return found != places.end() ? &entries[found->second].second : nullptr;
 }
 
 std::string bundle_s::text(const std::string& key) const
@@ -61,6 +61,7 @@ bool bundle_s::appendTo(sd_bus_message* message) const
 bool bundle_s::readFrom(sd_bus_message* message)
 {
     entries.clear();
+    places.clear();
     if (sd_bus_message_enter_container(message, SD_BUS_TYPE_ARRAY, "{sas}") < 0)
         return false;
     int result = 0;

@@ -2,13 +2,15 @@
 #pragma once
 
 #include <string>
+#include <unordered_map>
 #include <utility>
 #include <vector>
 
 #include <systemd/sd-bus.h>
 
 struct bundle_s {
-    std::vector<std::pair<std::string, std::vector<std::string>>> entries;
+    std::vector<std::pair<std::string, std::vector<std::string>>> entries; // changed by set() alone
+    std::unordered_map<std::string, size_t> places; // of the names among the entries
 
     void set(const std::string& key, std::vector<std::string> values);
     [[nodiscard]] const std::vector<std::string>* find(const std::string& key) const;

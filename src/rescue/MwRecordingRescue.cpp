@@ -8,6 +8,7 @@
 #include <filesystem>
 #include <optional>
 
+#include "MwFileName.h"
 #include "MwFiles.h"
 #include "MwHandle.h"
 #include "MwLog.h"
@@ -64,11 +65,6 @@ bool catalogue(const std::string& path, const std::vector<MwBookmark>& bookmarks
     return MW_CALL(mwInsertBookmarks, mediaId, bookmarks);
 }
 
-bool isPlainName(const std::string& name)
-{
-    return !name.empty() && name.front() != '.' && name.find('/') == std::string::npos;
-}
-
 void leftoverCb(recorder_leftover_e outcome, const char* file, recorder_file_format_e format, int duration,
     const char* sidecar, void* userData)
 {
@@ -83,7 +79,7 @@ void leftoverCb(recorder_leftover_e outcome, const char* file, recorder_file_for
         notes = MwRecordingNotes::load(sidecar);
     work->model->updateLastRecordedFileNumber();
     const std::string name
-        = notes && isPlainName(notes->name) ? notes->name : work->model->getDefaultRecordingFileName();
+        = notes && mwIsFileName(notes->name, ".amr") ? notes->name : work->model->getDefaultRecordingFileName();
     const char* extension = format == RECORDER_FILE_FORMAT_AMR ? ".amr" : ".m4a";
     const std::string directory = directoryOf(work->root);
     if (!MwFiles::makeDirectories(directory))

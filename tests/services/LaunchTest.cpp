@@ -301,6 +301,20 @@ TEST_F(LaunchTest, ActivatedProgramWaitsForItsRequest)
     EXPECT_EQ("create\nfirst reply\nreply 0\nterminate\nend\n", notes());
 }
 
+TEST_F(LaunchTest, ABundleOfManyNamesIsMadeInNoTime)
+{
+    constexpr int MANY = 50000;
+    bundle* many = bundle_create();
+    const auto begin = std::chrono::steady_clock::now();
+    for (int round = 0; round < 2; ++round)
+        for (int i = 0; i < MANY; ++i)
+            ASSERT_EQ(0, bundle_add_str(many, std::to_string(i).c_str(), round == 0 ? "old" : "new"));
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(2));
+    EXPECT_STREQ("new", bundle_get_str(many, "49999"));
+    EXPECT_EQ(nullptr, bundle_get_str(many, "50000"));
+    bundle_free(many);
+}
+
 TEST_F(LaunchTest, MessagePortsDeliverAndAreMissedFromAnyThread)
 {
     const PrivateBus bus;

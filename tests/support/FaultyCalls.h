@@ -3,7 +3,8 @@
 #include <string>
 
 // The system's calls that change files, made to fail or to kill: this file's own versions stand in front of the C
-// library's for everything in the test program, SQLite included. Counts only what happens below a directory.
+// library's for everything in the test program, SQLite included. Counts only what happens below a directory. Without
+// effect under the thread sanitizer.
 namespace support::faults {
 
 enum class Effect { COUNT, FAIL, KILL };

@@ -14,6 +14,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include "MwFileName.h"
 #include "MwMediaRow.h"
 #include "MwMoveRecord.h"
 #include "MwStagedFile.h"
@@ -233,6 +234,17 @@ TEST_F(FileOperatorTest, DeletesIntoTheTrashButPrivateFilesForGood)
     EXPECT_EQ(Files(), filesIn(privateDirectory()));
     EXPECT_EQ("common", filesIn(trash)["common.m4a"]);
     EXPECT_FALSE(filesIn(trash).contains("secret.m4a"));
+}
+
+TEST(FileNameTest, RefusesWhatIsNoNameOfARecording)
+{
+    for (const std::string& name : {std::string(), std::string("   "), std::string(".hidden"), std::string(".."),
+             std::string("."), std::string("a/b"), std::string("two\nlines"), std::string("bell\a"),
+             std::string("\x7f"), std::string(252, 'x'), std::string("\0", 1)})
+        EXPECT_FALSE(mwIsFileName(name, ".m4a")) << name;
+    for (const std::string& name :
+        {std::string("Voice 001"), std::string("Übung"), std::string("a..b "), std::string(251, 'x')})
+        EXPECT_TRUE(mwIsFileName(name, ".m4a")) << name;
 }
 
 TEST_F(FileOperatorTest, HostileNamesTouchNothingElse)

@@ -342,6 +342,9 @@ TEST_F(TrimTest, SurvivesAKillAtEveryPoint)
 // The same with calls that fail: for a broken and for a full storage.
 TEST_F(TrimTest, SurvivesAFailureOfEveryCall)
 {
+#ifdef __SANITIZE_THREAD__
+    GTEST_SKIP() << "no call can be made to fail";
+#endif
     trim(false);
     const std::string result = readFile(recordingPath("Voice 001_001.m4a"));
     for (const int error : {EIO, ENOSPC}) {

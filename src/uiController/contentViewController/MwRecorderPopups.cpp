@@ -9,6 +9,7 @@
 #include <app_control.h>
 #include <panekit/WPopupController.h>
 
+#include "MwFileName.h"
 #include "MwHandle.h"
 #include "MwLog.h"
 #include "MwMemoryFullPopup.h"
@@ -46,6 +47,10 @@ void MwRecorderContentViewController::_renameResponseCb(const char* text, int re
 {
     if (response == MwRenamePopupController::RESPONSE_RENAME && text) {
         const std::string name = text;
+        if (!mwIsFileName(name, getModel()->getFileExtension())) {
+            mwPost("IDS_MW_POP_INVALID_FILE_NAME");
+            return;
+        }
         if (getModel()->checkRecordFileNameExist(name)) {
             mwPost("IDS_MW_POP_RENAMEALREADYUSED");
             return;

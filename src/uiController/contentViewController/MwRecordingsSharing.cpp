@@ -1,6 +1,7 @@
 // The recordings list: sharing, the private storage's service, and renaming.
 #include "MwRecordingsContentViewController.h"
 
+#include <algorithm>
 #include <map>
 #include <utility>
 
@@ -8,6 +9,7 @@
 
 #include <media_content.h>
 
+#include "MwFileName.h"
 #include "MwFileOperator.h"
 #include "MwFiles.h"
 #include "MwLog.h"
@@ -88,12 +90,6 @@ bool fillShareRequest(app_control_h request, const std::vector<std::string>& pat
                static_cast<int>(paths.size()))
         && MW_CALL(app_control_add_extra_data, request, "launch-type", "mewlo")
         && MW_CALL(app_control_set_operation, request, APP_CONTROL_OPERATION_MULTI_SHARE);
-}
-
-// Hidden files are not catalogued, and a slash would lead elsewhere.
-bool isFileName(const std::string& name)
-{
-    return !name.empty() && name.front() != '.' && name.find('/') == std::string::npos;
 }
 
 enum class Rename { DONE, TAKEN, FAILED };
@@ -233,11 +229,12 @@ void MwRecordingsContentViewController::_renameResponseCb(const char* text, int 
 // True closes the popup.
 bool MwRecordingsContentViewController::_renameRecording(const std::string& name)
 {
-    if (!isFileName(name)) {
+    const std::string path = _renameTarget;
+    const std::string ending = path.substr(std::min(path.rfind('.'), path.size()));
+    if (!mwIsFileName(name, ending)) {
         mwPost("IDS_MW_POP_INVALID_FILE_NAME");
         return false;
     }
-    const std::string path = _renameTarget;
     if (!getModel()->getRecordedFileInfoByPath(path))
         return true;
     const size_t nameStart = path.rfind('/') + 1;

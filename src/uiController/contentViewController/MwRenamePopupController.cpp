@@ -271,7 +271,8 @@ void MwRenamePopupController::_entryActivatedCb(void* data, Evas_Object* entry, 
 {
     auto* self = static_cast<MwRenamePopupController*>(data);
     elm_object_focus_set(entry, EINA_TRUE);
-    self->_respond(self->_entryText().c_str(), RESPONSE_RENAME);
+    if (self->_entryStringCheck()) // as the button, which is disabled otherwise
+        self->_respond(self->_entryText().c_str(), RESPONSE_RENAME);
 }
 
 // Getting the keyboard drops the selection made before; typing must replace the name.
