@@ -33,6 +33,12 @@ def walk_recordings(place, bus):
     place.wait_for("the player's names",
                    lambda: has_named(bus, panel) and {"Pause", "Play"} & set(buttons(bus)))
     assert ("slider", "Position") in [(role, name) for _, role, name in bus.controls()], "the slider's name"
+    place.click(885, 911)  # trim
+    bars = {("slider", "Start"), ("slider", "Position"), ("slider", "End")}
+    place.wait_for("the names of the trim panel", lambda: has_named(bus, ["Cancel", "Play", "Save"])
+                   and bars <= {(role, name) for _, role, name in bus.controls()})
+    place.click(178, 911)  # cancel
+    place.wait_for("the player again", lambda: has_named(bus, panel))
     place.click(50, 40)
     place.wait_for("the list again", lambda: not has_named(bus, ["Bookmark"]))
     place.click(50, 40)

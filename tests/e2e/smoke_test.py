@@ -4,6 +4,7 @@ import glob
 import os
 import shutil
 import signal
+import sqlite3
 import subprocess
 import sys
 import time
@@ -74,6 +75,9 @@ def record_pause_bookmark_stop(place):
     check(abs(decoded_ms(path) - recorded * 1000) < 900, f"{decoded_ms(path)} ms of {recorded * 1000:.0f}")
     check(abs(decoded_ms(path) - duration) < 100, "the row tells the length of the file")
     check(not glob.glob(place.env["MEWLO_DEVICE_ROOT"] + "/.mw_*"), "nothing is left beside it")
+    with sqlite3.connect(place.env["XDG_DATA_HOME"] + "/mewlo-lite/media.db") as catalogue:
+        waveforms = catalogue.execute("SELECT WAVEFORM_PATH, max(WAVEFORM_SAMPLES) > zeroblob(180) FROM waveform").fetchall()
+    check(waveforms == [(path, 1)], f"its waveform was measured while it was recorded: {waveforms}")
 
 
 def killed_recorder_loses_nothing(place):
