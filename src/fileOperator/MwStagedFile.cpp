@@ -14,6 +14,7 @@
 #include "MwFileCopy.h"
 #include "MwFiles.h"
 #include "MwLog.h"
+#include "MwStorageRoots.h"
 #include "MwText.h"
 
 namespace {
@@ -112,14 +113,27 @@ bool MwStagedFile::stage(unsigned int chunksPerReport, const Report& report, con
     return complete && !cancelled;
 }
 
+// The two change places, so that the replaced file can go to the trash; a private one, and where they cannot, for good.
+bool MwStagedFile::_replace(const std::string& from, const std::string& destination)
+{
+    if (::renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, destination.c_str(), RENAME_EXCHANGE) == 0) {
+        const bool isPrivate = destination.starts_with(mwPrivateRoot() + "/");
+        if (isPrivate || storage_move_to_trash(from.c_str(), destination.c_str()) != 0)
+            ::unlink(from.c_str());
+        return true;
+    }
+    if (::rename(from.c_str(), destination.c_str()) == 0)
+        return true;
+    MW_LOGE("rename failed : [%d]!!!", errno);
+    return false;
+}
+
 MwStagedFile::Outcome MwStagedFile::publish(const std::string& destination, bool replace)
 {
     const std::string& from = _kind == Kind::SOURCE_ITSELF ? _source : _path;
     if (replace) {
-        if (::rename(from.c_str(), destination.c_str()) != 0) {
-            MW_LOGE("rename failed : [%d]!!!", errno);
+        if (!_replace(from, destination))
             return Outcome::FAILED;
-        }
     } else if (const auto moved = MwFiles::moveWithoutOverwriting(from, destination); moved != MwFiles::Move::DONE) {
         return moved == MwFiles::Move::EXISTS ? Outcome::EXISTS : Outcome::FAILED;
     }

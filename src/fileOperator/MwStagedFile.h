@@ -37,6 +37,7 @@ private:
     enum class Kind { NONE, LINK, COPY, SOURCE_ITSELF };
 
     bool _link();
+    static bool _replace(const std::string& from, const std::string& destination);
     void _discard();
 
     std::string _source;

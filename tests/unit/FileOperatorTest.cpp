@@ -168,6 +168,27 @@ TEST_F(FileOperatorTest, ClashIsAnsweredByTheUser)
     }
 }
 
+TEST_F(FileOperatorTest, WhatIsReplacedGoesToTheTrashUnlessItIsPrivate)
+{
+    const std::string trash = std::string(std::getenv("XDG_DATA_HOME")) + "/Trash";
+    _answer = MwClashAction::REPLACE;
+    for (const bool intoPrivate : {false, true}) {
+        SCOPED_TRACE(intoPrivate);
+        fs::remove_all(trash);
+        writeFile(recordingPath("a.m4a"), intoPrivate ? "new" : "old");
+        writeFile(privatePath("a.m4a"), intoPrivate ? "old" : "new");
+        media_content_scan_all();
+        const auto type = intoPrivate ? MwFileOperator::MOVE_TO_PRIVATE : MwFileOperator::REMOVE_FROM_PRIVATE;
+        ASSERT_TRUE(run(type, {intoPrivate ? recordingPath("a.m4a") : privatePath("a.m4a")}));
+        EXPECT_EQ(
+            (Files{{"a.m4a", "new"}}), filesIn(intoPrivate ? privateDirectory() : support::recordingsDirectory()));
+        EXPECT_EQ(Files(), filesIn(intoPrivate ? support::recordingsDirectory() : privateDirectory()));
+        EXPECT_EQ(intoPrivate ? Files() : (Files{{"a.m4a", "old"}}), filesIn(trash + "/files"));
+        EXPECT_EQ(1U, rows().size());
+    }
+    fs::remove_all(trash);
+}
+
 TEST_F(FileOperatorTest, AnswerForAllIsAskedForOnce)
 {
     std::vector<std::string> paths;
