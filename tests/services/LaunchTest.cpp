@@ -242,6 +242,7 @@ TEST_F(LaunchTest, RunningTargetGetsLaterRequestsOverTheBus)
     ASSERT_EQ(0, single.send(outcome));
     ASSERT_TRUE(waitForReply(outcome));
     EXPECT_EQ(0, outcome.result);
+    ASSERT_TRUE(waitForNote("reply 0")); // the reply may be here before the peer has noted that it was sent
     EXPECT_EQ("create\nfirst \nresume\nagain stay\nreply 0\n", notes());
 
     Outcome killed;
