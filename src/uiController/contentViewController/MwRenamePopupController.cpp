@@ -271,8 +271,10 @@ void MwRenamePopupController::_entryActivatedCb(void* data, Evas_Object* entry, 
 {
     auto* self = static_cast<MwRenamePopupController*>(data);
     elm_object_focus_set(entry, EINA_TRUE);
-    if (self->_entryStringCheck()) // as the button, which is disabled otherwise
-        self->_respond(self->_entryText().c_str(), RESPONSE_RENAME);
+    // The name that it has already is no answer, as with the button; one that cannot be is refused with a message.
+    const std::string text = self->_entryText();
+    if (text != mwAdopt(elm_entry_markup_to_utf8(self->_initialText.c_str())))
+        self->_respond(text.c_str(), RESPONSE_RENAME);
 }
 
 // Getting the keyboard drops the selection made before; typing must replace the name.
