@@ -92,6 +92,7 @@ int recorder_commit(recorder_h recorder);
 int recorder_cancel(recorder_h recorder);
 // The largest peak since the last read, -300 to 0.
 int recorder_get_audio_level(recorder_h recorder, double* level);
-// Whether another recorder captures sound now (with PREFERENCE_STRICT_RECORDERS, any program). Kind 0 is audio, 1 video (always false: no such query).
+// Whether another recorder captures sound now (with PREFERENCE_STRICT_RECORDERS, any program). Kind 0 is audio, 1 video
+// (always false: no such query).
 int recorder_is_in_recording(int kind, bool* in_recording);
 }
