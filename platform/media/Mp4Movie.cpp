@@ -486,11 +486,11 @@ std::string Mp4Movie::indexOf(const Mp4Part& part, uint64_t dataOffset) const
         if (!parsed)
             return std::string(box.whole);
         parsed->duration = duration;
-        // GStreamer ends a file when its frames, counted from the hidden ones on, reach the length of the movie.
-        if (box.type == "mvhd")
+        if (box.type == "mvhd") {
+            // GStreamer ends a file when its frames, counted from the hidden ones on, reach the length of the movie.
             parsed->duration += timeOf(frameAt(timeOf(part.first) + hidden)) - timeOf(part.first);
-        if (box.type == "mvhd")
             parsed->between = u32(_scale);
+        }
         return parsed->write(box.type);
     };
     const auto stbl = [&](const Mp4Box& box) { return box.type == "stsd" ? std::string(box.whole) : std::string(); };

@@ -75,7 +75,6 @@ struct StreamCut::Output {
     int64_t end = 0;
     bool hasHead = false;
     AvCodec encoder;
-    int64_t lastDts = AV_NOPTS_VALUE;
 };
 
 StreamCut::StreamCut(FileDescriptor source, const char* container, AVCodecID codec)
@@ -159,7 +158,7 @@ int StreamCut::_put(Output& output, AVPacket* packet)
     return errorOf(av_interleaved_write_frame(output.context.get(), packet));
 }
 
-int StreamCut::_copy(Output& output, const Range& range, ExportWatch& watch)
+int StreamCut::_copy(Output& output, ExportWatch& watch)
 {
     const AVCodecParameters* parameters = output.from->codecpar;
     const AVRational samples{1, std::max(1, parameters->sample_rate)};
@@ -204,7 +203,6 @@ int StreamCut::_copy(Output& output, const Range& range, ExportWatch& watch)
     }
     if (code < 0 && code != AVERROR_EOF)
         return errorOf(code);
-    (void)range;
     return output.hasHead ? errorOf(av_write_trailer(output.context.get())) : EBADMSG;
 }
 
@@ -213,7 +211,7 @@ int StreamCut::_write(const Range& range, int target, ExportWatch& watch)
     Output output;
     int error = _begin(output, range, target);
     if (error == 0)
-        error = _codec == AV_CODEC_ID_FLAC ? _encode(output, range, watch) : _copy(output, range, watch);
+        error = _codec == AV_CODEC_ID_FLAC ? _encode(output, watch) : _copy(output, watch);
     if (error == 0 && output.context->pb->error < 0)
         error = errorOf(output.context->pb->error);
     return error;
@@ -228,7 +226,7 @@ int StreamCut::_lengthOf(int target) const
     return static_cast<int>(written->duration * 1000 / AV_TIME_BASE);
 }
 
-int StreamCut::_encode(Output& output, const Range&, ExportWatch& watch)
+int StreamCut::_encode(Output& output, ExportWatch& watch)
 {
     const AvCodec decoder = decoderOf(output.from);
     const AVCodec* kind = avcodec_find_encoder(_codec);

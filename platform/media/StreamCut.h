@@ -21,9 +21,9 @@ private:
     [[nodiscard]] int _tolerance() const override { return _frameMs * FRAMES_OF_TOLERANCE; }
 
     int _begin(Output& output, const Range& range, int target);
-    int _copy(Output& output, const Range& range, ExportWatch& watch);
+    int _copy(Output& output, ExportWatch& watch);
     int _put(Output& output, AVPacket* packet);
-    int _encode(Output& output, const Range& range, ExportWatch& watch);
+    int _encode(Output& output, ExportWatch& watch);
 
     static constexpr int FRAMES_OF_TOLERANCE = 3; // what some containers count of the codec's own delay
 
