@@ -304,7 +304,13 @@ void MwRecordingsContentViewController::_trimViewEvent(int event)
         getModel()->setCurrentPlayPosition(0);
         _reloadNeeded = true;
     }
-    _updateLater();
+    const auto alive = token();
+    WTimer::addJob([this, alive](void*) {
+        if (alive.expired())
+            return;
+        _update();
+        _focusList(); // what had the keyboard is gone
+    });
 }
 
 void MwRecordingsContentViewController::_playViewEvent(int event)
