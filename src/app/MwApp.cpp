@@ -16,13 +16,13 @@
 
 #include "MwAppController.h"
 #include "MwHandle.h"
+#include "MwLaunchRequests.h"
 #include "MwLog.h"
 #include "MwModel.h"
 #include "MwRecorder.h"
 #include "MwRecorderContentViewController.h"
 #include "MwRecordingRescue.h"
 #include "MwRecordingsContentViewController.h"
-#include "MwRequestParser.h"
 #include "MwResourceMgr.h"
 #include "MwSignalMgr.h"
 #include "MwSystemMgr.h"
@@ -35,9 +35,7 @@ constexpr auto WINDOW_NAME = "com.tovanic.mewlo-lite";
 constexpr int WINDOW_TYPE = 1;
 constexpr double BASE_SCALE = 2.6;
 constexpr int INDICATOR_SHOWN = 2, INDICATOR_TRANSPARENT = 3;
-constexpr auto STATE_PREFERENCE = "MainRecordingState";
 constexpr auto STOP_PREFERENCE = "MainRecordingStopRequest";
-constexpr int SMALLEST_REFUSED_LIMIT = 2; // kilobytes
 constexpr int LOWEST_ALLOWED_BATTERY = 2;
 constexpr std::array<const char*, 2> THEME_EXTENSIONS = {"edje/MwGenlist.edj", "edje/MwButton.edj"};
 
@@ -79,6 +77,7 @@ bool MwApp::onCreate()
     _model->setAppState(MwModel::APP_STATE_CREATED);
     if (!_appController)
         _appController = std::make_unique<MwAppController>();
+    _requests = std::make_unique<MwLaunchRequests>(*_model);
     MwSystemMgr::getInstance()->initialize(_model.get());
     return true;
 }
@@ -187,48 +186,14 @@ void MwApp::onAppControl(app_control_h request, bool firstLaunch)
         MW_LOGE("_appController is nullptr");
         return;
     }
-    _parseRequest(request);
-    _model->setRequestHandle(request);
-    if (_refuseTinyRequest())
+    const bool records = _model->isStorageHeld();
+    if (_requests->receive(request) == MwLaunchRequests::REFUSED && !records) {
+        ui_app_exit();
         return;
+    }
     if (firstLaunch)
         _launchFirst();
     MW_LOGI("END");
-}
-
-// A request that comes while a recording runs must not change what is being written.
-void MwApp::_parseRequest(app_control_h request)
-{
-    const int codec = _model->getAudioCodec();
-    const int format = _model->getFileFormat();
-    const int sampleRate = _model->getSampleRate();
-    const int bitRate = _model->getBitRate();
-    MwRequestParser().parse(request, _model.get());
-    const int state = _model->getRecorderState();
-    if (state != MwRecorder::REC_STATE_RECORDING && state != MwRecorder::REC_STATE_PAUSED)
-        return;
-    _model->setAudioCodec(codec);
-    _model->setFileFormat(format);
-    _model->setSampleRate(sampleRate);
-    _model->setBitRate(bitRate);
-}
-
-// A limit so small that no recording fits is answered at once; the instance then ends.
-bool MwApp::_refuseTinyRequest()
-{
-    if (_model->getSizeLimit() > SMALLEST_REFUSED_LIMIT)
-        return false;
-    app_control_h reply = nullptr;
-    if (const int result = app_control_create(&reply); result != 0) {
-        MW_LOGE("app_control_create failed:[%d]", result);
-        return true;
-    }
-    MW_CALL(app_control_add_extra_data, reply, "error", "min_size_error");
-    MW_CALL(app_control_reply_to_launch_request, reply, _model->getRequestHandle(), APP_CONTROL_RESULT_FAILED);
-    app_control_destroy(reply);
-    _model->setRequestHandle(nullptr);
-    ui_app_exit();
-    return true;
 }
 
 void MwApp::_launchFirst()
@@ -238,6 +203,7 @@ void MwApp::_launchFirst()
         MW_LOGE("MwAppController initialize failed!");
         return;
     }
+    _appController->getRecorderUpdatedSignal().addListener([this] { _requests->recorderUpdated(); });
     _appController->setRecordingsOpener([this] { _openRecordings(); });
     panekit::WNaviframeController* naviframe = getWindow()->getBaseViewController();
     naviframe->setOnLastItemPop([this] { return _lastItemPopped(); });
@@ -321,14 +287,13 @@ void MwApp::onTerminate()
     MwSystemMgr::destroyInstance();
     MwResourceMgr::destroyInstance();
     _appController.reset();
+    _requests.reset();
     _model.reset();
 }
 
 void MwApp::_checkMainAppRecordingState()
 {
-    int state = MwRecorder::REC_STATE_NONE;
-    preference_get_int(STATE_PREFERENCE, &state);
-    if (state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED) {
+    if (MwModel::isMainInstanceRecording()) {
         MW_LOGI("main app state is recording. display check popup");
         if (_mainAppRecordingPopup == nullptr)
             _createMainAppRecordingPopup();

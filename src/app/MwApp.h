@@ -8,6 +8,7 @@
 #include <string>
 
 class MwAppController;
+class MwLaunchRequests;
 class MwModel;
 class MwRecordingRescue;
 
@@ -39,8 +40,6 @@ private:
     static void _unsetThemeExtension();
     static void _connectMediaContentDB();
     static void _disconnectMediaContentDB();
-    void _parseRequest(app_control_h request);
-    bool _refuseTinyRequest();
     void _launchFirst();
     bool _lastItemPopped();
     void _openRecordings();
@@ -56,6 +55,7 @@ private:
     panekit::WAppEventHandler _lowBatteryHandler;
     std::unique_ptr<MwModel> _model;
     std::unique_ptr<MwAppController> _appController;
+    std::unique_ptr<MwLaunchRequests> _requests;
     uxt_color_table_h _changeableColorTable = nullptr;
     uxt_font_table_h _changeableFontTable = nullptr;
     panekit::WPopupController* _mainAppRecordingPopup = nullptr;

@@ -42,6 +42,7 @@ bool MwRequestParser::parse(app_control_h request, MwModel* model)
 void MwRequestParser::_resetData(MwModel* model)
 {
     model->setRequestMode(false);
+    model->setTypeRequested(false);
     model->setAudioCodec(MwModel::CODEC_AAC);
     model->setFileFormat(MwModel::FORMAT_MP4);
     model->setSampleRate(SAMPLE_RATE);
@@ -69,6 +70,7 @@ void MwRequestParser::_parseExtraData(app_control_h request, MwModel* model)
     if (app_control_get_mime(request, &text) == 0 && text != nullptr) {
         const std::string mime = mwAdopt(text);
         MW_LOGI("[MIME: %s]", mime.c_str());
+        model->setTypeRequested(!mime.ends_with("/*"));
         if (mime.find("AMR") != std::string::npos || mime.find("amr") != std::string::npos) {
             model->setAudioCodec(MwModel::CODEC_AMR);
             model->setFileFormat(MwModel::FORMAT_AMR);

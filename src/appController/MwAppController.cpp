@@ -121,6 +121,9 @@ void MwAppController::deinitialize()
         if (_recorder && records && !dispatchCommand(STOP_RECORDING))
             MW_LOGE("recording stop failed");
     }
+    // Whatever closed the window: a saved recording is the answer.
+    if (_model->getRequestHandle() != nullptr && !_model->getAnswerPath().empty())
+        _replyWithRecording();
     if (!_destroyRecorder())
         MW_LOGE("recorder destroy filaed");
     if (!_destroyPlayer())
@@ -328,6 +331,9 @@ void MwAppController::_releaseLock()
 
 void MwAppController::openRecordings()
 {
+    if (_model != nullptr && _model->getRequestHandle() != nullptr && !_model->getAnswerPath().empty()
+        && !_model->hasRequestChoice())
+        return replyAndExit();
     if (_recordingsOpener)
         _recordingsOpener();
 }

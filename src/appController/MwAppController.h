@@ -68,7 +68,8 @@ public:
     panekit::WSignal<void()>& getPlayerUpdatedSignal() { return _playerUpdatedSignal; }
     panekit::WSignal<void()>& getRecorderUpdatedSignal() { return _recorderUpdatedSignal; }
 
-    // What opens the recordings after a stop. Handed in at start-up so that the controller knows no screen.
+    // What opens the recordings after a stop, unless the recording is all that a request can get: then it is the
+    // answer. Handed in at start-up so that the controller knows no screen.
     void setRecordingsOpener(std::function<void()> opener) { _recordingsOpener = std::move(opener); }
     void openRecordings();
 

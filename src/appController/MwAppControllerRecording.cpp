@@ -105,6 +105,7 @@ bool MwAppController::_setUpRecording()
 bool MwAppController::_setUpRecorder()
 {
     _lastSavedPath.clear();
+    _model->setAnswerPath({});
     _wasDiscarded = false;
     _model->clearBookMark();
     _model->setElapsedTime(0);
@@ -193,9 +194,9 @@ bool MwAppController::_cancelRecording(bool interrupted)
     _model->setRecorderState(MwRecorder::REC_STATE_READY);
     _model->clearBookMark();
     _model->windBackRecordingFileName();
-    _model->releaseStorage();
     _wasDiscarded = cancelled;
     _releaseLock();
+    _model->releaseStorage();
     return cancelled;
 }
 
@@ -248,8 +249,8 @@ bool MwAppController::_stopRecording(bool interrupted)
     }
     if (_lastSavedPath.empty())
         mwPost("IDS_MW_TPOP_RECORDING_NOT_COMPLETED_KEPT_FOR_THE_NEXT_START");
-    _model->releaseStorage();
     _releaseLock();
+    _model->releaseStorage();
     return stopped;
 }
 
@@ -285,6 +286,8 @@ bool MwAppController::_saveRecordingFile()
         path = _model->getRecordingPath(name, counter);
     }
     _lastSavedPath = path;
+    if (_model->isRequestMode())
+        _model->setAnswerPath(path);
     std::string mediaId;
     _insertRecordedFileToDB(path.c_str(), mediaId);
     if (mediaId.empty()) {
@@ -452,13 +455,12 @@ bool MwAppController::_replyWithRecording()
         MW_LOGE("app_control_create failed:[%d]", result);
         return false;
     }
-    const std::string name = _model->getCurrentRecordingFileName();
-    if (name.empty()) {
+    // What was really written counts, under the name that it got; a discarded or unsaved one is no answer.
+    const std::string path = _model->getAnswerPath();
+    if (path.empty() || !_model->fitsRequest(path)) {
         MW_CALL(
             app_control_reply_to_launch_request, reply.get(), _model->getRequestHandle(), APP_CONTROL_RESULT_FAILED);
     } else {
-        // The name may have been taken, then the file got a counter; what was really written counts.
-        const std::string path = _lastSavedPath.empty() ? _model->getRecordingPath(name) : _lastSavedPath;
         MW_CALL(app_control_add_extra_data, reply.get(), APP_CONTROL_DATA_SELECTED, path.c_str());
         MW_CALL(
             app_control_reply_to_launch_request, reply.get(), _model->getRequestHandle(), APP_CONTROL_RESULT_SUCCEEDED);

@@ -4,7 +4,14 @@
 #include <preference.h>
 #include <vconf.h>
 
+#include <unistd.h>
+
 #include <algorithm>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <utility>
 
 #include "MwLog.h"
 #include "MwRecorder.h"
@@ -17,8 +24,27 @@ namespace {
 
 constexpr auto STORAGE_PREFERENCE_KEY = "preference/com.tovanic.mewlo-lite/storage";
 constexpr auto RECORDING_STATE_KEY = "MainRecordingState";
+constexpr auto RECORDING_PROCESS_KEY = "MainRecordingProcess";
+constexpr auto RECORDING_PROCESS_START_KEY = "MainRecordingProcessStart";
 constexpr int CARD_MOUNTED = 1;
 constexpr size_t MAX_MESSAGE_BYTES = 1024;
+
+// A number alone may be another process's by now: with the moment of its start it names one. Zero start: none such.
+std::pair<int, int> identityOf(int process)
+{
+    constexpr int FIELDS_TO_START = 20; // behind the name, which ends with the last parenthesis
+    std::ifstream file("/proc/" + std::to_string(process) + "/stat");
+    std::string line;
+    std::getline(file, line);
+    const size_t name = line.rfind(')');
+    if (name == std::string::npos)
+        return {process, 0};
+    std::istringstream fields(line.substr(name + 1));
+    std::string field;
+    for (int i = 0; i < FIELDS_TO_START; ++i)
+        fields >> field;
+    return {process, static_cast<int>(std::strtoul(field.c_str(), nullptr, 10) & 0x7FFFFFFF)};
+}
 
 void postTooManyBookmarks()
 {
@@ -39,8 +65,25 @@ void MwModel::setRecorderState(int state)
         vconf_set_int(VCONFKEY_MEWLO_RECORDER_STATE, state);
         vconf_set_str(VCONFKEY_MEWLO_TITLE, getCurrentRecordingFileName().c_str());
     }
-    if (!_requestMode)
-        MW_CALL(preference_set_int, RECORDING_STATE_KEY, state);
+    if (_requestMode)
+        return;
+    const auto [process, start] = identityOf(::getpid());
+    MW_CALL(preference_set_int, RECORDING_PROCESS_KEY, process);
+    MW_CALL(preference_set_int, RECORDING_PROCESS_START_KEY, start);
+    MW_CALL(preference_set_int, RECORDING_STATE_KEY, state);
+}
+
+bool MwModel::isMainInstanceRecording()
+{
+    int state = MwRecorder::REC_STATE_NONE;
+    int process = 0;
+    int start = 0;
+    if (preference_get_int(RECORDING_STATE_KEY, &state) != 0
+        || (state != MwRecorder::REC_STATE_RECORDING && state != MwRecorder::REC_STATE_PAUSED))
+        return false;
+    return preference_get_int(RECORDING_PROCESS_KEY, &process) == 0
+        && preference_get_int(RECORDING_PROCESS_START_KEY, &start) == 0 && process > 0
+        && identityOf(process) == std::pair{process, start};
 }
 
 void MwModel::holdStorage()
@@ -174,9 +217,27 @@ bool MwModel::saveRecordingNotes() const
 
 void MwModel::setRequestHandle(app_control_h request)
 {
+    setAnswerPath({});
     _request.close();
     if (request == nullptr)
         return;
     if (const int result = app_control_clone(_request.out(), request); result != 0)
         MW_LOGE("app_control_clone failed:[%d]", result);
+}
+
+bool MwModel::fitsRequest(const std::string& path) const
+{
+    constexpr uintmax_t KILOBYTE = 1024;
+    std::error_code error;
+    const uintmax_t size = std::filesystem::file_size(path, error);
+    return !error && size <= static_cast<uintmax_t>(std::max(0, getSizeLimit())) * KILOBYTE
+        && (!_typeRequested || path.ends_with(getFileExtension()));
+}
+
+bool MwModel::hasRequestChoice()
+{
+    createRecordedFileList();
+    return std::count_if(_recordedFiles.begin(), _recordedFiles.end(), [this](const MwFileInfo& info) {
+        return fitsRequest(info.path);
+    }) > 1;
 }

@@ -71,6 +71,8 @@ public:
     // to the card and the choice.
     void holdStorage();
     void releaseStorage();
+    // Whether a recording is under way: from before its start until its save has ended.
+    [[nodiscard]] bool isStorageHeld() const { return _heldStorage().has_value(); }
     [[nodiscard]] MwStorageType getStorageType() const;
     // The stored choice, whether or not a card is mounted.
     [[nodiscard]] MwStorageType getStorageChoice() const;
@@ -102,14 +104,26 @@ public:
     bool saveRecordingNotes() const;
 
     // The request to reply to: a clone owned by the model, null to forget it.
+    // Another request has no answer yet.
     void setRequestHandle(app_control_h request);
     [[nodiscard]] app_control_h getRequestHandle() const { return _request.get(); }
+    // The recording that was saved for the request; empty when there is none.
+    void setAnswerPath(const std::string& path) { _setText(_answerPath, path); }
+    [[nodiscard]] std::string getAnswerPath() const { return _text(_answerPath); }
+
+    // Whether a file is there, of the type that was asked for, and no larger.
+    [[nodiscard]] bool fitsRequest(const std::string& path) const;
+    // Whether several recordings of the catalogue, read anew, fit.
+    [[nodiscard]] bool hasRequestChoice();
+    void setTypeRequested(bool requested) { _typeRequested = requested; }
 
     int getAppState() const { return _appState; }
     void setAppState(int state) { _appState = state; }
     int getRecorderState() const { return _recorderState; }
     // Also publishes the state to other instances, unless this one serves a request.
     void setRecorderState(int state);
+    // What an instance published that still runs: whether it records or holds a recording.
+    [[nodiscard]] static bool isMainInstanceRecording();
     int getAudioCodec() const { return _audioCodec; }
     void setAudioCodec(int codec) { _audioCodec = codec; }
     int getFileFormat() const { return _fileFormat; }
@@ -185,7 +199,7 @@ private:
 
     mutable std::mutex _storageMutex; // guards the next one; nothing else is locked under it
     std::optional<Storage> _storage; // of the running recording
-    mutable std::mutex _mutex; // guards names, numbers, play path and bookmarks
+    mutable std::mutex _mutex; // guards names, numbers, paths and bookmarks
     std::atomic<int> _appState = APP_STATE_CREATED;
     std::atomic<int> _recorderState = 0;
     std::atomic<int> _audioCodec = CODEC_AAC;
@@ -202,8 +216,10 @@ private:
     std::atomic<double> _level = SILENCE;
     std::atomic<int> _playerState = 0;
     std::string _playPath;
+    std::string _answerPath;
     std::atomic<unsigned int> _playPosition = 0;
     std::atomic<bool> _requestMode = false;
+    std::atomic<bool> _typeRequested = false;
     std::atomic<bool> _trimMode = false;
     std::atomic<bool> _playView = false;
     RequestHandle _request;

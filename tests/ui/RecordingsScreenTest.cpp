@@ -307,7 +307,9 @@ TEST_F(RecordingsScreenTest, EventsOfTheDeviceStopPauseAndTell)
 
 TEST_F(RecordingsScreenTest, ARequestGetsTheChosenRecording)
 {
-    ui::enterRecordings({"A.m4a", "B.m4a", "C.m4a"});
+    ui::enterRecordings({"A.m4a", "B.m4a", "C.m4a", "Gone.m4a"});
+    for (const char* name : {"A.m4a", "B.m4a", "C.m4a"})
+        support::writeFile(ui::recordingPath(name), "x");
     RecordingsScreen screen(RecordingsScreen::Mode::Request);
     screen.model.setCurrentRecordingFileName("B");
     screen.open();
@@ -317,6 +319,7 @@ TEST_F(RecordingsScreenTest, ARequestGetsTheChosenRecording)
     Evas_Object* chosen = screen.choice("B.m4a");
     ASSERT_NE(nullptr, chosen);
     EXPECT_EQ(elm_radio_state_value_get(chosen), elm_radio_value_get(chosen));
+    EXPECT_EQ(3U, screen.names().size()) << "what is not there is not offered";
     // The choice stays with its recording while others come and go.
     media_info_delete_from_db(ui::recordingPath("A.m4a").c_str());
     screen.announce(MwSignalMgr::MEDIA_DB_UPDATED);
@@ -327,9 +330,22 @@ TEST_F(RecordingsScreenTest, ARequestGetsTheChosenRecording)
     EXPECT_TRUE(fakes::calls.has("ui_app_exit"));
 }
 
+TEST_F(RecordingsScreenTest, ARequestIsOfferedOnlyWhatFitsTypeAndSize)
+{
+    ui::enterRecordings({"A.m4a", "B.amr", "C.amr"});
+    support::writeFile(ui::recordingPath("C.amr"), std::string(20 * 1024 + 1, 'x'));
+    support::writeFile(ui::recordingPath("B.amr"), std::string(20 * 1024, 'x'));
+    RecordingsScreen screen(RecordingsScreen::Mode::Request);
+    screen.model.setTypeRequested(true);
+    screen.model.setFileFormat(MwModel::FORMAT_AMR);
+    screen.model.setSizeLimit(20);
+    screen.open();
+    EXPECT_EQ(std::vector<std::string>{"B.amr"}, screen.names());
+}
+
 TEST_F(RecordingsScreenTest, NothingIsChosenForARequestUntilATap)
 {
-    ui::enterRecordings({"A.m4a"});
+    support::writeFile(ui::enterRecordings({"A.m4a"}), "x");
     RecordingsScreen screen(RecordingsScreen::Mode::Request);
     screen.open();
     EXPECT_FALSE(isDoneEnabled(screen));

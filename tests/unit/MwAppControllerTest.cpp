@@ -355,16 +355,47 @@ TEST_F(MwAppControllerTest, PauseInRequestModeSavesRepliesAndExits)
     EXPECT_EQ(nullptr, _model.getRequestHandle());
     EXPECT_TRUE(calls.has("ui_app_exit"));
 
-    _model.setCurrentRecordingFileName("");
     _model.setRequestHandle(request);
+    startRecording();
+    EXPECT_TRUE(dispatch(MwAppController::CANCEL_RECORDING));
     lifeCycle(MwSignalMgr::PAUSE);
     EXPECT_EQ(APP_CONTROL_RESULT_FAILED, fakes::reply.result);
+    EXPECT_TRUE(fakes::reply.extras.empty()) << "a discarded one is no answer";
     _model.setRequestHandle(request);
     calls.clear();
     calls.failWith("app_control_create", -1);
     lifeCycle(MwSignalMgr::PAUSE);
     EXPECT_FALSE(calls.has("ui_app_exit"));
     app_control_destroy(request);
+}
+
+TEST_F(MwAppControllerTest, ASavedRecordingIsTheAnswerWhateverEndsTheRequest)
+{
+    struct {
+        const char* way;
+        std::function<void()> end;
+    } const ways[] = {
+        {"the list would open", [&] { _controller.openRecordings(); }},
+        {"the window is closed", [&] { _controller.deinitialize(); }},
+    };
+    for (const auto& [way, end] : ways) {
+        SCOPED_TRACE(way);
+        app_control_h request = fakes::makeRequest(APP_CONTROL_OPERATION_CREATE_CONTENT);
+        _model.setRequestMode(true);
+        _model.setRequestHandle(request);
+        _model.setRenameString(way);
+        startRecording();
+        EXPECT_TRUE(dispatch(MwAppController::STOP_RECORDING));
+        const std::string path = _controller.getLastSavedPath();
+        end();
+        EXPECT_EQ(APP_CONTROL_RESULT_SUCCEEDED, fakes::reply.result);
+        EXPECT_EQ(path, fakes::reply.extras[APP_CONTROL_DATA_SELECTED]);
+        EXPECT_EQ(nullptr, _model.getRequestHandle());
+        fakes::reply = {};
+        app_control_destroy(request);
+        std::filesystem::remove_all(support::recordingsDirectory());
+    }
+    EXPECT_EQ(0, _opened) << "there was nothing to choose";
 }
 
 TEST_F(MwAppControllerTest, MediaKeysDriveTheRecording)

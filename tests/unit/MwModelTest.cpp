@@ -1,3 +1,6 @@
+#include <sys/wait.h>
+#include <unistd.h>
+
 #include "MwModel.h"
 
 #include <gtest/gtest.h>
@@ -250,6 +253,21 @@ TEST_F(MwModelTest, PublishesItsStateUnlessItServesARequest)
     _model.setRecorderState(2);
     ASSERT_EQ(0, preference_get_int("MainRecordingState", &published));
     EXPECT_EQ(2, published);
+    EXPECT_TRUE(MwModel::isMainInstanceRecording());
+    const pid_t another = ::fork();
+    if (another == 0) {
+        MwModel().setRecorderState(2);
+        ::_exit(MwModel::isMainInstanceRecording() ? 0 : 1);
+    }
+    int status = 1;
+    ::waitpid(another, &status, 0);
+    EXPECT_EQ(0, status);
+    EXPECT_FALSE(MwModel::isMainInstanceRecording()) << "its owner is gone";
+    preference_set_int("MainRecordingProcess", ::getpid()); // the number again, for another process
+    EXPECT_FALSE(MwModel::isMainInstanceRecording());
+    _model.setRecorderState(1);
+    EXPECT_FALSE(MwModel::isMainInstanceRecording());
+    _model.setRecorderState(2);
     _model.setRequestMode(true);
     _model.setRecorderState(3);
     preference_get_int("MainRecordingState", &published);

@@ -6,6 +6,7 @@
 
 #include "MwFeatureChecker.h"
 #include "MwFiles.h"
+#include "MwLaunchRequests.h"
 #include "MwModel.h"
 #include "MwRecordingNotes.h"
 #include "MwRecordingRescue.h"
@@ -206,6 +207,57 @@ TEST(MwRequestParserTest, ReadsModeFormatAndLimit)
         EXPECT_EQ(c.limit, model.getSizeLimit());
         EXPECT_FALSE(MwRequestParser().parse(request, nullptr) || MwRequestParser().parse(nullptr, &model));
         app_control_destroy(request);
+    }
+}
+
+TEST(MwLaunchRequestsTest, ATakeKeepsModeFormatAndRequest)
+{
+    constexpr auto CREATE = APP_CONTROL_OPERATION_CREATE_CONTENT;
+    using Result = MwLaunchRequests::Result;
+    struct {
+        const char* name;
+        bool serves; // during a take for a request
+        const char* operation;
+        const char* size;
+        Result result;
+        bool answered;
+        const char* error;
+        bool requestModeAfterwards;
+    } const cases[] = {
+        {"the icon is clicked", false, APP_CONTROL_OPERATION_MAIN, nullptr, Result::IGNORED, false, "", false},
+        {"the icon is clicked while another waits", true, APP_CONTROL_OPERATION_MAIN, nullptr, Result::IGNORED, false,
+            "", true},
+        {"too small", false, CREATE, "2", Result::REFUSED, true, "min_size_error", false},
+        {"one recording", false, CREATE, "300", Result::WAITS, false, "", true},
+        {"one recording while another waits", true, CREATE, "300", Result::REFUSED, true, "", true},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.name);
+        MwModel model;
+        MwLaunchRequests requests(model);
+        app_control_h first = fakes::makeRequest(c.serves ? CREATE : APP_CONTROL_OPERATION_MAIN, "audio/AMR", "500");
+        ASSERT_EQ(Result::TAKEN, requests.receive(first));
+        const app_control_h served = model.getRequestHandle();
+        model.setAnswerPath("/saved.amr");
+        model.holdStorage();
+        fakes::reset();
+        app_control_h second = fakes::makeRequest(c.operation, "audio/mp4", c.size);
+        EXPECT_EQ(c.result, requests.receive(second));
+        EXPECT_EQ(c.answered, calls.has("app_control_reply_to_launch_request"));
+        EXPECT_EQ(c.error, fakes::reply.extras["error"]);
+        requests.recorderUpdated();
+        EXPECT_EQ(c.serves, model.isRequestMode()) << "as long as the take lasts";
+        EXPECT_EQ(500, model.getSizeLimit());
+        EXPECT_EQ(MwModel::FORMAT_AMR, model.getFileFormat());
+        EXPECT_EQ(served, model.getRequestHandle());
+        model.releaseStorage();
+        requests.recorderUpdated();
+        EXPECT_EQ(c.requestModeAfterwards, model.isRequestMode());
+        EXPECT_EQ(c.result == Result::WAITS ? 300 : 500, model.getSizeLimit());
+        EXPECT_EQ(c.result == Result::WAITS ? "" : "/saved.amr", model.getAnswerPath())
+            << "an answer is for its own request";
+        app_control_destroy(first);
+        app_control_destroy(second);
     }
 }
 

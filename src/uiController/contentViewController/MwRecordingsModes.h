@@ -27,7 +27,7 @@ inline const MwRecordingsMode& mwRecordingsMode(MwRecordingsContentViewControlle
     constexpr auto DONE = "IDS_TPLATFORM_ACBUTTON_DONE_ABB";
     static constexpr std::array<MwRecordingsMode, 7> MODES = {{
         {"IDS_MW_HEADER_RECORDINGS_M_VOICE_ABB", Buttons::BACK, nullptr, Item::NO_CHOICE, Rows::ALL, true},
-        {"IDS_GALLERY_HEADER_SELECT", Buttons::CANCEL_AND_DONE, DONE, Item::SINGLE_CHOICE, Rows::ALL, true},
+        {"IDS_GALLERY_HEADER_SELECT", Buttons::CANCEL_AND_DONE, DONE, Item::SINGLE_CHOICE, Rows::FOR_REQUEST, true},
         {nullptr, Buttons::CANCEL_AND_DONE, "IDS_TPLATFORM_ACBUTTON_DELETE_ABB", Item::MULTIPLE_CHOICE, Rows::ALL,
             false},
         {nullptr, Buttons::CANCEL_AND_DONE, DONE, Item::MULTIPLE_CHOICE, Rows::ALL, false},

@@ -60,6 +60,8 @@ const std::vector<MwFileInfo>& MwRecordingsRows::_catalogue() const { return _co
 
 bool MwRecordingsRows::_accepts(const MwFileInfo& info) const
 {
+    if (_files == FOR_REQUEST)
+        return _context.model->fitsRequest(info.path);
     return _files == ALL || info.path.starts_with(_privateFolder) == (_files == IN_PRIVATE);
 }
 

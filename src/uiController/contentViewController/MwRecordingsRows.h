@@ -14,7 +14,7 @@
 // grows in slices of a few milliseconds. The genlist is borrowed and outlives this object. Main loop only.
 class MwRecordingsRows {
 public:
-    enum Files : int { ALL, OUTSIDE_PRIVATE, IN_PRIVATE };
+    enum Files : int { ALL, OUTSIDE_PRIVATE, IN_PRIVATE, FOR_REQUEST };
 
     MwRecordingsRows(Evas_Object* genlist, const MwRecordingsListItem::Context& context);
     ~MwRecordingsRows();

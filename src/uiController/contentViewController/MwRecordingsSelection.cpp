@@ -248,13 +248,16 @@ void MwRecordingsContentViewController::_titleRightButtonClicked()
 void MwRecordingsContentViewController::_replyWithSelected()
 {
     const MwRecordingsListItem* row = _rows->findByIndex(elm_radio_value_get(_radioGroup()));
+    if (!row || !getModel()->fitsRequest(row->getPath())) {
+        MW_LOGE("there is no such recording any more");
+        return;
+    }
     Request reply;
     if (const int result = app_control_create(reply.out()); result != 0) {
         MW_LOGE("app_control_create failed:[%d]", result);
         return;
     }
-    if (row)
-        MW_CALL(app_control_add_extra_data, reply.get(), APP_CONTROL_DATA_SELECTED, row->getPath().c_str());
+    MW_CALL(app_control_add_extra_data, reply.get(), APP_CONTROL_DATA_SELECTED, row->getPath().c_str());
     MW_CALL(
         app_control_reply_to_launch_request, reply.get(), getModel()->getRequestHandle(), APP_CONTROL_RESULT_SUCCEEDED);
     reply.close();
