@@ -52,8 +52,8 @@ int media_content_scan_folder(const char* directory, int* added, int* removed);
 int media_content_scan_all(void);
 // Catalogues one file anew, or drops its row when it is gone.
 int media_content_scan_file(const char* path);
-// Hold while changing a file together with its row (briefly: everybody else's wait for at most two seconds), so that no
-// scan of any process sees one without the other. Free it on any thread.
+// Hold while changing a file together with its row (briefly), so that no scan of any process sees one without the
+// other. Waits for others up to ten seconds, then answers DB_BUSY: not on the main loop. Free it on any thread.
 int media_content_lock_files(files_lock_h* lock);
 int media_content_unlock_files(files_lock_h lock);
 // Doubles quotes and drops what ends a condition text; newly allocated, to be put between double quotes.

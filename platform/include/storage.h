@@ -14,7 +14,8 @@ const char* storage_device_root(void);
 const char* storage_card_root(void);
 const char* storage_private_root(void);
 
-// Deletes a file: into the desktop's trash where its file system has one, else for good. 0, or a negative error number.
+// Deletes a file into the desktop's trash. Never deletes for good: -ENOTSUP where its file system has no trash, else 0
+// or a negative error number.
 int storage_trash_file(const char* path);
 // Moves a file, whatever it is called now, into the desktop's trash as if it had been deleted from the path `original`.
 // Never copies and never deletes: -ENOTSUP where its file system has no trash, else 0 or a negative error number.

@@ -22,7 +22,7 @@ namespace media {
 namespace {
 
     constexpr auto RECORDINGS_DIRECTORY = "/Sounds/Mewlo";
-    constexpr auto LOCK_PATIENCE = std::chrono::seconds(2);
+    constexpr auto LOCK_PATIENCE = std::chrono::seconds(10);
     constexpr auto LOCK_RETRY = std::chrono::milliseconds(10);
 
     using KnownRows = std::map<std::string, MediaRow>;
@@ -125,6 +125,8 @@ int scanFolders(Database& database, const std::vector<std::string>& folders, Sca
         return SQLITE_OK;
     // Rows that moved on in the meantime are under another path by now and not touched; files that came back stay.
     const FilesLock lock(database.path());
+    if (!lock.isHeld())
+        return SQLITE_BUSY;
     std::erase_if(changes.removed, [](const std::string& path) { return ::access(path.c_str(), F_OK) == 0; });
     return database.apply(changes);
 }
@@ -133,13 +135,14 @@ FilesLock::FilesLock(const std::string& databasePath)
     : _file(::open((databasePath + ".lock").c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600))
 {
     const auto end = std::chrono::steady_clock::now() + LOCK_PATIENCE;
-    while (_file && ::flock(_file.get(), LOCK_EX | LOCK_NB) != 0) {
-        if (std::chrono::steady_clock::now() > end) {
-            __dlog_print(LOG_ID_MAIN, DLOG_WARN, "MEWLO", "another process holds the recordings; going on");
-            return;
-        }
+    while (_file && !_held) {
+        _held = ::flock(_file.get(), LOCK_EX | LOCK_NB) == 0;
+        if (_held || std::chrono::steady_clock::now() > end)
+            break;
         std::this_thread::sleep_for(LOCK_RETRY);
     }
+    if (!_held)
+        __dlog_print(LOG_ID_MAIN, DLOG_WARN, "MEWLO", "another process holds the recordings");
 }
 
 }

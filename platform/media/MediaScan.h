@@ -27,9 +27,12 @@ int scanFolders(Database& database, const std::vector<std::string>& folders, Sca
 class FilesLock {
 public:
     explicit FilesLock(const std::string& databasePath);
+    // False when others held it for too long.
+    [[nodiscard]] bool isHeld() const { return _held; }
 
 private:
     FileDescriptor _file;
+    bool _held = false;
 };
 
 }

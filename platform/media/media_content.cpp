@@ -383,7 +383,10 @@ int media_content_lock_files(files_lock_h* lock)
         return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
     if (lock == nullptr)
         return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
-    *lock = new files_lock_s(held->database.path());
+    auto attempt = std::make_unique<files_lock_s>(held->database.path());
+    if (!attempt->isHeld())
+        return MEDIA_CONTENT_ERROR_DB_BUSY;
+    *lock = attempt.release();
     return MEDIA_CONTENT_ERROR_NONE;
 }
 

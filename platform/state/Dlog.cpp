@@ -1,5 +1,6 @@
 #include "dlog.h"
 
+#include <cerrno>
 #include <cstdarg>
 #include <cstdio>
 #include <cstdlib>
@@ -93,10 +94,12 @@ int __dlog_print(log_id_t, int priority, const char* tag, const char* format, ..
 {
     if (format == nullptr || priority < DLOG_DEBUG || priority > DLOG_ERROR || priority < leastPriority())
         return 0;
+    const int error = errno; // callers look at it after they have said what failed
     va_list arguments;
     va_start(arguments, format);
     const std::string text = formatted(format, arguments);
     va_end(arguments);
     write(priority, tag != nullptr ? tag : "", text);
+    errno = error;
     return static_cast<int>(text.size());
 }

@@ -6,6 +6,7 @@
 
 #include <cerrno>
 #include <memory>
+#include <string>
 
 #include <sys/stat.h>
 #include <unistd.h>
@@ -13,6 +14,12 @@
 namespace {
 
 constexpr int INVALID_PARAMETER = -22;
+
+std::string directoryOf(const std::string& path)
+{
+    const size_t slash = path.rfind('/');
+    return slash == std::string::npos ? "." : path.substr(0, slash + 1);
+}
 
 bool moveToTrash(const char* path)
 {
@@ -36,7 +43,7 @@ int storage_trash_file(const char* path)
         return -errno;
     if (S_ISDIR(status.st_mode))
         return -EISDIR;
-    if (moveToTrash(path) || ::unlink(path) == 0)
+    if (moveToTrash(path))
         return 0;
-    return -errno;
+    return ::access(directoryOf(path).c_str(), W_OK | X_OK) == 0 ? -ENOTSUP : -errno;
 }

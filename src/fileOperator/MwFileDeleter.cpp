@@ -3,6 +3,7 @@
 #include <Ecore_File.h>
 #include <storage.h>
 
+#include <cerrno>
 #include <iterator>
 #include <utility>
 
@@ -16,18 +17,6 @@ namespace {
 constexpr size_t GROUP = 256; // rows to a commit
 
 bool isPrivate(const std::string& path) { return path.starts_with(mwPrivateRoot() + "/"); }
-
-// What is private must not lie about in a trash that everybody looks through.
-bool removeFile(const std::string& path)
-{
-    if (isPrivate(path)) {
-        if (ecore_file_unlink(path.c_str()) != EINA_FALSE)
-            return true;
-        MW_LOGE("ecore_file_unlink failed!!!");
-        return false;
-    }
-    return MW_CALL(storage_trash_file, path.c_str());
-}
 
 }
 
@@ -57,7 +46,22 @@ bool MwFileDeleter::_deleteFile(const std::string& path)
         MW_LOGE("file is not existed!!!");
         return false;
     }
-    return removeFile(path);
+    return _removeFile(path);
+}
+
+bool MwFileDeleter::_removeFile(const std::string& path)
+{
+    const int result = isPrivate(path) ? -ENOTSUP : storage_trash_file(path.c_str());
+    if (result != -ENOTSUP)
+        return result == 0;
+    if (!_forGood) {
+        _withoutTrash.push_back(path);
+        return false;
+    }
+    if (ecore_file_unlink(path.c_str()) != EINA_FALSE)
+        return true;
+    MW_LOGE("ecore_file_unlink failed!!!");
+    return false;
 }
 
 void MwFileDeleter::_commit()

@@ -29,6 +29,19 @@ bool isSameFile(const std::string& path, const std::string& other)
         && own.st_ino == others.st_ino;
 }
 
+// As far as can be told beforehand: not where the folder may not be changed, nor another's file in a shared folder.
+bool isRemovable(const std::string& path)
+{
+    const std::string directory = path.substr(0, path.rfind('/') + 1);
+    struct stat folder { };
+    struct stat file { };
+    if (::access(directory.c_str(), W_OK | X_OK) != 0 || ::stat(directory.c_str(), &folder) != 0
+        || ::lstat(path.c_str(), &file) != 0)
+        return false;
+    const uid_t self = ::geteuid();
+    return (folder.st_mode & S_ISVTX) == 0 || self == 0 || self == folder.st_uid || self == file.st_uid;
+}
+
 }
 
 MwFileMover::MwFileMover(
@@ -43,13 +56,14 @@ MwFileMover::MwFileMover(
 
 MwFileMover::Outcome MwFileMover::move(const std::string& source, std::string& destination)
 {
+    _trouble = Trouble::NONE;
     if (source.empty()) {
         MW_LOGE("path is empty");
-        return Outcome::FAILED;
+        return _fail(Trouble::MISSING);
     }
     if (!MwFilePlaces::isTaken(source)) {
         MW_LOGE("file is not existed!!!");
-        return Outcome::FAILED;
+        return _fail(Trouble::MISSING);
     }
     // A file that is where it should go is no clash with itself.
     const bool isThere = isSameFile(source.substr(0, source.rfind('/') + 1), _directory + "/");
@@ -60,9 +74,18 @@ MwFileMover::Outcome MwFileMover::move(const std::string& source, std::string& d
         _report(MwFilePlaces::_get_file_size(source));
         return Outcome::SKIPPED;
     }
+    // Before a long copy is made in vain; what this does not foresee is undone.
+    if (!isRemovable(source))
+        return _fail(Trouble::NOT_REMOVABLE);
     if (!MwFiles::makeDirectories(_directory))
-        return Outcome::FAILED;
+        return _fail(Trouble::OTHER);
     return _stageAndPublish(source, *place, destination);
+}
+
+MwFileMover::Outcome MwFileMover::_fail(Trouble trouble)
+{
+    _trouble = trouble;
+    return Outcome::FAILED;
 }
 
 // A move was killed when the file had both names. The look at the folders gives the row to the one that stays.
@@ -72,7 +95,7 @@ MwFileMover::Outcome MwFileMover::_endInterrupted(const std::string& source, std
     _report(MwFilePlaces::_get_file_size(source));
     if (::unlink(source.c_str()) != 0) {
         MW_LOGE("remove failed.");
-        return Outcome::FAILED;
+        return _fail(Trouble::NOT_REMOVABLE);
     }
     MW_CALL(media_content_scan_all);
     return Outcome::MOVED;
@@ -99,20 +122,21 @@ MwFileMover::Outcome MwFileMover::_stageAndPublish(const std::string& source, Pl
 {
     MwStagedFile staged(source, _directory);
     if (!staged.stage(_chunksPerReport, _report, _cancelled))
-        return Outcome::FAILED;
+        return _fail(staged.error() == ENOSPC || staged.error() == EDQUOT ? Trouble::NO_ROOM : Trouble::OTHER);
     for (;;) {
         FilesLock lock;
-        MW_CALL(media_content_lock_files, lock.out());
+        if (!MW_CALL(media_content_lock_files, lock.out()))
+            return _fail(Trouble::OTHER);
         // From here to the end of the source the recording is there twice.
         std::optional<MwMoveRecord> record;
         if (staged.leavesSource())
             record.emplace(source, staged.getPath(), place.path);
         const auto published = staged.publish(place.path, place.replace);
         if (published == MwStagedFile::Outcome::FAILED)
-            return Outcome::FAILED;
+            return _fail(Trouble::OTHER);
         if (published == MwStagedFile::Outcome::DONE) {
             destination = place.path;
-            return _moveRow(source, place, staged.leavesSource()) ? Outcome::MOVED : Outcome::FAILED;
+            return _moveRow(source, place, staged.leavesSource());
         }
         record.reset();
         lock.close(); // somebody took the name meanwhile, and the user may think about it for long
@@ -123,7 +147,7 @@ MwFileMover::Outcome MwFileMover::_stageAndPublish(const std::string& source, Pl
     }
 }
 
-bool MwFileMover::_moveRow(const std::string& source, const Place& place, bool sourceLeft)
+MwFileMover::Outcome MwFileMover::_moveRow(const std::string& source, const Place& place, bool sourceLeft)
 {
     const auto row = MwMediaRow::move(source, place.path);
     if (row == MwMediaRow::Move::FAILED) {
@@ -132,19 +156,30 @@ bool MwFileMover::_moveRow(const std::string& source, const Place& place, bool s
             (void)MwFiles::moveWithoutOverwriting(place.path, source);
         else if (!place.replace)
             ::unlink(place.path.c_str());
-        return false;
+        return _fail(Trouble::OTHER);
     }
-    if (sourceLeft) {
-        MW_LOGI("remove source file");
-        if (::unlink(source.c_str()) != 0 && errno != ENOENT) {
-            MW_LOGE("remove failed.");
-            return false;
-        }
-    }
+    if (sourceLeft && _removeSource(source, place) == Outcome::FAILED)
+        return Outcome::FAILED;
     // A known recording has brought its row along; only an unknown one is to be catalogued.
     if (row == MwMediaRow::Move::UNKNOWN) {
         if (const int result = media_content_scan_file(place.path.c_str()); result != 0)
             MW_LOGE("media_content_scan_file().. [0x%X]", static_cast<unsigned>(result));
     }
-    return true;
+    return Outcome::MOVED;
+}
+
+MwFileMover::Outcome MwFileMover::_removeSource(const std::string& source, const Place& place)
+{
+    MW_LOGI("remove source file");
+    if (::unlink(source.c_str()) == 0 || errno == ENOENT)
+        return Outcome::MOVED;
+    MW_LOGE("remove failed.");
+    // What was replaced does not come back: then the copy stays, as a recording of its own.
+    if (place.replace) {
+        (void)MwMediaRow::move(place.path, source);
+        MW_CALL(media_content_scan_file, place.path.c_str());
+    } else if (!MwMoveRecord::undo(source, place.path)) {
+        MW_LOGE("the move cannot be undone");
+    }
+    return _fail(Trouble::NOT_REMOVABLE);
 }

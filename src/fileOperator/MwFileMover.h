@@ -14,6 +14,7 @@ enum class MwClashAction : int { NONE = 0, CANCEL = 1, REPLACE = 2, RENAME = 3 }
 class MwFileMover {
 public:
     enum class Outcome { MOVED, SKIPPED, FAILED };
+    enum class Trouble { NONE, MISSING, NO_ROOM, NOT_REMOVABLE, OTHER };
     // Asked for every name that is taken; may take its time.
     using Ask = std::function<MwClashAction(const std::string& source)>;
     using Report = std::function<void(uint64_t bytes)>;
@@ -23,6 +24,8 @@ public:
 
     // On success the destination is where the file is now.
     [[nodiscard]] Outcome move(const std::string& source, std::string& destination);
+    // Why the last one failed.
+    [[nodiscard]] Trouble trouble() const { return _trouble; }
 
 private:
     struct Place {
@@ -30,14 +33,17 @@ private:
         bool replace = false;
     };
 
+    Outcome _fail(Trouble trouble);
     Outcome _endInterrupted(const std::string& source, std::string& destination);
     std::optional<Place> _choosePlace(const std::string& source, bool late);
     Outcome _stageAndPublish(const std::string& source, Place place, std::string& destination);
-    bool _moveRow(const std::string& source, const Place& place, bool sourceLeft);
+    Outcome _moveRow(const std::string& source, const Place& place, bool sourceLeft);
+    Outcome _removeSource(const std::string& source, const Place& place);
 
     std::string _directory;
     unsigned int _chunksPerReport;
     const std::atomic<bool>& _cancelled;
     Ask _ask;
     Report _report;
+    Trouble _trouble = Trouble::NONE;
 };

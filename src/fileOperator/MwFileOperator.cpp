@@ -21,7 +21,7 @@ constexpr auto FINISH = "finish";
 
 uint64_t sizeOfAll(MwFileOperator::Type type, const std::vector<MwFileOperator::Source>& sources)
 {
-    if (type == MwFileOperator::DELETE)
+    if (type != MwFileOperator::MOVE_TO_PRIVATE && type != MwFileOperator::REMOVE_FROM_PRIVATE)
         return 0;
     const uint64_t size = std::accumulate(sources.begin(), sources.end(), uint64_t{0},
         [](uint64_t sum, const auto& source) { return sum + MwFilePlaces::_get_file_size(source.path); });
@@ -59,6 +59,8 @@ MwFileOperator::~MwFileOperator()
 void MwFileOperator::start()
 {
     WASSERT(eina_main_loop_is());
+    if (_type == RENAME)
+        return _begin();
     _startTimer = panekit::WTimer::addTimer(START_DELAY, [this](void*) {
         _begin();
         return false;
@@ -145,7 +147,9 @@ void MwFileOperator::_onMoveFilePipe(const std::string& message)
 
 void MwFileOperator::_run()
 {
-    if (_type == DELETE)
+    if (_type == RENAME)
+        _renameFile();
+    else if (_type == DELETE || _type == DELETE_FOR_GOOD)
         _deleteFiles();
     else
         _moveFiles();
@@ -153,7 +157,7 @@ void MwFileOperator::_run()
 
 void MwFileOperator::_deleteFiles()
 {
-    MwFileDeleter deleter;
+    MwFileDeleter deleter(_type == DELETE_FOR_GOOD);
     for (const Source& source : _sources) {
         if (_cancelRequested) {
             MW_LOGW("canceled deleting");
@@ -163,7 +167,8 @@ void MwFileOperator::_deleteFiles()
     }
     _donePaths = deleter.finish();
     _doneFiles = _donePaths.size();
-    _failed = !_cancelRequested && _donePaths.size() < _sources.size();
+    _withoutTrash = deleter.withoutTrash();
+    _failed = !_cancelRequested && _donePaths.size() + _withoutTrash.size() < _sources.size();
     _tell({});
 }
 
@@ -182,12 +187,22 @@ void MwFileOperator::_moveFiles()
         if (!_moveFile(mover, source.path)) {
             MW_LOGE("stopped _moveFile!!!");
             _failed = !_cancelRequested;
+            _trouble = mover.trouble();
             break;
         }
         _donePaths.push_back(source.path);
         ++_doneFiles;
         _tellUpdate();
     }
+    _tell(FINISH);
+}
+
+void MwFileOperator::_renameFile()
+{
+    const auto& [path, mediaId, newPath] = _sources.front();
+    _renamed = MwFileRenamer::rename(path, newPath);
+    if (_renamed == MwFileRenamer::Outcome::DONE)
+        _moved.push_back({path, newPath});
     _tell(FINISH);
 }
 

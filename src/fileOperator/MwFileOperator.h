@@ -12,19 +12,21 @@
 #include <vector>
 
 #include "MwFileMover.h"
+#include "MwFileRenamer.h"
 
 struct _Ecore_Pipe;
 
-// Deletes or moves some recordings on a thread of its own and tells the main loop how it gets on. Owned by the screen
-// that started it, which may delete it at any time, also in a callback: what runs is then cancelled and waited for, and
-// every file is whole. All operations and callbacks on the main loop.
+// Deletes, moves or renames recordings on a thread of its own and tells the main loop how it gets on. Owned by the
+// screen that started it, which may delete it at any time, also in a callback: what runs is then cancelled and waited
+// for, and every file is whole. All operations and callbacks on the main loop.
 class MwFileOperator {
 public:
-    enum Type : int { DELETE = 1, MOVE_TO_PRIVATE = 2, REMOVE_FROM_PRIVATE = 3 };
+    enum Type : int { DELETE = 1, MOVE_TO_PRIVATE = 2, REMOVE_FROM_PRIVATE = 3, RENAME = 4, DELETE_FOR_GOOD = 5 };
 
     struct Source {
         std::string path;
         std::string mediaId; // for deleting; empty when it is not catalogued
+        std::string newPath{}; // for renaming
     };
     struct Moved {
         std::string from;
@@ -51,7 +53,7 @@ public:
     MwFileOperator(const MwFileOperator&) = delete;
     MwFileOperator& operator=(const MwFileOperator&) = delete;
 
-    // Begins a moment later, so that the popup is on the screen first.
+    // Begins a moment later, so that the popup is on the screen first; renaming, which has none, at once.
     void start();
     // Stops after the file, or in the copy, that is at work; the end is reported as ever.
     void requestCancel();
@@ -74,6 +76,12 @@ public:
     [[nodiscard]] const std::vector<std::string>& donePaths() const { return _donePaths; }
     [[nodiscard]] const std::vector<Moved>& moved() const { return _moved; }
     [[nodiscard]] bool hasFailed() const { return _failed; }
+    // Of a move that has failed.
+    [[nodiscard]] MwFileMover::Trouble trouble() const { return _trouble; }
+    [[nodiscard]] size_t allFiles() const { return _sources.size(); }
+    // Of a delete: what only goes for good, and is still there.
+    [[nodiscard]] const std::vector<std::string>& withoutTrash() const { return _withoutTrash; }
+    [[nodiscard]] MwFileRenamer::Outcome renameOutcome() const { return _renamed; }
 
 private:
     static void _pipeCb(void* data, void* buffer, unsigned int size);
@@ -85,6 +93,7 @@ private:
     void _run();
     void _deleteFiles();
     void _moveFiles();
+    void _renameFile();
     bool _moveFile(MwFileMover& mover, const std::string& path);
     MwClashAction _ask(const std::string& path);
     void _report(uint64_t bytes);
@@ -114,5 +123,8 @@ private:
 
     std::vector<std::string> _donePaths; // the worker's until it has ended
     std::vector<Moved> _moved;
+    std::vector<std::string> _withoutTrash;
+    MwFileMover::Trouble _trouble = MwFileMover::Trouble::NONE;
+    MwFileRenamer::Outcome _renamed = MwFileRenamer::Outcome::FAILED;
     bool _failed = false;
 };

@@ -94,20 +94,24 @@ bool MwStagedFile::stage(unsigned int chunksPerReport, const Report& report, con
     }
     const int from = ::open(_source.c_str(), O_RDONLY | O_CLOEXEC);
     if (from < 0) {
+        _error = errno;
         MW_LOGE("Fail to open src file : %d", errno);
         return false;
     }
     _file = ::open(_path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0600);
     bool complete = false;
     if (_file < 0) {
+        _error = errno;
         MW_LOGE("Fail to open dst file : %d", errno);
     } else {
         _kind = Kind::COPY;
         ::flock(_file, LOCK_EX | LOCK_NB);
         MwFileCopy copy(from, _file, chunksPerReport, report);
         complete = copy.run(cancelled) && copy.copyAttributes() && ::fsync(_file) == 0;
-        if (!complete)
+        if (!complete) {
+            _error = errno;
             MW_LOGE("the copy is not complete : %d", errno);
+        }
     }
     ::close(from);
     return complete && !cancelled;

@@ -22,6 +22,8 @@ public:
     // mode and times and is flushed. Reports the bytes done every so many chunks; false when it failed or was
     // cancelled.
     [[nodiscard]] bool stage(unsigned int chunksPerReport, const Report& report, const std::atomic<bool>& cancelled);
+    // Why it failed, an error number.
+    [[nodiscard]] int error() const { return _error; }
     // Gives it its name, and flushes that. Without replacing, a taken name is answered; replacing is one step, so that
     // either the old or the new file is there at any time.
     [[nodiscard]] Outcome publish(const std::string& destination, bool replace);
@@ -44,5 +46,6 @@ private:
     std::string _directory;
     std::string _path;
     Kind _kind = Kind::NONE;
+    int _error = 0;
     int _file = -1; // of a copy: open, and locked, until it has its name
 };

@@ -114,11 +114,19 @@ bool finish(const Content& content, const std::string& directory)
     if (!finishRow(content.source, destination))
         return false;
     if (::unlink(content.source.c_str()) != 0 && errno != ENOENT)
-        return false;
+        return MwMoveRecord::undo(content.source, destination);
     MwFiles::flushDirectoryOf(content.source);
     return true;
 }
 
+}
+
+bool MwMoveRecord::undo(const std::string& source, const std::string& destination)
+{
+    if (MwMediaRow::move(destination, source) == MwMediaRow::Move::FAILED || ::unlink(destination.c_str()) != 0)
+        return false;
+    MwFiles::flushDirectoryOf(destination);
+    return true;
 }
 
 MwMoveRecord::MwMoveRecord(const std::string& source, const std::string& staged, const std::string& destination)
@@ -161,7 +169,10 @@ void MwMoveRecord::recover(const std::string& directory)
             continue;
         if (::flock(file, LOCK_EX | LOCK_NB) == 0 && isOurs(file, path)) {
             FilesLock lock;
-            MW_CALL(media_content_lock_files, lock.out());
+            if (!MW_CALL(media_content_lock_files, lock.out())) {
+                ::close(file);
+                return; // the next start tries again
+            }
             std::string text(LARGEST, '\0');
             const ssize_t size = ::pread(file, text.data(), text.size(), 0);
             text.resize(size > 0 ? static_cast<size_t>(size) : 0);

@@ -16,6 +16,8 @@ public:
 
     // Finishes what dead processes have left in a directory.
     static void recover(const std::string& directory);
+    // Takes a destination that doubles its source back, row first.
+    static bool undo(const std::string& source, const std::string& destination);
 
 private:
     std::string _path;

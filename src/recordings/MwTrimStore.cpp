@@ -163,7 +163,8 @@ bool MwTrimStore::_isSourceUnchanged() const
 MwTrimStore::Outcome MwTrimStore::store(const std::string& formerId, const std::vector<MwBookmark>& bookmarks)
 {
     FilesLock lock;
-    MW_CALL(media_content_lock_files, lock.out());
+    if (!MW_CALL(media_content_lock_files, lock.out()))
+        return Outcome::FAILED;
     if (_overwrite && !_isSourceUnchanged()) {
         MW_LOGE("the recording was changed meanwhile");
         return Outcome::CHANGED;
@@ -253,7 +254,8 @@ void MwTrimStore::recover(const std::string& directory)
         if (!intent.isOpen())
             continue;
         FilesLock lock;
-        MW_CALL(media_content_lock_files, lock.out());
+        if (!MW_CALL(media_content_lock_files, lock.out()))
+            return; // the next start tries again
         const auto content = intent.load();
         const std::string staged = intent.stagedPath();
         MW_LOGW("a trim was cut off : [%s]", staged.c_str());

@@ -235,6 +235,7 @@ TEST_F(FileOperatorTest, MissingFileStopsAMoveAndIsSkippedByADelete)
     ASSERT_TRUE(run(MwFileOperator::MOVE_TO_PRIVATE, paths));
     EXPECT_TRUE(_operator->hasFailed());
     EXPECT_EQ(std::vector{paths[0]}, _operator->donePaths());
+    EXPECT_EQ(MwFileMover::Trouble::MISSING, _operator->trouble());
     EXPECT_TRUE(fs::exists(paths[2]));
     support::addRecording("a.m4a");
     ASSERT_TRUE(run(MwFileOperator::DELETE, paths));
@@ -250,7 +251,12 @@ TEST_F(FileOperatorTest, DeletesIntoTheTrashButPrivateFilesForGood)
     support::addRecording("secret.m4a", "secret");
     ASSERT_TRUE(run(MwFileOperator::MOVE_TO_PRIVATE, {recordingPath("secret.m4a")}));
     ASSERT_TRUE(run(MwFileOperator::DELETE, {recordingPath("common.m4a"), privatePath("secret.m4a")}));
-    EXPECT_EQ(2U, _operator->donePaths().size());
+    EXPECT_EQ(std::vector{recordingPath("common.m4a")}, _operator->donePaths());
+    EXPECT_EQ(std::vector{privatePath("secret.m4a")}, _operator->withoutTrash());
+    EXPECT_FALSE(_operator->hasFailed()) << "it is asked about";
+    EXPECT_TRUE(fs::exists(privatePath("secret.m4a")));
+    ASSERT_TRUE(run(MwFileOperator::DELETE_FOR_GOOD, {privatePath("secret.m4a")}));
+    EXPECT_EQ(1U, _operator->donePaths().size());
     EXPECT_TRUE(rows().empty());
     EXPECT_EQ(Files(), filesIn(privateDirectory()));
     EXPECT_EQ("common", filesIn(trash)["common.m4a"]);
@@ -283,7 +289,7 @@ TEST_F(FileOperatorTest, HostileNamesTouchNothingElse)
         const std::string to = _operator->moved()[0].to;
         EXPECT_EQ("mine", readFile(to));
         EXPECT_EQ((std::map<std::string, std::string>{{recordingPath("memo.m4a"), other}, {to, id}}), rows());
-        ASSERT_TRUE(run(MwFileOperator::DELETE, {to}));
+        ASSERT_TRUE(run(MwFileOperator::DELETE_FOR_GOOD, {to}));
         EXPECT_EQ("old", readFile(privatePath(name)));
     }
     EXPECT_EQ((Files{{"memo.m4a", "other"}}), filesIn(support::recordingsDirectory()));
@@ -338,18 +344,22 @@ TEST_F(FileOperatorTest, KilledAtAnyTimeEveryFileIsWholeAndKeepsItsBookmark)
 
 // Killed before each call that changes a file or the database, in both ways of moving: there is one recording
 // afterwards, with its bookmark.
-TEST_F(FileOperatorTest, AKilledMoveLeavesOneRecordingNotTwo)
+TEST_F(FileOperatorTest, AMoveCutOffAnywhereLeavesOneRecordingNotTwo)
 {
 #ifdef __SANITIZE_THREAD__
     GTEST_SKIP() << "the thread sanitizer ends forked children that start threads";
 #endif
     std::string elsewhere = "/dev/shm/mewlo-test-XXXXXX";
     ASSERT_NE(nullptr, ::mkdtemp(elsewhere.data()));
-    for (const std::string& directory : {privateDirectory(), elsewhere}) {
-        bool isKilled = true;
+    using support::faults::Effect;
+    const std::pair<std::string, Effect> cases[] = {{privateDirectory(), Effect::KILL}, {elsewhere, Effect::KILL},
+        {privateDirectory(), Effect::FAIL}, {elsewhere, Effect::FAIL}};
+    for (const auto& [directory, effect] : cases) {
+        bool isCutOff = true;
         int point = 0;
-        while (isKilled) {
-            SCOPED_TRACE(directory + ", call " + std::to_string(++point));
+        while (isCutOff) {
+            SCOPED_TRACE(directory + (effect == Effect::KILL ? ", killed at call " : ", failing call ")
+                + std::to_string(++point));
             fs::remove_all(directory);
             fs::remove_all(support::recordingsDirectory());
             fs::create_directories(directory);
@@ -359,17 +369,17 @@ TEST_F(FileOperatorTest, AKilledMoveLeavesOneRecordingNotTwo)
             const pid_t child = ::fork();
             if (child == 0) {
                 media_content_connect();
-                support::faults::arm("/", point, support::faults::Effect::KILL);
+                support::faults::arm("/", point, effect, EACCES);
                 const std::atomic<bool> cancelled = false;
                 std::string destination;
                 MwFileMover mover(
                     directory, 7, cancelled, [](const std::string&) { return MwClashAction::CANCEL; }, [](uint64_t) {});
                 (void)mover.move(recordingPath("a.m4a"), destination);
-                ::_exit(0);
+                ::_exit(support::faults::count() < point ? 0 : 1);
             }
             int status = 0;
             ::waitpid(child, &status, 0);
-            isKilled = WIFSIGNALED(status);
+            isCutOff = status != 0;
             media_content_connect();
             // What the next start does; somebody may have looked at the folders before.
             if (point % 2 == 0)

@@ -129,7 +129,8 @@ private:
     void _clickShareMenu();
     void _clickRenameMenu();
     void _addPrivateItems(panekit::WMenuPopupController& menu);
-    void _createDeletePopup(std::function<void()> confirmed);
+    void _createDeletePopup(
+        std::function<void()> confirmed, const char* question = "IDS_MW_POP_THIS_VOICE_RECORDING_WILL_BE_DELETED");
     void _openBookmarks();
     void _openDetails();
     void _createSaveToPopup();
@@ -153,7 +154,9 @@ private:
     void _updateDuplicationPopup();
     std::unique_ptr<MwFileOperator> _createFileOperator(int type, const std::vector<std::string>& pathList);
     void _cancelDeleting();
+    void _startDeleting(int type, const std::vector<std::string>& pathList);
     void _onDeleteFiles();
+    void _askToDeleteForGood(const std::vector<std::string>& pathList);
     void _catalogueShrank();
     void _moveStart();
     void _createMovingingPopupController();
@@ -176,6 +179,7 @@ private:
     void _closeRenamePopup();
     void _renameResponseCb(const char* text, int response);
     bool _renameRecording(const std::string& name);
+    void _onRenamed();
 
     using Request = MwHandle<app_control_h, app_control_destroy>;
 

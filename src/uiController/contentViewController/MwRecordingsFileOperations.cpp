@@ -43,6 +43,23 @@ std::string movedText(MwFileOperator::Type type, size_t count)
     return text;
 }
 
+std::string notMovedText(const MwFileOperator& fileOperator)
+{
+    const auto id = [&] {
+        switch (fileOperator.trouble()) {
+        case MwFileMover::Trouble::MISSING:
+            return "IDS_MW_TPOP_PD_NOT_MOVED_A_FILE_IS_MISSING";
+        case MwFileMover::Trouble::NO_ROOM:
+            return "IDS_MW_TPOP_PD_NOT_MOVED_NO_ROOM";
+        case MwFileMover::Trouble::NOT_REMOVABLE:
+            return "IDS_MW_TPOP_PD_NOT_MOVED_CANNOT_BE_REMOVED";
+        default:
+            return "IDS_MW_TPOP_PD_NOT_MOVED";
+        }
+    }();
+    return mwTranslateNumber(id, fileOperator.allFiles() - fileOperator.donePaths().size());
+}
+
 }
 
 std::unique_ptr<MwFileOperator> MwRecordingsContentViewController::_createFileOperator(
@@ -53,8 +70,8 @@ std::unique_ptr<MwFileOperator> MwRecordingsContentViewController::_createFileOp
         const MwFileInfo* info = getModel()->getRecordedFileInfoByPath(path);
         sources.push_back({path, info ? info->mediaId : std::string()});
     }
-    if (type == MwFileOperator::DELETE)
-        return std::make_unique<MwFileOperator>(MwFileOperator::DELETE, std::move(sources),
+    if (type == MwFileOperator::DELETE || type == MwFileOperator::DELETE_FOR_GOOD)
+        return std::make_unique<MwFileOperator>(static_cast<MwFileOperator::Type>(type), std::move(sources),
             MwFileOperator::Callbacks{nullptr, nullptr, [this] { _onDeleteFiles(); }});
     return std::make_unique<MwFileOperator>(static_cast<MwFileOperator::Type>(type), std::move(sources),
         MwFileOperator::Callbacks{[this] { _updateMovePopup(); },
@@ -62,6 +79,11 @@ std::unique_ptr<MwFileOperator> MwRecordingsContentViewController::_createFileOp
 }
 
 void MwRecordingsContentViewController::_clickDeleteButton(const std::vector<std::string>& pathList)
+{
+    _startDeleting(MwFileOperator::DELETE, pathList);
+}
+
+void MwRecordingsContentViewController::_startDeleting(int type, const std::vector<std::string>& pathList)
 {
     if (pathList.empty()) {
         MW_LOGE("pathList size is 0");
@@ -71,7 +93,7 @@ void MwRecordingsContentViewController::_clickDeleteButton(const std::vector<std
         MW_LOGE("file operator is working");
         return;
     }
-    _fileOperator = _createFileOperator(MwFileOperator::DELETE, pathList);
+    _fileOperator = _createFileOperator(type, pathList);
     _fileOperationPopup = std::make_unique<MwFileOperationPopup>(getWindow());
     _fileOperationPopup->showDeleting([this] { _cancelDeleting(); });
     _fileOperator->start();
@@ -94,9 +116,27 @@ void MwRecordingsContentViewController::_onDeleteFiles()
     if (_fileOperator->hasFailed())
         mwPost("IDS_MW_TPOP_SOME_RECORDINGS_NOT_DELETED");
     _catalogueShrank();
+    const std::vector<std::string> rest
+        = _fileOperator->isCancelRequested() ? std::vector<std::string>() : _fileOperator->withoutTrash();
     _deleteFileOperator();
     _viewType = NORMAL;
     _update();
+    if (rest.empty())
+        return;
+    // After the former popup, and the list behind it, are gone for good.
+    panekit::WTimer::addJob([this, alive = std::weak_ptr<void>(token()), rest](void*) {
+        if (!alive.expired())
+            _askToDeleteForGood(rest);
+    });
+}
+
+void MwRecordingsContentViewController::_askToDeleteForGood(const std::vector<std::string>& pathList)
+{
+    const std::string question = pathList.size() == 1
+        ? mwTranslate("IDS_MW_POP_RECORDING_CANNOT_GO_TO_THE_TRASH_DELETE_FOR_GOOD_Q")
+        : mwTranslateNumber("IDS_MW_POP_PD_RECORDINGS_CANNOT_GO_TO_THE_TRASH_DELETE_FOR_GOOD_Q", pathList.size());
+    _createDeletePopup(
+        [this, pathList] { _startDeleting(MwFileOperator::DELETE_FOR_GOOD, pathList); }, question.c_str());
 }
 
 void MwRecordingsContentViewController::_catalogueShrank()
@@ -111,7 +151,7 @@ void MwRecordingsContentViewController::_deletePlayingFile()
 {
     const std::string path = getModel()->getCurrentPlayPath();
     const MwFileInfo* info = getModel()->getRecordedFileInfoByPath(path);
-    MwFileDeleter deleter;
+    MwFileDeleter deleter(true); // asked already
     deleter.remove(path, info ? info->mediaId : std::string());
     if (deleter.finish().empty()) {
         mwPost("IDS_MW_TPOP_SOME_RECORDINGS_NOT_DELETED");
@@ -230,25 +270,27 @@ void MwRecordingsContentViewController::_deleteFileOperator()
         popup->close();
     const auto fileOperator = std::exchange(_fileOperator, nullptr);
     fileOperator->cancelAndWait();
-    if (fileOperator->type() != MwFileOperator::DELETE)
+    for (const auto& [from, to] : fileOperator->moved()) {
+        if (from == getModel()->getCurrentPlayPath())
+            getModel()->setCurrentPlayPath(to);
+    }
+    if (fileOperator->type() == MwFileOperator::MOVE_TO_PRIVATE
+        || fileOperator->type() == MwFileOperator::REMOVE_FROM_PRIVATE)
         _moveEnded(*fileOperator);
 }
 
 // However a move ended: tells what was moved, and hands the private storage back.
 void MwRecordingsContentViewController::_moveEnded(const MwFileOperator& fileOperator)
 {
-    for (const auto& [from, to] : fileOperator.moved()) {
-        if (from == getModel()->getCurrentPlayPath())
-            getModel()->setCurrentPlayPath(to);
-    }
     if (MwSystemMgr::getInstance()->isPrivateModeEnabledByApp())
         return;
     if (fileOperator.moved().empty())
         MW_LOGW("moved file is 0");
-    else
-        notification_status_message_post(movedText(fileOperator.type(), fileOperator.moved().size()).c_str());
+    std::string text = fileOperator.moved().empty() ? "" : movedText(fileOperator.type(), fileOperator.moved().size());
     if (fileOperator.hasFailed())
-        mwPost("IDS_MW_TPOP_SOME_RECORDINGS_NOT_MOVED");
+        text += (text.empty() ? "" : " ") + notMovedText(fileOperator);
+    if (!text.empty())
+        notification_status_message_post(text.c_str());
     if (std::exchange(_privateStorageOpen, false))
         _requestPrivateModeAppControl(false);
 }

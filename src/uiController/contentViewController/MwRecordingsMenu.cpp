@@ -144,11 +144,11 @@ void MwRecordingsContentViewController::_clickDeleteMenu()
     _createDeletePopup([this] { _deletePlayingFile(); });
 }
 
-void MwRecordingsContentViewController::_createDeletePopup(std::function<void()> confirmed)
+void MwRecordingsContentViewController::_createDeletePopup(std::function<void()> confirmed, const char* question)
 {
     auto* popup = new WPopupController();
     popup->setTitle("IDS_MW_OPT_DELETE");
-    popup->setContent("IDS_MW_POP_THIS_VOICE_RECORDING_WILL_BE_DELETED");
+    popup->setContent(question);
     popup->addButton("IDS_MW_BUTTON_CANCEL", [](WPopupController* self) { self->destroy(); });
     popup->addButton("IDS_MW_OPT_DELETE", [confirmed = std::move(confirmed)](WPopupController* self) {
         const auto action = confirmed; // goes with the popup

@@ -7,21 +7,16 @@
 
 #include <unistd.h>
 
-#include <media_content.h>
-
 #include "MwFileName.h"
 #include "MwFileOperator.h"
-#include "MwFiles.h"
+#include "MwHandle.h"
 #include "MwLog.h"
-#include "MwMediaRow.h"
 #include "MwRenamePopupController.h"
 #include "MwText.h"
 
 namespace {
 
 constexpr auto PRIVATE_STORAGE_APP_ID = "com.tovanic.setting.private";
-
-using FilesLock = MwHandle<files_lock_h, media_content_unlock_files>;
 
 // A reply may come when its request, and even the screen, are long gone: what travels with it is a number.
 struct ReplyHandler {
@@ -90,25 +85,6 @@ bool fillShareRequest(app_control_h request, const std::vector<std::string>& pat
                static_cast<int>(paths.size()))
         && MW_CALL(app_control_add_extra_data, request, "launch-type", "mewlo")
         && MW_CALL(app_control_set_operation, request, APP_CONTROL_OPERATION_MULTI_SHARE);
-}
-
-enum class Rename { DONE, TAKEN, FAILED };
-
-Rename renameFile(const std::string& from, const std::string& to)
-{
-    FilesLock lock;
-    MW_CALL(media_content_lock_files, lock.out());
-    const auto moved = MwFiles::moveWithoutOverwriting(from, to);
-    if (moved != MwFiles::Move::DONE)
-        return moved == MwFiles::Move::EXISTS ? Rename::TAKEN : Rename::FAILED;
-    MwFiles::flushDirectoryOf(to);
-    const auto row = MwMediaRow::move(from, to);
-    if (row == MwMediaRow::Move::DONE)
-        return Rename::DONE;
-    if (row == MwMediaRow::Move::UNKNOWN && MW_CALL(media_content_scan_file, to.c_str()))
-        return Rename::DONE;
-    (void)MwFiles::moveWithoutOverwriting(to, from);
-    return Rename::FAILED;
 }
 
 }
@@ -226,7 +202,7 @@ void MwRecordingsContentViewController::_renameResponseCb(const char* text, int 
         _closeRenamePopup();
 }
 
-// True closes the popup.
+// True closes the popup now.
 bool MwRecordingsContentViewController::_renameRecording(const std::string& name)
 {
     const std::string path = _renameTarget;
@@ -235,26 +211,36 @@ bool MwRecordingsContentViewController::_renameRecording(const std::string& name
         mwPost("IDS_MW_POP_INVALID_FILE_NAME");
         return false;
     }
-    if (!getModel()->getRecordedFileInfoByPath(path))
+    const MwFileInfo* info = getModel()->getRecordedFileInfoByPath(path);
+    if (!info)
         return true;
+    if (_fileOperator) {
+        MW_LOGE("file operator is working");
+        return false;
+    }
     const size_t nameStart = path.rfind('/') + 1;
     const size_t dot = path.find('.', nameStart) != std::string::npos ? path.rfind('.') : path.size();
-    const std::string newDisplayName = name + path.substr(dot);
-    const std::string newPath = path.substr(0, nameStart) + newDisplayName;
-    switch (renameFile(path, newPath)) {
-    case Rename::TAKEN:
-        mwPost("IDS_MW_POP_RENAMEALREADYUSED");
-        return false;
-    case Rename::FAILED:
-        mwPost("IDS_MW_POP_INVALID_FILE_NAME");
-        return false;
-    case Rename::DONE:
-        break;
+    const std::string newPath = path.substr(0, nameStart) + name + path.substr(dot);
+    _fileOperator = std::make_unique<MwFileOperator>(MwFileOperator::RENAME,
+        std::vector<MwFileOperator::Source>{{path, info->mediaId, newPath}},
+        MwFileOperator::Callbacks{nullptr, nullptr, [this] { _onRenamed(); }});
+    _fileOperator->start();
+    return false;
+}
+
+void MwRecordingsContentViewController::_onRenamed()
+{
+    const auto outcome = _fileOperator->renameOutcome();
+    const auto moved = _fileOperator->moved();
+    _deleteFileOperator();
+    if (outcome != MwFileRenamer::Outcome::DONE) {
+        mwPost(
+            outcome == MwFileRenamer::Outcome::TAKEN ? "IDS_MW_POP_RENAMEALREADYUSED" : "IDS_MW_POP_INVALID_FILE_NAME");
+        return;
     }
-    getModel()->renameRecordedFile(path, newPath, newDisplayName);
-    if (getModel()->getCurrentPlayPath() == path)
-        getModel()->setCurrentPlayPath(newPath);
+    const auto& [path, newPath] = moved.front();
+    getModel()->renameRecordedFile(path, newPath, newPath.substr(newPath.rfind('/') + 1));
     _viewType = NORMAL;
     _update();
-    return true;
+    _closeRenamePopup();
 }
