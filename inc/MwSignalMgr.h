@@ -22,6 +22,7 @@ public:
         THEME_CHANGED,
         CALL_REJECT_CHANGED,
         MICROPHONE_BACK,
+        PRIVATE_STORAGE_CHANGED,
     };
 
     static MwSignalMgr* getInstance();

@@ -33,6 +33,14 @@ int setUp()
     return remember(1);
 }
 
+int setOpen(bool open)
+{
+    if (vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, open ? 1 : 0) == 0)
+        return tool::OK;
+    std::fputs("mewlo-tool: the state cannot be stored\n", stderr);
+    return tool::FAILED;
+}
+
 }
 
 int tool::privateStorage(const Arguments& arguments)
@@ -42,6 +50,8 @@ int tool::privateStorage(const Arguments& arguments)
         return setUp();
     if (action == "forget")
         return remember(0);
-    std::fputs("usage: mewlo-tool private setup | forget\n", stderr);
+    if (action == "open" || action == "close")
+        return setOpen(action == "open");
+    std::fputs("usage: mewlo-tool private setup | open | close | forget\n", stderr);
     return WRONG_USE;
 }

@@ -13,6 +13,7 @@
 // what is recorded or played. Remote controls show them, and the shut-down waits for a recording.
 #define VCONFKEY_MEWLO_RECORDER_STATE "memory/mewlo/recorder_state"
 #define VCONFKEY_MEWLO_TITLE "memory/mewlo/title"
+#define VCONFKEY_PRIVATE_STORAGE_OPEN "memory/setting/personal" // bool
 #define VCONFKEY_MEWLO_MICROPHONE "memory/mewlo/microphone" // 0 none there, 1 there
 
 typedef struct keynode_s keynode_t;

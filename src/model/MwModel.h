@@ -48,7 +48,11 @@ public:
     MwModel& operator=(const MwModel&) = delete;
 
     // Catalogue and play order
+    // Without those of the private storage while it is closed.
     bool createRecordedFileList();
+    // Whether the list leaves any out.
+    [[nodiscard]] bool hasHiddenRecordings() const { return _hasHidden; }
+    [[nodiscard]] static bool isHiddenRecording(const std::string& path);
     void destroyRecordedFileList();
     bool foreachRecordedFiles(RecordedFileCallback callback, void* userData);
     [[nodiscard]] const std::vector<MwFileInfo>& getRecordedFileList() const { return _recordedFiles; }
@@ -225,5 +229,6 @@ private:
     RequestHandle _request;
     std::vector<MwFileInfo> _recordedFiles;
     unsigned int _catalogueRevision = 1;
+    bool _hasHidden = false;
     std::vector<MwBookmark> _bookmarks;
 };

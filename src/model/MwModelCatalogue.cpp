@@ -1,10 +1,12 @@
 #include "MwModel.h"
 
 #include <metadata_extractor.h>
+#include <vconf.h>
 
 #include <algorithm>
 
 #include "MwLog.h"
+#include "MwStorageRoots.h"
 #include "MwText.h"
 
 namespace {
@@ -13,6 +15,14 @@ constexpr auto RECORDED_FILES_CONDITION = "MEDIA_MIME_TYPE=\"audio/AMR\" OR MEDI
                                           "(MEDIA_MIME_TYPE=\"audio/mp4\" AND MEDIA_MODE=10)";
 
 constexpr auto UNKNOWN_LENGTH = "--:--";
+
+bool isPrivateStorageOpen()
+{
+    int open = 0;
+    return vconf_get_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, &open) == 0 && open != 0;
+}
+
+bool isPrivate(const std::string& path) { return path.starts_with(mwPrivateRoot() + "/"); }
 
 using Filter = MwHandle<filter_h, media_filter_destroy>;
 using AudioMeta = MwHandle<audio_meta_h, audio_meta_destroy>;
@@ -136,8 +146,12 @@ bool MwModel::createRecordedFileList()
 {
     destroyRecordedFileList();
     foreachRecordedFiles(_collectFileCb, &_recordedFiles);
+    _hasHidden = !isPrivateStorageOpen()
+        && std::erase_if(_recordedFiles, [](const MwFileInfo& info) { return isPrivate(info.path); }) > 0;
     return true;
 }
+
+bool MwModel::isHiddenRecording(const std::string& path) { return isPrivate(path) && !isPrivateStorageOpen(); }
 
 void MwModel::destroyRecordedFileList()
 {

@@ -17,7 +17,6 @@ constexpr double STORAGE_THRESHOLD = 107520.0; // bytes
 constexpr int CARD_MOUNTED = 1;
 constexpr int ULTRA_POWER_SAVING = 2;
 constexpr auto KEY_PERSONAL_UNLOCK_METHOD = "db/setting/personal_unlock_method";
-constexpr auto KEY_PERSONAL = "memory/setting/personal";
 constexpr auto KEY_MOVE_TO_PRIVATE = "memory/setting/move_to_private";
 
 struct ModelType {
@@ -202,7 +201,7 @@ bool MwSystemMgr::isPrivateModeInitialized() const
 bool MwSystemMgr::isPrivateModeEnabled() const
 {
     int enabled = 0;
-    if (vconf_get_bool(KEY_PERSONAL, &enabled) != 0) {
+    if (vconf_get_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, &enabled) != 0) {
         MW_LOGE("get private mode vconf failed");
         return false;
     }

@@ -60,7 +60,7 @@ public:
 
 private:
     struct KeyWatch;
-    static const std::array<KeyWatch, 7>& _keyWatches();
+    static const std::array<KeyWatch, 8>& _keyWatches();
 
     static void _mmcStatusChangedCb(keynode_t* node, void* userData);
     static void _lockscreenStateChangedCb(keynode_t* node, void* userData);
@@ -69,6 +69,7 @@ private:
     static void _earjackStateChangedCb(keynode_t* node, void* userData);
     static void _callRejectStateChangedCb(keynode_t* node, void* userData);
     static void _microphoneChangedCb(keynode_t* node, void* userData);
+    static void _privateStorageChangedCb(keynode_t* node, void* userData);
     static void _mediaDBUpdatedCb(media_content_error_e error, int pid, media_content_db_update_item_type_e updateItem,
         media_content_db_update_type_e updateType, media_content_type_e mediaType, char* uuid, char* path, char* mime,
         void* userData);

@@ -34,9 +34,9 @@ struct MwSystemMgr::KeyWatch {
     const char* failure;
 };
 
-const std::array<MwSystemMgr::KeyWatch, 7>& MwSystemMgr::_keyWatches()
+const std::array<MwSystemMgr::KeyWatch, 8>& MwSystemMgr::_keyWatches()
 {
-    static const std::array<KeyWatch, 7> watches = {{
+    static const std::array<KeyWatch, 8> watches = {{
         {VCONFKEY_SYSMAN_MMC_STATUS, _mmcStatusChangedCb,
             "vconf_notify_key_changed(VCONFKEY_SYSMAN_MMC_STATUS) failed"},
         {VCONFKEY_IDLE_LOCK_STATE, _lockscreenStateChangedCb,
@@ -48,6 +48,8 @@ const std::array<MwSystemMgr::KeyWatch, 7>& MwSystemMgr::_keyWatches()
         {VCONFKEY_CALL_RECORDING_REJECT, _callRejectStateChangedCb,
             "vconf_notify_key_changed(VCONFKEY_CALL_RECORDING_REJECT) failed"},
         {VCONFKEY_MEWLO_MICROPHONE, _microphoneChangedCb, "vconf_notify_key_changed(VCONFKEY_MEWLO_MICROPHONE) failed"},
+        {VCONFKEY_PRIVATE_STORAGE_OPEN, _privateStorageChangedCb,
+            "vconf_notify_key_changed(VCONFKEY_PRIVATE_STORAGE_OPEN) failed"},
     }};
     return watches;
 }
@@ -157,6 +159,12 @@ void MwSystemMgr::_microphoneChangedCb(keynode_t* node, void* userData)
         return;
     if (vconf_keynode_get_int(node) != 0)
         emitSystemInfo(MwSignalMgr::MICROPHONE_BACK);
+}
+
+void MwSystemMgr::_privateStorageChangedCb(keynode_t*, void* userData)
+{
+    if (!selfIsMissing(userData))
+        emitSystemInfo(MwSignalMgr::PRIVATE_STORAGE_CHANGED);
 }
 
 void MwSystemMgr::_mediaDBUpdatedCb(media_content_error_e, int pid, media_content_db_update_item_type_e updateItem,

@@ -11,6 +11,7 @@
 #include "RecordingsScreen.h"
 #include "RenameWindow.h"
 #include "fakes/Fakes.h"
+#include "support/DatabaseRows.h"
 #include "support/Recordings.h"
 #include "support/RunUntil.h"
 #include "support/Screen.h"
@@ -46,6 +47,7 @@ protected:
         ui::forgetRecordings();
         ui::launches.clear();
         vconf_set_int("db/setting/personal_unlock_method", 1);
+        vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, 0);
         _screen = std::make_unique<RecordingsScreen>();
         for (const char* name : {"a.m4a", "b.m4a", "c.m4a"})
             _ids[name] = support::addRecording(name, name);
@@ -144,6 +146,7 @@ TEST_F(RecordingsOperationsTest, MovesToPrivateAndAnswersAClash)
     EXPECT_TRUE(calls.has("app_control_set_app_id com.tovanic.setting.private"));
     EXPECT_TRUE(calls.has("app_control_add_extra_data value=on"));
     EXPECT_EQ("", popupName()) << "not before the storage is available";
+    vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, 1); // as the service does
     ui::answer(ui::launches.at(0), APP_CONTROL_RESULT_SUCCEEDED, {{"result", "Success"}});
     EXPECT_EQ("movePopup", popupName());
     EXPECT_EQ("0/2", support::text(popupContent(), "elm.text.left"));
@@ -157,7 +160,6 @@ TEST_F(RecordingsOperationsTest, MovesToPrivateAndAnswersAClash)
     EXPECT_EQ("2 items moved to private.", fakes::desktop.lastMessage);
     EXPECT_TRUE(calls.has("app_control_add_extra_data value=off"));
     EXPECT_TRUE(isNormal());
-    EXPECT_NE(nullptr, _screen->row("b_001.m4a"));
 }
 
 TEST_F(RecordingsOperationsTest, AMoveEndsByItselfHoweverItStops)
@@ -180,6 +182,53 @@ TEST_F(RecordingsOperationsTest, AMoveEndsByItselfHoweverItStops)
     support::runFor(0.5);
     EXPECT_TRUE(fs::exists(ui::recordingPath("c.m4a")));
     EXPECT_TRUE(isNormal());
+}
+
+TEST_F(RecordingsOperationsTest, OpensThePrivateStorageForAsLongAsItIsNeeded)
+{
+    support::writeFile(privatePath("d.m4a"), "d");
+    support::enterRows({{privatePath("d.m4a"), 60000, 30}});
+    _screen->announce(MwSignalMgr::MEDIA_DB_UPDATED);
+    EXPECT_EQ(nullptr, _screen->row("d.m4a"));
+    const auto serve = [](int number, bool open) {
+        vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, open ? 1 : 0);
+        ui::answer(ui::launches.at(number), APP_CONTROL_RESULT_SUCCEEDED, {{"result", "Success"}});
+    };
+    _screen->chooseMenu("Remove from private");
+    EXPECT_TRUE(isNormal()) << "not before the storage is open";
+    serve(0, true);
+    EXPECT_NE(nullptr, _screen->row("d.m4a"));
+    EXPECT_FALSE(isNormal());
+    calls.clear();
+    _screen->back(); // without a move
+    EXPECT_TRUE(calls.has("app_control_add_extra_data value=off"));
+    vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, 0);
+    _screen->announce(MwSignalMgr::PRIVATE_STORAGE_CHANGED);
+    EXPECT_EQ(nullptr, _screen->row("d.m4a"));
+
+    ui::launches.clear();
+    _screen->chooseMenu("Show private recordings");
+    serve(0, true);
+    _screen->announce(MwSignalMgr::PRIVATE_STORAGE_CHANGED);
+    EXPECT_NE(nullptr, _screen->row("d.m4a"));
+    ui::launches.clear();
+    calls.clear();
+    _screen->chooseMenu("Hide private recordings");
+    EXPECT_TRUE(calls.has("app_control_add_extra_data value=off"));
+    vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, 0);
+    _screen->announce(MwSignalMgr::PRIVATE_STORAGE_CHANGED);
+
+    ::setenv("MEWLO_PRIVATE_SECONDS", "0.2", 1);
+    fakes::desktop.lastMessage.clear();
+    select("Move to private", {"a.m4a"});
+    _screen->back(); // the list is not held up meanwhile
+    select("Move to private", {"b.m4a"}); // nobody answers
+    EXPECT_TRUE(runUntil([] { return !fakes::desktop.lastMessage.empty(); }, 5));
+    EXPECT_EQ("The private storage is not available.", fakes::desktop.lastMessage);
+    EXPECT_TRUE(calls.has("app_control_send_terminate_request"));
+    ui::answer(ui::launches.back(), APP_CONTROL_RESULT_SUCCEEDED, {{"result", "Success"}});
+    EXPECT_EQ("", popupName()) << "too late";
+    ::unsetenv("MEWLO_PRIVATE_SECONDS");
 }
 
 TEST_F(RecordingsOperationsTest, AScreenLeftInAClashAndLateRepliesDoNoHarm)

@@ -435,12 +435,14 @@ TEST_F(RecordingsScreenTest, MovingToPrivateListsWhatIsOutside)
     support::enterRows({{inside, 60000, 30}, {ui::recordingPath("Open.m4a"), 60000, 20}});
     media_content_disconnect();
     vconf_set_int("db/setting/personal_unlock_method", 1);
+    vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, 1);
     RecordingsScreen screen;
     screen.open();
     const Names entries = screen.menu();
-    EXPECT_EQ((Names{"Delete", "Share", "Rename", "Move to private", "Remove from private"}), entries);
+    EXPECT_EQ((Names{"Delete", "Share", "Rename", "Move to private", "Remove from private", "Hide private recordings"}),
+        entries);
     screen.back();
-    if (entries.size() < 5)
+    if (entries.size() < 6)
         return;
     screen.chooseMenu("Move to private");
     EXPECT_EQ((Names{"all", "Open.m4a"}), screen.names());
@@ -448,6 +450,15 @@ TEST_F(RecordingsScreenTest, MovingToPrivateListsWhatIsOutside)
     EXPECT_EQ((Names{"Secret.m4a", "Open.m4a"}), screen.names());
     screen.chooseMenu("Remove from private");
     EXPECT_EQ((Names{"all", "Secret.m4a"}), screen.names());
+    vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, 0);
+    screen.announce(MwSignalMgr::PRIVATE_STORAGE_CHANGED);
+    EXPECT_EQ(Names{"Open.m4a"}, screen.names()) << "handed back: not listed, whatever is being done";
+    vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, 1);
+    screen.announce(MwSignalMgr::PRIVATE_STORAGE_CHANGED);
+    screen.tap("Secret.m4a");
+    vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, 0);
+    screen.announce(MwSignalMgr::PRIVATE_STORAGE_CHANGED);
+    EXPECT_FALSE(screen.hasPlayer()) << "nor played on";
 }
 
 }

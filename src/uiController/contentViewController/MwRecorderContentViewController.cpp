@@ -202,6 +202,7 @@ void MwRecorderContentViewController::_systemInfoChanged(MwSignalMgr::SystemInfo
     case MwSignalMgr::THEME_CHANGED:
     case MwSignalMgr::CALL_REJECT_CHANGED:
     case MwSignalMgr::MICROPHONE_BACK:
+    case MwSignalMgr::PRIVATE_STORAGE_CHANGED:
         return;
     }
 }

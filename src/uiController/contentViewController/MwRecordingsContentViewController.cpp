@@ -18,6 +18,7 @@
 #include "MwRecordingsRows.h"
 #include "MwRenamePopupController.h"
 #include "MwResourceMgr.h"
+#include "MwSystemMgr.h"
 #include "MwText.h"
 
 namespace {
@@ -113,7 +114,7 @@ void MwRecordingsContentViewController::onDestroy()
         _announcePlayViewClosed();
     _trimView = nullptr;
     _destroyShareRequest(true);
-    _destroyPrivateModeRequest(true);
+    _privateStorage->cancel();
     if (_fileOperator)
         _deleteFileOperator();
     _closeRenamePopup();
@@ -132,9 +133,10 @@ bool MwRecordingsContentViewController::onPop()
     getModel()->setTrimMode(false);
     getModel()->destroyRecordedFileList();
     _destroyShareRequest(true);
-    _destroyPrivateModeRequest(true);
+    _privateStorage->cancel();
     if (_fileOperator)
         _deleteFileOperator();
+    _privateStorage->handBack();
     return MwContentViewController::onPop();
 }
 
@@ -197,7 +199,17 @@ void MwRecordingsContentViewController::_onSystemInfoSignal(MwSignalMgr::SystemI
     case MwSignalMgr::CALL_REJECT_CHANGED:
     case MwSignalMgr::MICROPHONE_BACK:
         return;
+    case MwSignalMgr::PRIVATE_STORAGE_CHANGED:
+        return _privateStorageChanged();
     }
+}
+
+// What was opened for a move or its selection is not news.
+void MwRecordingsContentViewController::_privateStorageChanged()
+{
+    const bool isSelecting = _viewType == MOVE_TO_PRIVATE || _viewType == REMOVE_FROM_PRIVATE;
+    if (!_privateStorage->isOpening() && !(isSelecting && MwSystemMgr::getInstance()->isPrivateModeEnabled()))
+        _mediaDBUpdated();
 }
 
 void MwRecordingsContentViewController::_mediaDBUpdated()
@@ -223,7 +235,7 @@ void MwRecordingsContentViewController::_mediaDBUpdated()
 void MwRecordingsContentViewController::_forgetVanishedPlayPath()
 {
     const std::string path = getModel()->getCurrentPlayPath();
-    if (path.empty() || ecore_file_exists(path.c_str()))
+    if (path.empty() || (ecore_file_exists(path.c_str()) && !getModel()->isHiddenRecording(path)))
         return;
     getModel()->setCurrentPlayPath("");
     if (!elm_object_part_content_get(getEvasObject(), "elm.swallow.controller"))

@@ -13,6 +13,7 @@
 #include "MwContentViewController.h"
 #include "MwHandle.h"
 #include "MwModel.h"
+#include "MwPrivateStorage.h"
 #include "MwRecordingsListItem.h"
 #include "MwSignalMgr.h"
 
@@ -33,7 +34,7 @@ class WPopupController;
 // selects several for deleting, sharing and moving, opens bookmarks and details, and in request mode hands one back to
 // the caller. Its sources are split by concern: ...ContentViewController.cpp (life and signals), MwRecordingsList.cpp
 // (contents and redraw), MwRecordingsSelection.cpp (modes, title, taps), MwRecordingsMenu.cpp (menu, keys),
-// MwRecordingsFileOperations.cpp (delete, move), MwRecordingsSharing.cpp (share, private storage, rename).
+// MwRecordingsFileOperations.cpp (delete, move), MwRecordingsSharing.cpp (share, rename).
 // Owned by the naviframe. Main loop only.
 class MwRecordingsContentViewController : public MwContentViewController {
 public:
@@ -60,6 +61,7 @@ private:
     void _listen();
     void _onPlayerUpdateSignal();
     void _onSystemInfoSignal(MwSignalMgr::SystemInfo info);
+    void _privateStorageChanged();
     void _mediaDBUpdated();
     void _forgetVanishedPlayPath();
     void _formatChanged();
@@ -129,6 +131,8 @@ private:
     void _clickShareMenu();
     void _clickRenameMenu();
     void _addPrivateItems(panekit::WMenuPopupController& menu);
+    void _openPrivateMoveView();
+    void _togglePrivateRecordings();
     void _createDeletePopup(
         std::function<void()> confirmed, const char* question = "IDS_MW_POP_THIS_VOICE_RECORDING_WILL_BE_DELETED");
     void _openBookmarks();
@@ -158,7 +162,7 @@ private:
     void _onDeleteFiles();
     void _askToDeleteForGood(const std::vector<std::string>& pathList);
     void _catalogueShrank();
-    void _moveStart();
+    void _moveStart(const std::vector<std::string>& pathList);
     void _createMovingingPopupController();
     void _cancelMoving();
     void _updateMovePopup();
@@ -168,13 +172,10 @@ private:
     void _onMoveFiles();
     void _moveEnded(const MwFileOperator& fileOperator);
 
-    // Sharing, private storage and rename (MwRecordingsSharing.cpp)
+    // Sharing and rename (MwRecordingsSharing.cpp)
     bool _clickShareDoneButton(const std::vector<std::string>& pathList);
     void _shareReply(int result);
-    bool _requestPrivateModeAppControl(bool mount);
-    void _privateModeReply(app_control_h reply, int result);
     void _destroyShareRequest(bool terminate);
-    void _destroyPrivateModeRequest(bool terminate);
     void _openRenamePopup(const std::string& path);
     void _closeRenamePopup();
     void _renameResponseCb(const char* text, int response);
@@ -193,9 +194,8 @@ private:
     MwTrimViewController* _trimView = nullptr;
     std::unique_ptr<MwFileOperator> _fileOperator;
     std::unique_ptr<MwFileOperationPopup> _fileOperationPopup; // while an operator works
-    bool _privateStorageOpen = false; // asked for by a move, to be handed back
+    std::unique_ptr<MwPrivateStorage> _privateStorage = std::make_unique<MwPrivateStorage>(); // until the screen ends
     Request _shareRequest;
-    Request _privateModeRequest;
     panekit::WPopupController* _saveToPopup = nullptr; // deletes itself
     std::unique_ptr<MwRenamePopupController> _renamePopup;
     std::string _renameTarget; // path

@@ -176,21 +176,26 @@ void MwRecordingsContentViewController::_clickMoveDoneButton(const std::vector<s
         MW_LOGE("file operator is working");
         return;
     }
-    _fileOperator = _createFileOperator(
-        _viewType == MOVE_TO_PRIVATE ? MwFileOperator::MOVE_TO_PRIVATE : MwFileOperator::REMOVE_FROM_PRIVATE, pathList);
-    if (!_requestPrivateModeAppControl(true)) {
-        mwPost("IDS_MW_TPOP_PRIVATE_STORAGE_NOT_AVAILABLE");
-        _deleteFileOperator();
-    }
+    // Nothing else is held up while the service makes up its mind.
+    if (_privateStorage->isOpening())
+        return;
+    _privateStorage->open([this, pathList](bool open) {
+        if (open)
+            _moveStart(pathList);
+        else
+            mwPost("IDS_MW_TPOP_PRIVATE_STORAGE_NOT_AVAILABLE");
+    });
 }
 
-void MwRecordingsContentViewController::_moveStart()
+void MwRecordingsContentViewController::_moveStart(const std::vector<std::string>& pathList)
 {
-    // The user may have left the selection while the storage was made available.
-    if (_viewType != MOVE_TO_PRIVATE && _viewType != REMOVE_FROM_PRIVATE) {
-        _deleteFileOperator();
+    // The user may have left the selection, or begun something else, while the storage was made available.
+    if ((_viewType != MOVE_TO_PRIVATE && _viewType != REMOVE_FROM_PRIVATE) || _fileOperator) {
+        _privateStorage->handBack();
         return;
     }
+    _fileOperator = _createFileOperator(
+        _viewType == MOVE_TO_PRIVATE ? MwFileOperator::MOVE_TO_PRIVATE : MwFileOperator::REMOVE_FROM_PRIVATE, pathList);
     _fileOperationPopup = std::make_unique<MwFileOperationPopup>(getWindow());
     _createMovingingPopupController();
     _fileOperator->start();
@@ -291,6 +296,5 @@ void MwRecordingsContentViewController::_moveEnded(const MwFileOperator& fileOpe
         text += (text.empty() ? "" : " ") + notMovedText(fileOperator);
     if (!text.empty())
         notification_status_message_post(text.c_str());
-    if (std::exchange(_privateStorageOpen, false))
-        _requestPrivateModeAppControl(false);
+    _privateStorage->handBack();
 }

@@ -21,6 +21,7 @@
 #include "MwSaveToPopup.h"
 #include "MwStorageRoots.h"
 #include "MwSystemMgr.h"
+#include "MwText.h"
 #include "MwTrimViewController.h"
 
 using panekit::WMenuPopupController;
@@ -79,18 +80,20 @@ void MwRecordingsContentViewController::_clickMoreKey()
 {
     if (!_isComplete())
         return;
-    if (_noContents) {
+    if (_noContents && !getModel()->hasHiddenRecordings()) {
         MW_LOGW("No contents");
         return;
     }
-    if (!_genlist || getModel()->isTrimMode() || _viewType != NORMAL || _renamePopup || _saveToPopup || _fileOperator)
+    if (getModel()->isTrimMode() || _viewType != NORMAL || _renamePopup || _saveToPopup || _fileOperator)
         return;
     const std::string path = getModel()->getCurrentPlayPath();
     const MwFileInfo* info = path.empty() ? nullptr : getModel()->getRecordedFileInfoByPath(path);
     auto* menu = new WMenuPopupController();
-    menu->addItem("IDS_MW_OPT_DELETE", [this] { _clickDeleteMenu(); });
-    menu->addItem("IDS_MW_BODY_SHARE", [this] { _clickShareMenu(); });
-    menu->addItem("IDS_MUSIC_OPT_RENAME", [this] { _clickRenameMenu(); });
+    if (_genlist) {
+        menu->addItem("IDS_MW_OPT_DELETE", [this] { _clickDeleteMenu(); });
+        menu->addItem("IDS_MW_BODY_SHARE", [this] { _clickShareMenu(); });
+        menu->addItem("IDS_MUSIC_OPT_RENAME", [this] { _clickRenameMenu(); });
+    }
     if (info && bookmarkCount(info->mediaId) > 0)
         menu->addItem("IDS_MW_BODY_BOOKMARKS", [this] { _openBookmarks(); });
     if (info)
@@ -119,8 +122,36 @@ void MwRecordingsContentViewController::_addPrivateItems(WMenuPopupController& m
             _loadPrivateMoveView(MOVE_TO_PRIVATE);
         });
     }
-    if (files.inside)
-        menu.addItem("IDS_GALLERY_OPT_REMOVE_FROM_PRIVATE", [this] { _loadPrivateMoveView(REMOVE_FROM_PRIVATE); });
+    if (!files.inside && !getModel()->hasHiddenRecordings())
+        return;
+    menu.addItem("IDS_GALLERY_OPT_REMOVE_FROM_PRIVATE", [this] { _openPrivateMoveView(); });
+    menu.addItem(files.inside ? "IDS_MW_OPT_HIDE_PRIVATE_RECORDINGS" : "IDS_MW_OPT_SHOW_PRIVATE_RECORDINGS",
+        [this] { _togglePrivateRecordings(); });
+}
+
+void MwRecordingsContentViewController::_openPrivateMoveView()
+{
+    if (!getModel()->hasHiddenRecordings())
+        return _loadPrivateMoveView(REMOVE_FROM_PRIVATE);
+    _privateStorage->open([this](bool open) {
+        if (!open)
+            return mwPost("IDS_MW_TPOP_PRIVATE_STORAGE_NOT_AVAILABLE");
+        if (_viewType != NORMAL || _fileOperator)
+            return _privateStorage->handBack();
+        getModel()->createRecordedFileList();
+        _loadPrivateMoveView(REMOVE_FROM_PRIVATE);
+    });
+}
+
+// What is shown is hidden again with the screen at the latest, unless it was shown before.
+void MwRecordingsContentViewController::_togglePrivateRecordings()
+{
+    if (!getModel()->hasHiddenRecordings())
+        return _privateStorage->close();
+    _privateStorage->open([](bool open) {
+        if (!open)
+            mwPost("IDS_MW_TPOP_PRIVATE_STORAGE_NOT_AVAILABLE");
+    });
 }
 
 void MwRecordingsContentViewController::_enterViewType(ViewType type)
@@ -221,8 +252,11 @@ void MwRecordingsContentViewController::_clickBackKey()
         return;
     }
     getModel()->setCurrentPlayPath("");
-    if (_viewType == MOVE_TO_PRIVATE || _viewType == REMOVE_FROM_PRIVATE)
+    if (_viewType == MOVE_TO_PRIVATE || _viewType == REMOVE_FROM_PRIVATE) {
         _reloadNeeded = true;
+        _privateStorage->cancel();
+        _privateStorage->handBack();
+    }
     _viewType = _restingViewType();
     getModel()->setTrimMode(false);
     _update();

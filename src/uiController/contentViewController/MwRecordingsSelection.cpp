@@ -89,7 +89,7 @@ void MwRecordingsContentViewController::_loadMoreButton()
 {
     if (!getNaviItem())
         return;
-    const bool hasMenu = _viewType == NORMAL && _genlist;
+    const bool hasMenu = _viewType == NORMAL && (_genlist || getModel()->hasHiddenRecordings());
     Evas_Object* button = elm_object_item_part_content_get(getNaviItem(), MORE_PART);
     if (hasMenu && !button)
         setMoreButton([this] { _clickMoreKey(); });

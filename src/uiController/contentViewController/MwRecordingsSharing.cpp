@@ -1,12 +1,10 @@
-// The recordings list: sharing, the private storage's service, and renaming.
+// The recordings list: sharing and renaming.
 #include "MwRecordingsContentViewController.h"
 
 #include <algorithm>
-#include <map>
 #include <utility>
 
-#include <unistd.h>
-
+#include "MwAppReplies.h"
 #include "MwFileName.h"
 #include "MwFileOperator.h"
 #include "MwHandle.h"
@@ -15,51 +13,6 @@
 #include "MwText.h"
 
 namespace {
-
-constexpr auto PRIVATE_STORAGE_APP_ID = "com.tovanic.setting.private";
-
-// A reply may come when its request, and even the screen, are long gone: what travels with it is a number.
-struct ReplyHandler {
-    std::weak_ptr<void> alive;
-    std::function<void(app_control_h reply, app_control_result_e result)> handle;
-};
-
-std::map<uintptr_t, ReplyHandler>& replyHandlers()
-{
-    static std::map<uintptr_t, ReplyHandler> handlers;
-    return handlers;
-}
-
-void* expectReply(ReplyHandler handler)
-{
-    static uintptr_t last = 0;
-    std::erase_if(replyHandlers(), [](const auto& entry) { return entry.second.alive.expired(); });
-    replyHandlers()[++last] = std::move(handler);
-    return reinterpret_cast<void*>(last); // NOLINT(performance-no-int-to-ptr): a number
-}
-
-void replyCb(app_control_h, app_control_h reply, app_control_result_e result, void* userData)
-{
-    MW_LOGW("BEGIN - result : [%d], data : [%p]", result, userData);
-    if (!userData) {
-        MW_LOGE("user_data == nullptr");
-        return;
-    }
-    const auto found = replyHandlers().find(reinterpret_cast<uintptr_t>(userData));
-    if (found == replyHandlers().end())
-        return;
-    const ReplyHandler handler = found->second;
-    if (result != APP_CONTROL_RESULT_APP_STARTED || handler.alive.expired())
-        replyHandlers().erase(found);
-    if (!handler.alive.expired())
-        handler.handle(reply, result);
-}
-
-std::string extraOf(app_control_h reply, const char* key)
-{
-    char* value = nullptr;
-    return reply && app_control_get_extra_data(reply, key, &value) == 0 ? mwAdopt(value) : std::string();
-}
 
 void destroyRequest(MwHandle<app_control_h, app_control_destroy>& request, bool terminate)
 {
@@ -100,11 +53,12 @@ bool MwRecordingsContentViewController::_clickShareDoneButton(const std::vector<
         _destroyShareRequest(false);
     }
     Request request;
-    void* answer = expectReply({token(), [this](app_control_h, app_control_result_e result) { _shareReply(result); }});
+    void* answer
+        = MwAppReplies::expect(token(), [this](app_control_h, app_control_result_e result) { _shareReply(result); });
     if (!MW_CALL(app_control_create, request.out()) || !fillShareRequest(request.get(), pathList)
         || !MW_CALL(app_control_set_launch_mode, request.get(), APP_CONTROL_LAUNCH_MODE_GROUP)
         || !MW_CALL(app_control_enable_app_started_result_event, request.get())
-        || !MW_CALL(app_control_send_launch_request, request.get(), replyCb, answer)) {
+        || !MW_CALL(app_control_send_launch_request, request.get(), MwAppReplies::replyCb, answer)) {
         mwPost("IDS_MW_TPOP_NOTHING_TO_SHARE_WITH");
         return false;
     }
@@ -125,47 +79,6 @@ void MwRecordingsContentViewController::_shareReply(int result)
 void MwRecordingsContentViewController::_destroyShareRequest(bool terminate)
 {
     destroyRequest(_shareRequest, terminate);
-}
-
-void MwRecordingsContentViewController::_destroyPrivateModeRequest(bool terminate)
-{
-    destroyRequest(_privateModeRequest, terminate);
-}
-
-// Makes the private storage available for a move, or hands it back; nobody waits for the latter.
-bool MwRecordingsContentViewController::_requestPrivateModeAppControl(bool mount)
-{
-    Request request;
-    if (!MW_CALL(app_control_create, request.out())
-        || !MW_CALL(app_control_set_app_id, request.get(), PRIVATE_STORAGE_APP_ID)
-        || !MW_CALL(app_control_add_extra_data, request.get(), "type", "move_to_private")
-        || !MW_CALL(app_control_add_extra_data, request.get(), "pid", std::to_string(::getpid()).c_str())
-        || !MW_CALL(app_control_add_extra_data, request.get(), "value", mount ? "on" : "off")
-        || !MW_CALL(app_control_set_launch_mode, request.get(), APP_CONTROL_LAUNCH_MODE_GROUP))
-        return false;
-    if (!mount)
-        return MW_CALL(app_control_send_launch_request, request.get(), nullptr, nullptr);
-    void* answer = expectReply(
-        {token(), [this](app_control_h reply, app_control_result_e result) { _privateModeReply(reply, result); }});
-    if (!MW_CALL(app_control_send_launch_request, request.get(), replyCb, answer))
-        return false;
-    _privateModeRequest = std::move(request);
-    return true;
-}
-
-void MwRecordingsContentViewController::_privateModeReply(app_control_h reply, int result)
-{
-    MW_LOGW("result : [%d]", result);
-    _destroyPrivateModeRequest(true);
-    if (!_fileOperator)
-        return;
-    _privateStorageOpen = result == APP_CONTROL_RESULT_SUCCEEDED && extraOf(reply, "result") == "Success";
-    if (_privateStorageOpen) {
-        _moveStart();
-        return;
-    }
-    mwPost("IDS_MW_TPOP_PRIVATE_STORAGE_NOT_AVAILABLE");
-    _deleteFileOperator();
 }
 
 void MwRecordingsContentViewController::_openRenamePopup(const std::string& path)
