@@ -7,7 +7,9 @@
 #include <cstring>
 #include <dlfcn.h>
 #include <fcntl.h>
+#include <tuple>
 #include <unistd.h>
+#include <utility>
 
 namespace {
 
@@ -22,19 +24,16 @@ bool isWatched(const char* path)
     return watched[0] != '\0' && path != nullptr && std::strncmp(path, watched, std::strlen(watched)) == 0;
 }
 
-bool isWatched(int file)
+std::string pathOf(int file)
 {
     char link[64];
     char path[512];
-    if (watched[0] == '\0')
-        return false;
     std::snprintf(link, sizeof link, "/proc/self/fd/%d", file);
-    const ssize_t size = ::readlink(link, path, sizeof path - 1);
-    if (size <= 0)
-        return false;
-    path[size] = '\0';
-    return isWatched(path);
+    const ssize_t size = ::readlink(link, path, sizeof path);
+    return size > 0 ? std::string(path, static_cast<size_t>(size)) : std::string();
 }
+
+bool isWatched(int file) { return watched[0] != '\0' && isWatched(pathOf(file).c_str()); }
 
 // Whether this call is to fail.
 template <typename Place>
@@ -46,6 +45,41 @@ bool meets(Place place)
         ::kill(::getpid(), SIGKILL);
     errno = failure;
     return effect == support::faults::Effect::FAIL;
+}
+
+std::function<void(support::faults::Deed, const std::string&, off_t, std::string_view)> observer;
+
+void tell(support::faults::Deed deed, int file, off_t at, std::string_view data = {})
+{
+    if (const int error = errno; observer && isWatched(file)) {
+        observer(deed, pathOf(file), at, data);
+        errno = error;
+    }
+}
+template <typename... Arguments>
+void done(ssize_t, Arguments...)
+{
+}
+void done(ssize_t result, int file, const void* data, size_t, off_t at)
+{
+    if (result > 0)
+        tell(support::faults::Deed::WRITTEN, file, at, {static_cast<const char*>(data), static_cast<size_t>(result)});
+}
+void done(int result, int file, off_t size)
+{
+    if (result == 0)
+        tell(support::faults::Deed::CUT, file, size);
+}
+void done(int result, int file)
+{
+    if (result == 0)
+        tell(support::faults::Deed::FLUSHED, file, 0);
+}
+
+template <typename Result, typename Arguments>
+void report(Result result, const Arguments& arguments)
+{
+    std::apply([result](auto... each) { done(result, each...); }, arguments);
 }
 
 template <typename Function>
@@ -71,6 +105,11 @@ void disarm() { watched[0] = '\0'; }
 
 int count() { return calls; }
 
+void observe(std::function<void(Deed, const std::string&, off_t, std::string_view)> wanted)
+{
+    observer = std::move(wanted);
+}
+
 }
 
 // The thread sanitizer stands in front of the same calls and cannot be stood before.
@@ -80,7 +119,11 @@ int count() { return calls; }
     type name parameters                                                                                               \
     {                                                                                                                  \
         static auto* const next = real<type parameters>(#name);                                                        \
-        return meets(place) ? -1 : next arguments;                                                                     \
+        if (meets(place))                                                                                              \
+            return -1;                                                                                                 \
+        const type result = next arguments;                                                                            \
+        report(result, std::tuple arguments);                                                                          \
+        return result;                                                                                                 \
     }
 
 extern "C" {

@@ -1,6 +1,8 @@
 #include <gtest/gtest.h>
 #include <panekit/WWindowController.h>
 #include <preference.h>
+#include <sys/wait.h>
+#include <unistd.h>
 #include <vconf.h>
 
 #include "MwAppController.h"
@@ -11,6 +13,7 @@
 #include "MwText.h"
 #include "fakes/Fakes.h"
 #include "support/DatabaseRows.h"
+#include "support/FaultyCalls.h"
 #include "support/Recordings.h"
 #include "support/RunUntil.h"
 
@@ -279,6 +282,81 @@ TEST_F(RecordingFlowTest, DiscardingReleasesThePowerLock)
     calls.clear();
     EXPECT_TRUE(dispatch(MwAppController::CANCEL_RECORDING));
     EXPECT_TRUE(calls.has("device_power_release_lock 0"));
+}
+
+// What the next start finds: the recorder's service gives back what still lies in the temporary place.
+void startAgain(MwModel& model, const std::string& temporary)
+{
+    fakes::recorder.onRescue = [&](const char*, recorder_leftover_cb callback, void* data) {
+        if (!std::filesystem::exists(temporary))
+            return 0;
+        const std::string moved = temporary + "_rescued"; // as the service does
+        std::filesystem::rename(temporary, moved);
+        const bool hasNotes = std::filesystem::exists(temporary + ".notes");
+        if (hasNotes)
+            std::filesystem::rename(temporary + ".notes", moved + ".notes");
+        callback(RECORDER_LEFTOVER_REBUILT, moved.c_str(), RECORDER_FILE_FORMAT_MP4, 5000,
+            hasNotes ? (moved + ".notes").c_str() : nullptr, data);
+        return 1;
+    };
+    MwRecordingRescue::run(model);
+}
+
+TEST_F(RecordingFlowTest, ASaveCutOffAnywhereLeavesOneRecordingWithItsMarks)
+{
+#ifdef __SANITIZE_THREAD__
+    GTEST_SKIP() << "the thread sanitizer ends forked children that start threads";
+#endif
+    using support::faults::Effect;
+    for (const Effect effect : {Effect::FAIL, Effect::KILL}) {
+        int point = 0;
+        for (bool isOver = false; !isOver && !HasFailure();) {
+            SCOPED_TRACE((effect == Effect::KILL ? "killed at call " : "failing call ") + std::to_string(++point));
+            std::filesystem::remove_all(support::deviceRoot());
+            std::filesystem::create_directories(support::deviceRoot());
+            media_content_scan_all();
+            startRecording();
+            const std::string temporary = fakes::recorder.fileName;
+            for (unsigned int second = 1; second <= 2; ++second) {
+                _model.setElapsedTime(second * 1000);
+                ASSERT_TRUE(_model.addBookMark(second));
+            }
+            if (effect == Effect::FAIL) {
+                support::faults::arm("/", point, effect, EIO);
+                stop();
+                isOver = support::faults::count() < point;
+                support::faults::disarm();
+            } else {
+                media_content_disconnect();
+                const pid_t child = ::fork();
+                if (child == 0) {
+                    media_content_connect();
+                    support::faults::arm("/", point, effect);
+                    stop();
+                    ::_exit(0);
+                }
+                int status = 0;
+                ::waitpid(child, &status, 0);
+                isOver = !WIFSIGNALED(status);
+                media_content_connect();
+                fakes::recorder.onStart = nullptr; // ends the take here, too, without a trace
+                calls.failWith("recorder_commit", -1);
+                stop();
+                calls.clear();
+                fakes::recorder.onStart = [] { support::writeFile(fakes::recorder.fileName, "sound"); };
+            }
+            startAgain(_model, temporary);
+            media_content_scan_all();
+            _model.createRecordedFileList();
+            ASSERT_EQ(1U, _model.getRecordedFileList().size());
+            const MwFileInfo& info = _model.getRecordedFileList().front();
+            EXPECT_EQ("sound", support::readFile(info.path));
+            EXPECT_EQ(2, bookmarksOf(info.mediaId));
+            EXPECT_EQ(1, std::distance(std::filesystem::directory_iterator(support::recordingsDirectory()), {}));
+            media_info_delete_from_db(info.mediaId.c_str());
+        }
+        EXPECT_GT(point, 5);
+    }
 }
 
 TEST_F(RecordingFlowTest, MarksWaitBesideTheRecordingUntilTheirRowsAreThere)
