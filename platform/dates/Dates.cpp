@@ -4,9 +4,27 @@
 #include <unicode/udatpg.h>
 #include <unicode/ustring.h>
 
+#include <ctime>
 #include <string>
+#include <string_view>
 
 namespace {
+
+constexpr std::u16string_view LOCAL = u"localtime";
+
+struct Format {
+    UDateFormat* format;
+    bool isLocal; // formats Universal Time, to which the C library's offset is added
+};
+
+Format* formatOf(i18n_udate_h handle) { return static_cast<Format*>(handle); }
+
+double localOffset(double milliseconds)
+{
+    const auto seconds = static_cast<std::time_t>(milliseconds / 1000);
+    std::tm local{};
+    return localtime_r(&seconds, &local) != nullptr ? static_cast<double>(local.tm_gmtoff) * 1000 : 0;
+}
 
 // Nearly every call of the library warns (with a negative code); only positive codes are failures.
 int toError(UErrorCode code) { return U_FAILURE(code) ? static_cast<int>(code) : I18N_ERROR_NONE; }
@@ -70,8 +88,16 @@ int i18n_udate_create(i18n_udate_format_style_e time_style, i18n_udate_format_st
     if (format == nullptr)
         return I18N_ERROR_INVALID_PARAMETER;
     UErrorCode code = U_ZERO_ERROR;
-    *format = udat_open(static_cast<UDateFormatStyle>(time_style), static_cast<UDateFormatStyle>(date_style), locale,
-        time_zone, time_zone_length, pattern, pattern_length, &code);
+    const int32_t zoneLength = time_zone == nullptr ? 0
+        : time_zone_length >= 0                     ? time_zone_length
+                                                    : u_strlen(time_zone);
+    const std::u16string_view zone(time_zone, static_cast<size_t>(zoneLength));
+    const bool isLocal = zone == LOCAL;
+    if (isLocal)
+        ::tzset(); // it may have changed
+    UDateFormat* made = udat_open(static_cast<UDateFormatStyle>(time_style), static_cast<UDateFormatStyle>(date_style),
+        locale, isLocal ? u"UTC" : time_zone, isLocal ? -1 : time_zone_length, pattern, pattern_length, &code);
+    *format = made != nullptr ? new Format{made, isLocal} : nullptr;
     return toError(code);
 }
 
@@ -81,7 +107,8 @@ int i18n_udate_format_date(
     if (format == nullptr || text == nullptr || text_length == nullptr)
         return I18N_ERROR_INVALID_PARAMETER;
     UErrorCode code = U_ZERO_ERROR;
-    *text_length = udat_format(static_cast<UDateFormat*>(format), date, text, capacity, nullptr, &code);
+    const double shown = date + (formatOf(format)->isLocal ? localOffset(date) : 0);
+    *text_length = udat_format(formatOf(format)->format, shown, text, capacity, nullptr, &code);
     return toError(code);
 }
 
@@ -89,7 +116,8 @@ int i18n_udate_destroy(i18n_udate_h format)
 {
     if (format == nullptr)
         return I18N_ERROR_INVALID_PARAMETER;
-    udat_close(static_cast<UDateFormat*>(format));
+    udat_close(formatOf(format)->format);
+    delete formatOf(format);
     return I18N_ERROR_NONE;
 }
 

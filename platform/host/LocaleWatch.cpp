@@ -1,5 +1,6 @@
 #include "LocaleWatch.h"
 
+#include <algorithm>
 #include <cstdlib>
 #include <map>
 
@@ -47,6 +48,19 @@ std::string LocaleWatch::plainLocale(const std::string& locale)
     return plain.empty() || plain == "C" || plain == "POSIX" ? "en_US" : plain;
 }
 
+std::string LocaleWatch::regionOf(const std::string& locale)
+{
+    static const std::map<std::string, std::string> SCRIPTS
+        = {{"arabic", "Arab"}, {"cyrillic", "Cyrl"}, {"devanagari", "Deva"}, {"iqtelif", "Latn"}, {"latin", "Latn"}};
+    std::string plain = plainLocale(locale);
+    const size_t at = locale.find('@');
+    const auto script
+        = SCRIPTS.find(at != std::string::npos ? locale.substr(at + 1, locale.find(':', at) - at - 1) : "");
+    if (script == SCRIPTS.end())
+        return plain;
+    return plain.insert(std::min(plain.find('_'), plain.size()), "_" + script->second);
+}
+
 void LocaleWatch::start()
 {
     const std::string language = firstSet({"LANGUAGE", "LC_ALL", "LC_MESSAGES", "LANG"});
@@ -56,7 +70,7 @@ void LocaleWatch::start()
     if (!_languageIsOpen)
         _sink(LANGUAGE_KEY, plainLocale(language));
     if (!_regionIsOpen)
-        _sink(REGION_KEY, plainLocale(region));
+        _sink(REGION_KEY, regionOf(region));
     BusInLoop* bus = systemBus();
     if (bus == nullptr || (!_languageIsOpen && !_regionIsOpen))
         return;
@@ -84,7 +98,7 @@ void LocaleWatch::_readSystem(sd_bus_message* message)
         if (_languageIsOpen)
             _sink(LANGUAGE_KEY, plainLocale(all["LC_MESSAGES"].empty() ? common : all["LC_MESSAGES"]));
         if (_regionIsOpen)
-            _sink(REGION_KEY, plainLocale(all["LC_TIME"].empty() ? common : all["LC_TIME"]));
+            _sink(REGION_KEY, regionOf(all["LC_TIME"].empty() ? common : all["LC_TIME"]));
     });
 }
 

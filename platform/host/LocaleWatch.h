@@ -20,6 +20,8 @@ public:
 
     // Without codeset and modifier; "C" and "POSIX" are American English.
     static std::string plainLocale(const std::string& locale);
+    // The same with the script that a modifier names: "sr_RS@latin" is "sr_Latn_RS".
+    static std::string regionOf(const std::string& locale);
 
 private:
     void _readSystem(sd_bus_message* message);

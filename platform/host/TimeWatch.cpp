@@ -1,6 +1,7 @@
 #include "TimeWatch.h"
 
 #include <cerrno>
+#include <cstdlib>
 #include <ctime>
 #include <limits>
 #include <utility>
@@ -14,7 +15,8 @@ TimeWatch::TimeWatch(KeySink sink)
     : _sink(std::move(sink))
     , _properties("org.freedesktop.timedate1", "/org/freedesktop/timedate1", "org.freedesktop.timedate1",
           [this](const std::string& name, const std::string& value) {
-              if (name == "Timezone" && !value.empty())
+              const char* own = std::getenv("TZ"); // the user's, for this program
+              if (name == "Timezone" && !value.empty() && (own == nullptr || *own == '\0'))
                   _sink("db/setting/timezone", value);
           })
 {

@@ -6,6 +6,9 @@ enum system_settings_key_e {
     SYSTEM_SETTINGS_KEY_LOCALE_TIMEZONE = 15,
     SYSTEM_SETTINGS_KEY_TIME_CHANGED = 16,
 };
+// The time zone of the C library, where it has no name; i18n_udate_create takes it as one.
+#define SYSTEM_SETTINGS_TIMEZONE_LOCAL "localtime"
+
 typedef void (*system_settings_changed_cb)(system_settings_key_e key, void* user_data);
 
 extern "C" {

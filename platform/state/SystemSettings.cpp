@@ -46,19 +46,47 @@ bool isTwelveHourRegion(const std::string& region)
     constexpr std::array<std::string_view, 34> TERRITORIES
         = {"US", "CA", "AU", "NZ", "IN", "PK", "BD", "PH", "MY", "SG", "KR", "EG", "SA", "AE", "KW", "QA", "BH", "OM",
             "JO", "IQ", "SY", "YE", "LY", "SD", "CO", "DO", "PR", "VE", "GR", "CY", "AL", "TW", "JM", "HK"};
-    const size_t line = region.find('_');
+    // A script of four letters may stand before the territory.
+    size_t line = region.find('_');
+    if (line != std::string::npos && region.find('_', line + 1) == line + 5)
+        line += 5;
     const std::string territory = line != std::string::npos ? region.substr(line + 1, 2) : "US";
     return !region.starts_with("fr_")
         && std::find(TERRITORIES.begin(), TERRITORIES.end(), territory) != TERRITORIES.end();
 }
 
+// The name of a zone file, empty when it lies elsewhere.
+std::string zoneOfFile(const std::string& path)
+{
+    constexpr std::string_view MARK = "zoneinfo/";
+    const size_t at = path.find(MARK);
+    return at != std::string::npos ? path.substr(at + MARK.size()) : std::string();
+}
+
+// Where the system's own time has no name (a copied zone file, a rule), the C library knows it all the same.
 std::string zoneOfLocaltime()
 {
     std::error_code error;
-    const std::string target = std::filesystem::read_symlink("/etc/localtime", error);
-    constexpr std::string_view MARK = "zoneinfo/";
-    const size_t at = target.find(MARK);
-    return at != std::string::npos ? target.substr(at + MARK.size()) : "UTC";
+    if (!std::filesystem::exists("/etc/localtime", error))
+        return "UTC";
+    const std::string name = zoneOfFile(std::filesystem::read_symlink("/etc/localtime", error));
+    return name.empty() ? SYSTEM_SETTINGS_TIMEZONE_LOCAL : name;
+}
+
+// TZ holds a name, a file, or a rule such as "CET-1CEST,M3.5.0,M10.5.0/3"; the first two with or without a colon.
+std::string zoneOfVariable(std::string zone)
+{
+    zone.erase(0, zone.starts_with(':') ? 1 : 0);
+    std::error_code error;
+    if (zone.starts_with('/')) {
+        std::string name = zoneOfFile(std::filesystem::canonical(zone, error));
+        return name.empty() ? SYSTEM_SETTINGS_TIMEZONE_LOCAL : name;
+    }
+    const char* directory = std::getenv("TZDIR");
+    const std::string file = std::string(directory != nullptr ? directory : "/usr/share/zoneinfo") + "/" + zone;
+    const bool isRule = zone.find_first_of(",<") != std::string::npos;
+    const bool isName = !isRule && (zone.find('/') != std::string::npos || std::filesystem::exists(file, error));
+    return isName ? zone : SYSTEM_SETTINGS_TIMEZONE_LOCAL;
 }
 
 std::string timeZone()
@@ -66,9 +94,7 @@ std::string timeZone()
     if (auto known = stateTree().read(platform::KEY_TIME_ZONE); known && !known->empty())
         return *known;
     const char* variable = std::getenv("TZ");
-    const std::string_view zone = variable != nullptr ? variable : "";
-    const bool named = !zone.empty() && zone.find_first_of(":,<") == std::string_view::npos;
-    return named ? std::string(zone) : zoneOfLocaltime();
+    return variable != nullptr && *variable != '\0' ? zoneOfVariable(variable) : zoneOfLocaltime();
 }
 
 }

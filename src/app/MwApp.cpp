@@ -94,7 +94,7 @@ void MwApp::_bindTextDomain()
 
 void MwApp::_installEventHandlers()
 {
-    _languageChangedHandler.add(APP_EVENT_LANGUAGE_CHANGED, [](app_event_info_h info) { _languageChanged(info); });
+    _languageChangedHandler.add(APP_EVENT_LANGUAGE_CHANGED, [this](app_event_info_h info) { _languageChanged(info); });
     _regionFormatChangedHandler.add(APP_EVENT_REGION_FORMAT_CHANGED, [](app_event_info_h) {
         MwSignalMgr::getInstance()->getSystemInfoSignal().emit(MwSignalMgr::REGION_FORMAT_CHANGED);
     });
@@ -110,7 +110,10 @@ void MwApp::_languageChanged(app_event_info_h info)
     MW_LOGI("language changed - [%s]", language.c_str());
     // Also does what elm_language_set does, and falls back to English where there is no such translation.
     panekit::WLanguage::use(language);
+    _renewTitle();
 }
+
+void MwApp::_renewTitle() { elm_win_title_set(getWindow()->getEvasObject(), mwTranslate("IDS_MW_APP_NAME").c_str()); }
 
 bool MwApp::_createWindow()
 {
@@ -120,7 +123,7 @@ bool MwApp::_createWindow()
         return false;
     }
     Evas_Object* window = getWindow()->getEvasObject();
-    elm_win_title_set(window, mwTranslate("IDS_MW_APP_NAME").c_str());
+    _renewTitle();
     elm_win_wm_rotation_preferred_rotation_set(window, 0);
     elm_win_indicator_mode_set(window, static_cast<Elm_Win_Indicator_Mode>(INDICATOR_SHOWN));
     elm_win_indicator_opacity_set(window, static_cast<Elm_Win_Indicator_Opacity_Mode>(INDICATOR_TRANSPARENT));

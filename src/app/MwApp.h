@@ -46,7 +46,8 @@ private:
     void _rescueOnce();
     void _checkMainAppRecordingState();
     void _createMainAppRecordingPopup();
-    static void _languageChanged(app_event_info_h info);
+    void _languageChanged(app_event_info_h info);
+    void _renewTitle();
     void _lowBatteryEventCb();
     static void _recordingStopRequestCb(const char* key, void* userData);
 

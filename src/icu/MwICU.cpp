@@ -123,7 +123,7 @@ void* MwICU::_getFormat(Kind kind)
     return _format;
 }
 
-std::optional<std::string> MwICU::getICUstring(uint32_t seconds, Kind kind)
+std::optional<std::string> MwICU::getICUstring(int64_t seconds, Kind kind)
 {
     void* format = _getFormat(kind);
     if (!format) {
@@ -132,7 +132,8 @@ std::optional<std::string> MwICU::getICUstring(uint32_t seconds, Kind kind)
     }
     Units text{};
     int32_t length = 0;
-    if (!MW_CALL(i18n_udate_format_date, format, seconds * 1000.0, text.data(), MAX_UNITS, &length))
+    if (!MW_CALL(
+            i18n_udate_format_date, format, static_cast<double>(seconds) * 1000.0, text.data(), MAX_UNITS, &length))
         return std::nullopt;
     std::array<char, MAX_BYTES> bytes{};
     int32_t size = 0;

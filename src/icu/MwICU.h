@@ -16,8 +16,8 @@ public:
     MwICU(const MwICU&) = delete;
     MwICU& operator=(const MwICU&) = delete;
 
-    // seconds: since the epoch. Nothing when it cannot be written (logged).
-    [[nodiscard]] std::optional<std::string> getICUstring(uint32_t seconds, Kind kind);
+    // seconds: since the epoch, negative before 1970. Nothing when it cannot be written (logged).
+    [[nodiscard]] std::optional<std::string> getICUstring(int64_t seconds, Kind kind);
 
 private:
     void* _getFormat(Kind kind);

@@ -288,6 +288,9 @@ TEST(LocaleTest, DropsCodesetAndModifier)
     for (const auto& [locale, plain] : {std::pair("en_GB.UTF-8", "en_GB"), {"de_DE@euro", "de_DE"},
              {"C.UTF-8", "en_US"}, {"POSIX", "en_US"}, {"", "en_US"}, {"ko", "ko"}, {"de_AT:en", "de_AT"}})
         EXPECT_EQ(plain, host::LocaleWatch::plainLocale(locale)) << locale;
+    for (const auto& [locale, region] : {std::pair("sr_RS.UTF-8@latin", "sr_Latn_RS"), {"uz_UZ@cyrillic", "uz_Cyrl_UZ"},
+             {"ks_IN@devanagari:en", "ks_Deva_IN"}, {"sr@latin", "sr_Latn"}, {"de_DE@euro", "de_DE"}, {"C", "en_US"}})
+        EXPECT_EQ(region, host::LocaleWatch::regionOf(locale)) << locale;
 }
 
 TEST(MountTest, FindsTheFirstWritableCard)

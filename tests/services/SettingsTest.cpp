@@ -113,9 +113,14 @@ TEST(SystemSettingsTest, TimeZoneComesFromKeyThenEnvironment)
     ::setenv("TZ", "Asia/Seoul", 1);
     ASSERT_EQ(0, system_settings_get_value_string(SYSTEM_SETTINGS_KEY_LOCALE_TIMEZONE, &zone));
     EXPECT_EQ("Asia/Seoul", taken(zone));
-    ::setenv("TZ", "CET-1CEST,M3.5.0,M10.5.0/3", 1); // a rule, no name
-    ASSERT_EQ(0, system_settings_get_value_string(SYSTEM_SETTINGS_KEY_LOCALE_TIMEZONE, &zone));
-    EXPECT_EQ(std::string::npos, taken(zone).find(','));
+    for (const auto& [variable, expected] : {std::pair(":Asia/Seoul", "Asia/Seoul"), {"UTC", "UTC"},
+             {":/usr/share/zoneinfo/Asia/Seoul", "Asia/Seoul"}, {":/no/such/file", SYSTEM_SETTINGS_TIMEZONE_LOCAL},
+             {"CET-1CEST,M3.5.0,M10.5.0/3", SYSTEM_SETTINGS_TIMEZONE_LOCAL}, {"XYZ-5", SYSTEM_SETTINGS_TIMEZONE_LOCAL},
+             {"<+0545>-5:45", SYSTEM_SETTINGS_TIMEZONE_LOCAL}}) {
+        ::setenv("TZ", variable, 1);
+        ASSERT_EQ(0, system_settings_get_value_string(SYSTEM_SETTINGS_KEY_LOCALE_TIMEZONE, &zone));
+        EXPECT_EQ(expected, taken(zone)) << variable;
+    }
     int calls = 0;
     ASSERT_EQ(0,
         system_settings_set_changed_cb(

@@ -9,8 +9,8 @@
 
 namespace {
 
-constexpr uint32_t MORNING = 1700032380; // 2023-11-15 07:13 UTC
-constexpr uint32_t NOON = 1700051580; // 12:33 UTC
+constexpr int64_t MORNING = 1700032380; // 2023-11-15 07:13 UTC
+constexpr int64_t NOON = 1700051580; // 12:33 UTC
 
 void useSettings(const char* region, bool has24Hours, const char* zone = "UTC")
 {
@@ -19,7 +19,7 @@ void useSettings(const char* region, bool has24Hours, const char* zone = "UTC")
     vconf_set_str("db/setting/timezone", zone);
 }
 
-std::string write(uint32_t seconds, MwICU::Kind kind)
+std::string write(int64_t seconds, MwICU::Kind kind)
 {
     MwICU icu;
     return icu.getICUstring(seconds, kind).value_or("nothing");
@@ -83,6 +83,18 @@ TEST(MwICUTest, TakesRegionsAndTimeZonesAsTheyComeAndFallsBack)
     useSettings("en_US", true, "No/Such_Place");
     EXPECT_EQ("Wed, Nov 15, 2023, 07:13", write(MORNING, MwICU::DATE_AND_TIME));
     EXPECT_EQ("Sun, Feb 07, 2106", write(UINT32_MAX, MwICU::DATE));
+    EXPECT_EQ("Mon, Dec 01, 2200, 01:20", write(7286980800, MwICU::DATE_AND_TIME));
+    EXPECT_EQ("Wed, Dec 31, 1969, 23:59", write(-60, MwICU::DATE_AND_TIME));
+    EXPECT_EQ("Mon, Jan 01, 1900", write(-2208988800, MwICU::DATE));
+    useSettings("sr_Latn_RS", true);
+    EXPECT_NE(std::string::npos, write(MORNING, MwICU::DATE).find("nov")) << write(MORNING, MwICU::DATE);
+    // A zone without a name: each date has the offset of its own season.
+    ::setenv("TZ", "XYZ-5:45XYS,M3.5.0,M10.5.0/3", 1);
+    useSettings("en_US", true, "localtime");
+    EXPECT_EQ("Wed, Nov 15, 2023, 12:58", write(MORNING, MwICU::DATE_AND_TIME));
+    EXPECT_EQ("Sat, Jul 15, 2023, 12:45", write(1689379200 + 21600, MwICU::DATE_AND_TIME));
+    EXPECT_EQ("Thu, Jan 01, 1970, 05:45", write(0, MwICU::DATE_AND_TIME));
+    ::unsetenv("TZ");
 }
 
 TEST(MwICUTest, KeepsAFormatterUntilTheOtherKindIsAskedFor)

@@ -31,5 +31,5 @@ std::string mwDateText(Evas_Object* genlist, time_t time, MwICU::Kind kind)
         MW_LOGE("icu == nullptr!!!");
         return {};
     }
-    return icu->getICUstring(static_cast<uint32_t>(time), kind).value_or("");
+    return icu->getICUstring(time, kind).value_or("");
 }
