@@ -48,7 +48,8 @@ int media_content_unset_db_updated_cb(void);
 // Catalogues the files of a directory that the database does not know and drops the rows whose file is gone.
 // added and removed may be null.
 int media_content_scan_folder(const char* directory, int* added, int* removed);
-// The same for all recordings folders at once: a file that moved keeps its row and bookmarks.
+// The same for all recordings folders at once: a file that moved keeps its row and bookmarks, and one that did not tell
+// its length is asked again.
 int media_content_scan_all(void);
 // Catalogues one file anew, or drops its row when it is gone.
 int media_content_scan_file(const char* path);
@@ -88,6 +89,7 @@ int media_info_get_file_path(media_info_h media, char** path);
 int media_info_get_display_name(media_info_h media, char** name);
 int media_info_get_modified_time(media_info_h media, time_t* time);
 int media_info_get_audio(media_info_h media, audio_meta_h* audio);
+// 0 when the file does not tell.
 int audio_meta_get_duration(audio_meta_h audio, int* milliseconds);
 int audio_meta_destroy(audio_meta_h audio);
 

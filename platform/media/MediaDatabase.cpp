@@ -212,13 +212,16 @@ int Database::_openOnce()
         __dlog_print(LOG_ID_MAIN, DLOG_ERROR, "MEWLO", "media database cannot be opened: %s", sqlite3_errstr(result));
         _close();
     }
+    _isOpen = result == SQLITE_OK;
     return result;
 }
 
 void Database::_close()
 {
-    sqlite3_close_v2(_db);
-    _db = nullptr;
+    _isOpen = false;
+    sqlite3_close_v2(std::exchange(_db, nullptr));
+    const std::lock_guard lock(_readMutex);
+    sqlite3_close_v2(std::exchange(_reader, nullptr));
 }
 
 int Database::_migrate()
@@ -323,11 +326,7 @@ void Database::keepCopy()
         _isChanged = false;
 }
 
-bool Database::takeReplaced()
-{
-    const std::lock_guard lock(_mutex);
-    return std::exchange(_replaced, false);
-}
+bool Database::takeReplaced() { return _replaced.exchange(false); }
 
 // Runs the work under the lock; a database found damaged is replaced and the work tried once more.
 int Database::_guarded(const Work& work)
@@ -344,6 +343,32 @@ int Database::_guarded(const Work& work)
             result = work();
     }
     return result;
+}
+
+// What finds damage is done again where damage is repaired.
+int Database::_reading(const Reading& work)
+{
+    if (!_isOpen) {
+        if (const int result = open(); result != SQLITE_OK)
+            return result;
+    }
+    const int result = _readBeside(work);
+    return isDamage(result) ? _guarded([&] { return work(_db); }) : result;
+}
+
+int Database::_readBeside(const Reading& work)
+{
+    const std::lock_guard lock(_readMutex);
+    if (_reader == nullptr) {
+        const int result
+            = sqlite3_open_v2(_path.c_str(), &_reader, SQLITE_OPEN_READWRITE | SQLITE_OPEN_FULLMUTEX, nullptr);
+        sqlite3_busy_timeout(_reader, BUSY_TIMEOUT_MS);
+        if (result != SQLITE_OK) {
+            sqlite3_close_v2(std::exchange(_reader, nullptr));
+            return result;
+        }
+    }
+    return work(_reader);
 }
 
 int Database::_transaction(const Work& work)
@@ -363,9 +388,9 @@ int Database::_transaction(const Work& work)
 
 int Database::select(const Query& query, std::vector<MediaRow>& rows)
 {
-    return _guarded([&] {
+    return _reading([&](sqlite3* db) {
         rows.clear();
-        Statement statement(_db, std::string("SELECT ") + MEDIA_COLUMNS + " FROM media WHERE 1" + tailOf(query));
+        Statement statement(db, std::string("SELECT ") + MEDIA_COLUMNS + " FROM media WHERE 1" + tailOf(query));
         while (statement.step())
             rows.push_back(statement.mediaRow());
         return statement.code();
@@ -374,9 +399,9 @@ int Database::select(const Query& query, std::vector<MediaRow>& rows)
 
 int Database::find(const std::string& mediaId, std::optional<MediaRow>& row)
 {
-    return _guarded([&] {
+    return _reading([&](sqlite3* db) {
         row.reset();
-        Statement statement(_db, std::string("SELECT ") + MEDIA_COLUMNS + " FROM media WHERE MEDIA_ID = ?");
+        Statement statement(db, std::string("SELECT ") + MEDIA_COLUMNS + " FROM media WHERE MEDIA_ID = ?");
         if (statement.bind(mediaId).step())
             row = statement.mediaRow();
         return statement.code();
@@ -525,12 +550,12 @@ int Database::removeBookmark(int bookmarkId)
 
 int Database::selectBookmarks(const std::string& mediaId, const Query& query, std::vector<BookmarkRow>& rows)
 {
-    return _guarded([&] {
+    return _reading([&](sqlite3* db) {
         rows.clear();
         Query ordered = query;
         if (ordered.order.empty())
             ordered.order = "BOOKMARK_MARKED_TIME";
-        Statement statement(_db,
+        Statement statement(db,
             "SELECT BOOKMARK_ID, BOOKMARK_MARKED_TIME, BOOKMARK_NAME FROM bookmark WHERE MEDIA_ID = ?"
                 + tailOf(ordered));
         statement.bind(mediaId);
@@ -543,9 +568,9 @@ int Database::selectBookmarks(const std::string& mediaId, const Query& query, st
 
 int Database::selectWaveform(const Waveform& key, std::string& samples)
 {
-    return _guarded([&] {
+    return _reading([&](sqlite3* db) {
         samples.clear();
-        Statement statement(_db,
+        Statement statement(db,
             "SELECT WAVEFORM_SAMPLES FROM waveform WHERE WAVEFORM_PATH = ? AND WAVEFORM_SIZE = ? AND WAVEFORM_TIME = "
             "?");
         if (statement.bind(key.path).bind(key.size).bind(key.time).step())

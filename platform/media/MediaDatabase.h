@@ -2,6 +2,7 @@
 
 #include <sqlite3.h>
 
+#include <atomic>
 #include <functional>
 #include <memory>
 #include <mutex>
@@ -55,7 +56,8 @@ struct FileChanges {
     std::vector<std::string> removed;
 };
 
-// The SQLite file behind the media content interface: one connection, shared by all threads under a lock. Whatever else
+// The SQLite file behind the media content interface: a connection that writes and one that reads, each shared by all
+// threads under a lock, so that nobody who reads waits for the thousand rows of a writer. Whatever else
 // is in its place (damage, another program's database, a folder) is set aside, and a new one gets what can be salvaged
 // of it and of the last good copy beside it; the caller then compares it with the recordings.
 class Database {
@@ -101,8 +103,11 @@ public:
 private:
     class Statement;
     using Work = std::function<int()>;
+    using Reading = std::function<int(sqlite3* db)>;
 
     int _guarded(const Work& work);
+    int _reading(const Reading& work);
+    int _readBeside(const Reading& work);
     int _transaction(const Work& work);
     int _openOnce();
     int _putRow(MediaRow& row);
@@ -119,9 +124,12 @@ private:
 
     std::string _path;
     sqlite3* _db = nullptr;
-    bool _replaced = false;
+    std::atomic<bool> _replaced = false;
     bool _isChanged = false; // since the good copy
     std::recursive_mutex _mutex;
+    std::atomic<bool> _isOpen = false;
+    sqlite3* _reader = nullptr;
+    std::mutex _readMutex; // of the reader; taken last
 };
 
 }

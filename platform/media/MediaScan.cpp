@@ -51,7 +51,7 @@ namespace {
         std::vector<MediaRow> gone;
     };
 
-    void compareFolder(const std::string& folder, KnownRows known, Differences& differences)
+    void compareFolder(const std::string& folder, KnownRows known, Lengths lengths, Differences& differences)
     {
         std::error_code error;
         for (auto entry = std::filesystem::directory_iterator(folder, error);
@@ -61,9 +61,10 @@ namespace {
                 continue;
             const std::string path = folder + "/" + name;
             const auto row = known.extract(path);
-            if (!row.empty() && isUnchanged(row.mapped(), path))
+            const bool isSame = !row.empty() && isUnchanged(row.mapped(), path);
+            if (isSame && (lengths == Lengths::KNOWN || row.mapped().duration >= 0))
                 continue;
-            if (auto described = describeFile(path))
+            if (auto described = describeFile(path); described && (!isSame || described->duration >= 0))
                 (row.empty() ? differences.found : differences.changed).push_back(std::move(*described));
         }
         if (error)
@@ -108,14 +109,14 @@ std::vector<std::string> recordingFolders()
     return folders;
 }
 
-int scanFolders(Database& database, const std::vector<std::string>& folders, ScanCount& count)
+int scanFolders(Database& database, const std::vector<std::string>& folders, Lengths lengths, ScanCount& count)
 {
     std::vector<MediaRow> rows;
     if (const int result = database.select({}, rows); result != SQLITE_OK)
         return result;
     Differences differences;
     for (const std::string& folder : folders)
-        compareFolder(folder, takeRowsOf(rows, folder), differences);
+        compareFolder(folder, takeRowsOf(rows, folder), lengths, differences);
     count.added = static_cast<int>(differences.found.size());
     FileChanges changes = reconcile(std::move(differences));
     count.added -= static_cast<int>(changes.moved.size());

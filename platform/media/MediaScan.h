@@ -17,10 +17,14 @@ struct ScanCount {
     int changed = 0; // rows of any kind
 };
 
+// Whether files that did not tell their length are asked again, though they have not changed: a later version of this
+// program may know how to.
+enum class Lengths { KNOWN, ASKED_AGAIN };
+
 // Brings the rows in step with the files of the folders: new and changed files are read, rows whose file is gone are
 // dropped, and a file that was renamed or moved by another program keeps its row with the bookmarks. A folder that
 // cannot be read (a card pulled out) says nothing about its files. Any thread. Answers SQLite's code.
-int scanFolders(Database& database, const std::vector<std::string>& folders, ScanCount& count);
+int scanFolders(Database& database, const std::vector<std::string>& folders, Lengths lengths, ScanCount& count);
 
 // Held while a file and its row change together, by any process, so that no scan sees one without the other. Waits two
 // seconds at most: a process that hangs must not stop all others.

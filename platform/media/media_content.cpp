@@ -195,9 +195,10 @@ std::vector<media::BookmarkRow> bookmarkRows(const media_bookmark_entry_s* bookm
     return rows;
 }
 
-int scan(Connection& held, const std::vector<std::string>& folders, media::ScanCount& count)
+int scan(Connection& held, const std::vector<std::string>& folders, media::ScanCount& count,
+    media::Lengths lengths = media::Lengths::KNOWN)
 {
-    const int code = media::scanFolders(held.database, folders, count);
+    const int code = media::scanFolders(held.database, folders, lengths, count);
     // The finds are nobody's own change: process id 0 makes every listener reload.
     if (code == SQLITE_OK && count.changed > 0)
         held.notice.touch(0);
@@ -213,10 +214,12 @@ void refill(Connection& held)
 
 void openNow(Connection& held)
 {
-    const std::lock_guard lock(held.mutex);
-    held.database.open();
-    if (held.database.takeReplaced())
-        refill(held);
+    {
+        const std::lock_guard lock(held.mutex);
+        held.database.open();
+        if (held.database.takeReplaced())
+            refill(held);
+    }
     held.database.keepCopy();
 }
 
@@ -365,7 +368,7 @@ int media_content_scan_all(void)
     if (!held)
         return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
     media::ScanCount count;
-    return scan(*held, media::recordingFolders(), count);
+    return scan(*held, media::recordingFolders(), count, media::Lengths::ASKED_AGAIN);
 }
 
 int media_content_scan_file(const char* path)
@@ -583,9 +586,6 @@ int media_info_get_audio(media_info_h media, audio_meta_h* audio)
 {
     if (media == nullptr || audio == nullptr)
         return MEDIA_CONTENT_ERROR_INVALID_PARAMETER;
-    // A file that does not tell its duration may tell it now; one that is gone must not keep others from being listed.
-    if (media->row.duration < 0 && ::access(media->row.path.c_str(), R_OK) == 0)
-        return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
     *audio = new audio_meta_s{std::max(media->row.duration, 0)};
     return MEDIA_CONTENT_ERROR_NONE;
 }

@@ -60,8 +60,8 @@ public:
     [[nodiscard]] unsigned int getCatalogueRevision() const { return _catalogueRevision; }
     // Borrowed until the list changes; null when it is not listed.
     [[nodiscard]] const MwFileInfo* getRecordedFileInfoByPath(const std::string& path) const;
-    // Keep the list in step with a file that was deleted or renamed. False when the path is not listed.
-    bool removeRecordedFile(const std::string& path);
+    // Keep the list in step with files that were deleted or renamed. Answers how many were listed.
+    size_t removeRecordedFiles(const std::vector<std::string>& paths);
     bool renameRecordedFile(const std::string& path, const std::string& newPath, const std::string& newDisplayName);
     [[nodiscard]] std::optional<std::string> getPreviousPlayPath() const;
     [[nodiscard]] std::optional<std::string> getNextPlayPath() const;

@@ -4,6 +4,8 @@
 #include <vconf.h>
 
 #include <algorithm>
+#include <string_view>
+#include <unordered_set>
 
 #include "MwLog.h"
 #include "MwStorageRoots.h"
@@ -166,10 +168,11 @@ const MwFileInfo* MwModel::getRecordedFileInfoByPath(const std::string& path) co
     return found != _recordedFiles.end() ? &*found : nullptr;
 }
 
-bool MwModel::removeRecordedFile(const std::string& path)
+size_t MwModel::removeRecordedFiles(const std::vector<std::string>& paths)
 {
     ++_catalogueRevision;
-    return std::erase_if(_recordedFiles, [&](const MwFileInfo& info) { return info.path == path; }) > 0;
+    const std::unordered_set<std::string_view> removed(paths.begin(), paths.end());
+    return std::erase_if(_recordedFiles, [&](const MwFileInfo& info) { return removed.contains(info.path); });
 }
 
 bool MwModel::renameRecordedFile(const std::string& path, const std::string& newPath, const std::string& newDisplayName)

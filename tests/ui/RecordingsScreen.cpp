@@ -225,7 +225,7 @@ std::string enterRecordings(const std::vector<std::string>& files)
 
 void forgetRecordings()
 {
-    for (const char* suffix : {"", "-wal", "-shm"})
+    for (const char* suffix : {"", "-wal", "-shm", ".good"})
         std::filesystem::remove(support::databasePath() + suffix);
     for (const std::string& root : {support::deviceRoot(), std::string(std::getenv("MEWLO_PRIVATE_ROOT"))}) {
         for (const auto& entry : std::filesystem::directory_iterator(root))

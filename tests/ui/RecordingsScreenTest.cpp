@@ -405,6 +405,39 @@ TEST_F(RecordingsScreenTest, ALongListGrowsBehindItsFirstScreens)
     EXPECT_EQ("2000 selected", again.title());
 }
 
+TEST_F(RecordingsScreenTest, ThousandsThatComeAtOnceHoldNobodyAndMoveNothing)
+{
+    constexpr int MANY = 1500;
+    const auto enter = [](const std::string& prefix, long long newest) {
+        std::vector<support::DatabaseRow> rows;
+        for (int i = 0; i < MANY; ++i)
+            rows.push_back({ui::recordingPath(prefix + std::to_string(i) + ".m4a"), 60000, newest - i});
+        media_content_connect();
+        support::enterRows(rows);
+        media_content_disconnect();
+    };
+    enter("old", 10000);
+    RecordingsScreen screen;
+    screen.open();
+    ASSERT_TRUE(support::runUntil([&] { return screen.names().size() == MANY; }));
+    elm_genlist_item_show(screen.row("old700.m4a"), ELM_GENLIST_ITEM_SCROLLTO_TOP);
+    support::settle(screen.window);
+    const std::string top = screen.topRow();
+    enter("new", 20000);
+    MwSignalMgr::getInstance()->getSystemInfoSignal().emit(MwSignalMgr::MEDIA_DB_UPDATED);
+    EXPECT_LT(screen.names().size(), 2U * MANY) << "all at once";
+    ASSERT_TRUE(support::runUntil([&] { return screen.names().size() == 2 * MANY; }));
+    support::settle(screen.window);
+    EXPECT_EQ("new0.m4a", screen.names().front());
+    EXPECT_EQ(top, screen.topRow());
+    // As many go again.
+    ASSERT_TRUE(support::execute("DELETE FROM media WHERE MEDIA_DISPLAY_NAME LIKE 'new%'"));
+    screen.announce(MwSignalMgr::MEDIA_DB_UPDATED);
+    ASSERT_TRUE(support::runUntil([&] { return screen.names().size() == MANY; }));
+    support::settle(screen.window);
+    EXPECT_EQ(top, screen.topRow());
+}
+
 TEST_F(RecordingsScreenTest, TheKeyboardDoesWhatTheMouseDoes)
 {
     ui::enterRecordings({"A.m4a", "B.m4a", "C.m4a"});

@@ -5,9 +5,12 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <atomic>
 #include <functional>
 #include <thread>
 
+#include "support/Amr.h"
 #include "support/DatabaseRows.h"
 #include "support/Recordings.h"
 #include "support/RunUntil.h"
@@ -365,6 +368,59 @@ TEST_F(MediaDatabaseTest, FollowsTheFilesWhileWatched)
 
     std::filesystem::remove(recordingPath("b.m4a"));
     EXPECT_TRUE(become({}));
+    media_content_unset_db_updated_cb();
+}
+
+TEST_F(MediaDatabaseTest, NobodyWhoReadsWaitsForAScan)
+{
+    const std::string id = addRecording("a.m4a");
+    ASSERT_TRUE(
+        support::execute("CREATE TRIGGER slow AFTER INSERT ON media BEGIN SELECT count(*) FROM (WITH RECURSIVE "
+                         "c(x) AS (SELECT 1 UNION ALL SELECT x + 1 FROM c LIMIT 4000000) SELECT x FROM c); END"));
+    support::writeFile(recordingPath("b.m4a"), "x");
+    std::atomic<bool> hasEnded = false;
+    std::thread scanner([&] {
+        media_content_scan_all();
+        hasEnded = true;
+    });
+    std::this_thread::sleep_for(std::chrono::milliseconds(100)); // it writes by now
+    const Names before = names();
+    EXPECT_EQ(0, bookmarksOf(id));
+    EXPECT_FALSE(hasEnded);
+    EXPECT_EQ(Names{"a.m4a"}, before);
+    scanner.join();
+    EXPECT_EQ((Names{"a.m4a", "b.m4a"}), names());
+}
+
+TEST_F(MediaDatabaseTest, AnUnknownLengthIsAskedForByScansOnly)
+{
+    addRecording("a.amr", support::wideAmr(50));
+    addRecording("b.amr", "no sound");
+    ASSERT_TRUE(support::execute("UPDATE media SET MEDIA_DURATION=-1"));
+    const auto lengths = [] {
+        std::vector<int> found;
+        const auto collect = [](media_info_h media, void* data) {
+            audio_meta_h meta = nullptr;
+            int length = -1;
+            EXPECT_EQ(0, media_info_get_audio(media, &meta));
+            audio_meta_get_duration(meta, &length);
+            audio_meta_destroy(meta);
+            static_cast<std::vector<int>*>(data)->push_back(length);
+            return true;
+        };
+        media_info_foreach_media_from_db(nullptr, collect, &found);
+        std::sort(found.begin(), found.end());
+        return found;
+    };
+    EXPECT_EQ((std::vector<int>{0, 0}), lengths());
+    listen();
+    media_content_scan_all();
+    EXPECT_EQ((std::vector<int>{0, 1000}), lengths());
+    EXPECT_TRUE(support::runUntil([&] { return _heard.count > 0; }));
+    _heard = {};
+    media_content_scan_all();
+    support::runFor(0.2);
+    EXPECT_EQ(0, _heard.count) << "nothing new was found";
     media_content_unset_db_updated_cb();
 }
 

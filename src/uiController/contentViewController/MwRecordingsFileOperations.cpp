@@ -1,6 +1,8 @@
 // The recordings list: deleting and moving recordings.
 #include "MwRecordingsContentViewController.h"
 
+#include <string_view>
+#include <unordered_map>
 #include <utility>
 
 #include <Elementary.h>
@@ -65,10 +67,13 @@ std::string notMovedText(const MwFileOperator& fileOperator)
 std::unique_ptr<MwFileOperator> MwRecordingsContentViewController::_createFileOperator(
     int type, const std::vector<std::string>& pathList)
 {
+    std::unordered_map<std::string_view, const MwFileInfo*> known;
+    for (const MwFileInfo& info : getModel()->getRecordedFileList())
+        known.emplace(info.path, &info);
     std::vector<MwFileOperator::Source> sources;
     for (const std::string& path : pathList) {
-        const MwFileInfo* info = getModel()->getRecordedFileInfoByPath(path);
-        sources.push_back({path, info ? info->mediaId : std::string()});
+        const auto info = known.find(path);
+        sources.push_back({path, info != known.end() ? info->second->mediaId : std::string()});
     }
     if (type == MwFileOperator::DELETE || type == MwFileOperator::DELETE_FOR_GOOD)
         return std::make_unique<MwFileOperator>(static_cast<MwFileOperator::Type>(type), std::move(sources),
@@ -111,8 +116,7 @@ void MwRecordingsContentViewController::_cancelDeleting()
 
 void MwRecordingsContentViewController::_onDeleteFiles()
 {
-    for (const std::string& path : _fileOperator->donePaths())
-        getModel()->removeRecordedFile(path);
+    getModel()->removeRecordedFiles(_fileOperator->donePaths());
     if (_fileOperator->hasFailed())
         mwPost("IDS_MW_TPOP_SOME_RECORDINGS_NOT_DELETED");
     _catalogueShrank();
@@ -157,7 +161,7 @@ void MwRecordingsContentViewController::_deletePlayingFile()
         mwPost("IDS_MW_TPOP_SOME_RECORDINGS_NOT_DELETED");
         return;
     }
-    getModel()->removeRecordedFile(path);
+    getModel()->removeRecordedFiles({path});
     getModel()->setCurrentPlayPath("");
     _catalogueShrank();
     if (getModel()->getPlayerState() == 0)

@@ -57,10 +57,11 @@ Evas_Object* createMark(Evas_Object* genlist, const char* image, const char* col
 
 }
 
-MwRecordingsListItem::MwRecordingsListItem(const Context& context, MwFileInfo info, int index)
+MwRecordingsListItem::MwRecordingsListItem(const Context& context, MwFileInfo info, int index, bool isHighlighted)
     : _context(context)
     , _info(std::move(info))
     , _index(index)
+    , _highlighted(isHighlighted)
 {
 }
 

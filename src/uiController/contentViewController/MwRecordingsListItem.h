@@ -22,7 +22,7 @@ public:
     };
 
     // index: the row's value in the radio group, from 1.
-    MwRecordingsListItem(const Context& context, MwFileInfo info, int index);
+    MwRecordingsListItem(const Context& context, MwFileInfo info, int index, bool isHighlighted = false);
     // The row that selects all.
     explicit MwRecordingsListItem(const Context& context);
 

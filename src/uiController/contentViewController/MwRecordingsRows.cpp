@@ -5,7 +5,6 @@
 #include <algorithm>
 #include <cstdlib>
 #include <string_view>
-#include <unordered_set>
 #include <utility>
 
 #include "MwModel.h"
@@ -17,6 +16,8 @@ namespace {
 
 // Enough for the tallest window; the rest comes while the first rows can be seen and used already.
 constexpr size_t FIRST_ROWS = 64;
+// Each row that comes in between has the toolkit lay out the list at once, at its end thousands are laid out together.
+constexpr size_t MOST_CHANGES = 128;
 constexpr double FIRST_FRAME_SECONDS = 0.03;
 constexpr double SLICE_SECONDS = 0.004;
 constexpr int SELECT_ALL_HEIGHT = 112; // design units, as in its layout
@@ -89,7 +90,10 @@ void MwRecordingsRows::show(Files files)
         return;
     _files = files;
     _revision = revision;
-    _removeVanished();
+    const Paths wanted = _wantedPaths();
+    if (_countChanges(wanted) > MOST_CHANGES)
+        _startOver();
+    _removeVanished(wanted);
     _followCatalogue();
     if (_loaded < _catalogue().size() && _loader.expired())
         _loader = WTimer::addTimer(FIRST_FRAME_SECONDS, [this](void*) {
@@ -104,19 +108,70 @@ void MwRecordingsRows::finish()
     while (_loadSlice(SLICE_SECONDS)) { }
 }
 
-void MwRecordingsRows::_removeVanished()
+MwRecordingsRows::Paths MwRecordingsRows::_wantedPaths() const
+{
+    Paths paths;
+    if (!_first())
+        return paths;
+    for (const MwFileInfo& info : _catalogue()) {
+        if (_accepts(info))
+            paths.insert(info.path);
+    }
+    return paths;
+}
+
+// Rows that go, and those that come before the last one that stays.
+size_t MwRecordingsRows::_countChanges(const Paths& wanted) const
+{
+    size_t changes = 0;
+    std::vector<const Item*> staying;
+    forEachLoaded([&](const Item& row) {
+        if (wanted.contains(row.getPath()))
+            staying.push_back(&row);
+        else
+            ++changes;
+        return true;
+    });
+    auto row = staying.begin();
+    for (auto info = _catalogue().begin(); info != _catalogue().end() && row != staying.end(); ++info) {
+        if ((*row)->getPath() == info->path)
+            ++row;
+        else if (_accepts(*info))
+            ++changes;
+    }
+    return changes;
+}
+
+// All rows go and come again; what is chosen and where the keyboard is stays.
+void MwRecordingsRows::_startOver()
+{
+    const bool hasSelectAll = getSelectAll();
+    forEachLoaded([this](const Item& row) {
+        _former[row.getPath()] = {row.getIndex(), row.isHighlighted()};
+        return true;
+    });
+    elm_genlist_clear(_genlist);
+    if (hasSelectAll)
+        addSelectAll();
+    _moved = true;
+}
+
+MwRecordingsListItem* MwRecordingsRows::_make(const MwFileInfo& info)
+{
+    const auto former = _former.extract(info.path);
+    if (former.empty())
+        return new Item(_context, info, ++_lastIndex);
+    return new Item(_context, info, former.mapped().index, former.mapped().isHighlighted);
+}
+
+void MwRecordingsRows::_removeVanished(const Paths& wanted)
 {
     if (!_first())
         return;
-    std::unordered_set<std::string_view> kept;
-    for (const MwFileInfo& info : _catalogue()) {
-        if (_accepts(info))
-            kept.insert(info.path);
-    }
     bool removed = false;
     for (Item* row = _first(); row;) {
         Item* next = _next(row);
-        if (!kept.contains(row->getPath())) {
+        if (!wanted.contains(row->getPath())) {
             elm_object_item_del(row->getItem());
             removed = true;
         }
@@ -170,7 +225,7 @@ void MwRecordingsRows::_followCatalogue()
 // A row that moved to another place (former) stays the same for the user: checked or chosen as it was.
 MwRecordingsListItem* MwRecordingsRows::_insert(const MwFileInfo& info, Item* above, Item* former)
 {
-    auto* row = new Item(_context, info, former ? former->getIndex() : ++_lastIndex);
+    auto* row = former ? new Item(_context, info, former->getIndex()) : _make(info);
     if (former) {
         row->takeOver(*former);
         elm_object_item_del(former->getItem());
@@ -188,14 +243,33 @@ bool MwRecordingsRows::_loadSlice(double seconds)
 {
     show(_files);
     const double end = ecore_time_get() + seconds;
+    bool isPlaceThere = false;
     for (size_t count = 1; _loaded < _catalogue().size(); ++count) {
         const MwFileInfo& info = _catalogue()[_loaded++];
         if (_accepts(info))
-            (new Item(_context, info, ++_lastIndex))->append(_genlist);
+            _make(info)->append(_genlist);
+        isPlaceThere = isPlaceThere || (!_awaited.paths.empty() && info.path == _awaited.paths.front());
         if (count % ROWS_BETWEEN_LOOKS_AT_THE_CLOCK == 0 && ecore_time_get() > end)
             break;
     }
-    return _loaded < _catalogue().size();
+    const bool isMore = _loaded < _catalogue().size();
+    if (isPlaceThere || !isMore)
+        _restoreAwaited();
+    if (!isMore)
+        _former.clear();
+    return isMore;
+}
+
+// Unless the user has gone elsewhere meanwhile.
+void MwRecordingsRows::_restoreAwaited()
+{
+    const Place place = std::exchange(_awaited, {});
+    int scrolled = 0;
+    elm_scroller_region_get(_genlist, nullptr, &scrolled, nullptr, nullptr);
+    if (place.paths.empty() || scrolled > 0)
+        return;
+    _moved = true;
+    restore(place);
 }
 
 void MwRecordingsRows::addSelectAll()
@@ -388,13 +462,17 @@ void MwRecordingsRows::restore(const Place& place)
     if (!std::exchange(_moved, false))
         return;
     int y = 0;
+    bool isThere = place.paths.empty();
     for (size_t i = 0; i < place.paths.size(); ++i) {
         const int top = _yOf(place.paths[i], place.rowHeight);
         if (top < 0)
             continue;
         y = std::max(0, top - place.top - static_cast<int>(i) * place.rowHeight);
+        isThere = true;
         break;
     }
+    if (!isThere && _loaded < _catalogue().size())
+        _awaited = place;
     int height = 0;
     evas_object_geometry_get(_genlist, nullptr, nullptr, nullptr, &height);
     evas_smart_objects_calculate(evas_object_evas_get(_genlist)); // with all rows there are now

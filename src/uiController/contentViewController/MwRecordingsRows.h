@@ -2,7 +2,9 @@
 
 #include <functional>
 #include <string>
+#include <string_view>
 #include <unordered_map>
+#include <unordered_set>
 #include <vector>
 
 #include <panekit/WTimer.h>
@@ -10,7 +12,8 @@
 #include "MwRecordingsListItem.h"
 
 // The rows of the recordings list. Keeps a genlist in step with the model's catalogue by difference, so that rows stay
-// where they are (and checked as they are) while others come and go; a long list appears with its first screens and
+// where they are (and checked as they are) while others come and go; after many changes at once the list starts over,
+// without checks. A long list appears with its first screens and
 // grows in slices of a few milliseconds. The genlist is borrowed and outlives this object. Main loop only.
 class MwRecordingsRows {
 public:
@@ -68,11 +71,23 @@ private:
     [[nodiscard]] Item* _first() const;
     [[nodiscard]] static Item* _next(const Item* row);
     [[nodiscard]] std::unordered_map<std::string, Item*> _rowsByPath() const;
-    void _removeVanished();
+    using Paths = std::unordered_set<std::string_view>;
+    // Of a row that went when the list started over.
+    struct Former {
+        int index = 0;
+        bool isHighlighted = false;
+    };
+
+    [[nodiscard]] Paths _wantedPaths() const;
+    [[nodiscard]] size_t _countChanges(const Paths& wanted) const;
+    void _startOver();
+    [[nodiscard]] Item* _make(const MwFileInfo& info);
+    void _removeVanished(const Paths& wanted);
     void _closeGaps();
     void _followCatalogue();
     Item* _insert(const MwFileInfo& info, Item* after, Item* former);
     bool _loadSlice(double seconds);
+    void _restoreAwaited();
     [[nodiscard]] Item* _highlightStart() const;
     [[nodiscard]] Item* _onTop() const;
     [[nodiscard]] int _yOf(const std::string& path, int rowHeight) const;
@@ -84,6 +99,8 @@ private:
     unsigned int _revision = 0; // of the catalogue that is shown, 0 for none
     size_t _loaded = 0; // records of the catalogue that have been looked at
     int _lastIndex = 0;
+    std::unordered_map<std::string, Former> _former; // until they are there again
+    Place _awaited; // to be restored when its rows are there again
     bool _moved = false; // rows came since the place was restored
     panekit::WTimer::Weak _loader;
 };
