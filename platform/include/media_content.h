@@ -67,7 +67,7 @@ int media_filter_set_order(
     filter_h filter, media_content_order_e order, const char* keyword, media_content_collation_e collation);
 int media_filter_set_offset(filter_h filter, int offset, int count);
 
-// The handle given to a callback is borrowed for the call.
+// The handle given to a callback is borrowed for the call. Recordings on a card that is out are left out.
 int media_info_foreach_media_from_db(filter_h filter, media_info_cb callback, void* user_data);
 int media_info_foreach_media_from_db_with_media_mode(filter_h filter, media_info_cb callback, void* user_data);
 // Inserts (or refreshes) the row of a file; the handle is the caller's.

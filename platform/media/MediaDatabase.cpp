@@ -444,21 +444,37 @@ int Database::_removePath(const std::string& path)
     return statement.bind(path).run();
 }
 
-int Database::_moveRow(const std::string& formerPath, const MediaRow& row)
+// By way of a place that no file has, for two rows may swap theirs.
+int Database::_moveRows(const FileChanges& changes)
 {
-    // Ignored when somebody has entered the new path already; the next look then drops the former row.
-    Statement statement(_db,
-        "UPDATE OR IGNORE media SET MEDIA_PATH = ?, MEDIA_DISPLAY_NAME = ?, MEDIA_MODE = ?, MEDIA_STORAGE = ? "
-        "WHERE MEDIA_PATH = ? COLLATE BINARY");
-    return statement.bind(row.path).bind(row.displayName).bind(row.mode).bind(row.storage).bind(formerPath).run();
+    int result = SQLITE_OK;
+    for (auto row = changes.overwritten.begin(); result == SQLITE_OK && row != changes.overwritten.end(); ++row) {
+        Statement statement(_db, "DELETE FROM media WHERE MEDIA_ID = ? AND MEDIA_PATH = ? COLLATE BINARY");
+        result = statement.bind(row->id).bind(row->path).run();
+    }
+    for (auto move = changes.moved.begin(); result == SQLITE_OK && move != changes.moved.end(); ++move) {
+        Statement statement(
+            _db, "UPDATE media SET MEDIA_PATH = '?' || MEDIA_ID WHERE MEDIA_ID = ? AND MEDIA_PATH = ? COLLATE BINARY");
+        result = statement.bind(move->second.id).bind(move->first).run();
+    }
+    for (auto move = changes.moved.begin(); result == SQLITE_OK && move != changes.moved.end(); ++move) {
+        const MediaRow& row = move->second;
+        Statement statement(_db,
+            "UPDATE OR IGNORE media SET MEDIA_PATH = ?, MEDIA_DISPLAY_NAME = ?, MEDIA_MODE = ?, MEDIA_STORAGE = ? "
+            "WHERE MEDIA_PATH = ? COLLATE BINARY");
+        result
+            = statement.bind(row.path).bind(row.displayName).bind(row.mode).bind(row.storage).bind("?" + row.id).run();
+        // Somebody has entered the new path already.
+        if (result == SQLITE_OK)
+            result = _removePath("?" + row.id);
+    }
+    return result;
 }
 
 int Database::apply(const FileChanges& changes)
 {
     return _transaction([&] {
-        int result = SQLITE_OK;
-        for (auto move = changes.moved.begin(); result == SQLITE_OK && move != changes.moved.end(); ++move)
-            result = _moveRow(move->first, move->second);
+        int result = _moveRows(changes);
         for (auto put = changes.put.begin(); result == SQLITE_OK && put != changes.put.end(); ++put) {
             MediaRow row = *put;
             result = _putRow(row);

@@ -51,6 +51,7 @@ struct Waveform {
 
 // What a look at the folders found, by path.
 struct FileChanges {
+    std::vector<MediaRow> overwritten; // rows whose path another file has now
     std::vector<MediaRow> put;
     std::vector<std::pair<std::string, MediaRow>> moved; // from the former path; the row keeps its identifier
     std::vector<std::string> removed;
@@ -111,7 +112,7 @@ private:
     int _transaction(const Work& work);
     int _openOnce();
     int _putRow(MediaRow& row);
-    int _moveRow(const std::string& formerPath, const MediaRow& row);
+    int _moveRows(const FileChanges& changes);
     int _removePath(const std::string& path);
     int _insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name);
     int _migrate();

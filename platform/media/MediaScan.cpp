@@ -45,11 +45,25 @@ namespace {
             && row.modifiedTime == status.st_mtim.tv_sec;
     }
 
+    struct Former {
+        MediaRow row;
+        bool isOverwritten = false; // else its file is gone
+    };
+
     struct Differences {
         std::vector<MediaRow> found; // no row yet
-        std::vector<MediaRow> changed;
-        std::vector<MediaRow> gone;
+        std::vector<MediaRow> changed; // another file, or another state of it, than the row at its path is of
+        std::vector<Former> former;
     };
+
+    // Whether a folder that is not there was deleted: what cannot be reached with it says nothing about its files.
+    bool isDeleted(const std::string& folder, const std::error_code& error)
+    {
+        const std::string root = storage_device_root();
+        std::error_code ignored;
+        return error == std::errc::no_such_file_or_directory && folder == root + RECORDINGS_DIRECTORY
+            && std::filesystem::is_directory(root, ignored);
+    }
 
     void compareFolder(const std::string& folder, KnownRows known, Lengths lengths, Differences& differences)
     {
@@ -60,17 +74,21 @@ namespace {
             if (!isRecordingName(name))
                 continue;
             const std::string path = folder + "/" + name;
-            const auto row = known.extract(path);
+            auto row = known.extract(path);
             const bool isSame = !row.empty() && isUnchanged(row.mapped(), path);
             if (isSame && (lengths == Lengths::KNOWN || row.mapped().duration >= 0))
                 continue;
-            if (auto described = describeFile(path); described && (!isSame || described->duration >= 0))
-                (row.empty() ? differences.found : differences.changed).push_back(std::move(*described));
+            auto described = describeFile(path);
+            if (!described || (isSame && described->duration < 0))
+                continue;
+            (row.empty() ? differences.found : differences.changed).push_back(std::move(*described));
+            if (!row.empty())
+                differences.former.push_back({std::move(row.mapped()), true});
         }
-        if (error)
+        if (error && !isDeleted(folder, error))
             return;
         for (auto& [path, row] : known)
-            differences.gone.push_back(std::move(row));
+            differences.former.push_back({std::move(row), false});
     }
 
     // Renaming and moving keep size and time.
@@ -79,23 +97,40 @@ namespace {
         return gone.size == found.size && gone.timeline == found.timeline && gone.mimeType == found.mimeType;
     }
 
+    // Gives a file the row that it had under another path. False when it had none.
+    bool follow(MediaRow& file, std::vector<Former>& former, FileChanges& changes)
+    {
+        const auto own = std::find_if(former.begin(), former.end(),
+            [&](const Former& each) { return isSameFile(each.row, file) && each.row.path != file.path; });
+        if (own == former.end())
+            return false;
+        file.id = own->row.id;
+        changes.moved.emplace_back(own->row.path, std::move(file));
+        former.erase(own);
+        return true;
+    }
+
     FileChanges reconcile(Differences differences)
     {
         FileChanges changes;
-        changes.put = std::move(differences.changed);
-        for (MediaRow& found : differences.found) {
-            const auto former = std::find_if(differences.gone.begin(), differences.gone.end(),
-                [&](const MediaRow& gone) { return isSameFile(gone, found); });
-            if (former == differences.gone.end()) {
-                changes.put.push_back(std::move(found));
-                continue;
-            }
-            found.id = former->id;
-            changes.moved.emplace_back(former->path, std::move(found));
-            differences.gone.erase(former);
+        std::vector<std::string> arrived; // at a path that had a row
+        for (MediaRow& changed : differences.changed) {
+            const std::string path = changed.path;
+            if (follow(changed, differences.former, changes))
+                arrived.push_back(path);
+            else
+                changes.put.push_back(std::move(changed));
         }
-        for (const MediaRow& gone : differences.gone)
-            changes.removed.push_back(gone.path);
+        for (MediaRow& found : differences.found) {
+            if (!follow(found, differences.former, changes))
+                changes.put.push_back(std::move(found));
+        }
+        for (Former& former : differences.former) {
+            if (!former.isOverwritten)
+                changes.removed.push_back(former.row.path);
+            else if (std::find(arrived.begin(), arrived.end(), former.row.path) != arrived.end())
+                changes.overwritten.push_back(std::move(former.row));
+        }
         return changes;
     }
 

@@ -22,8 +22,9 @@ struct ScanCount {
 enum class Lengths { KNOWN, ASKED_AGAIN };
 
 // Brings the rows in step with the files of the folders: new and changed files are read, rows whose file is gone are
-// dropped, and a file that was renamed or moved by another program keeps its row with the bookmarks. A folder that
-// cannot be read (a card pulled out) says nothing about its files. Any thread. Answers SQLite's code.
+// dropped, and a file that was renamed or moved by another program keeps its row with the bookmarks, also when it took
+// the path of another. A folder that cannot be read (a card pulled out) says nothing about its files; one of the device
+// that is not there was deleted. Any thread. Answers SQLite's code.
 int scanFolders(Database& database, const std::vector<std::string>& folders, Lengths lengths, ScanCount& count);
 
 // Held while a file and its row change together, by any process, so that no scan sees one without the other. Waits two

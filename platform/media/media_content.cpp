@@ -1,5 +1,6 @@
 #include <media_content.h>
 
+#include <storage.h>
 #include <vconf.h>
 
 #include <algorithm>
@@ -128,6 +129,25 @@ int giveText(const std::string& text, char** result)
     return *result != nullptr ? MEDIA_CONTENT_ERROR_NONE : MEDIA_CONTENT_ERROR_OUT_OF_MEMORY;
 }
 
+// A recording on a card that is out cannot be used; its row waits for the card, bookmarks and all.
+class AwayRows {
+public:
+    bool contains(const media::MediaRow& row) const
+    {
+        return row.storage == ON_CARD && !(_isMounted && row.path.starts_with(_root));
+    }
+
+private:
+    static constexpr int ON_CARD = 1;
+    static bool isMounted()
+    {
+        int status = 0;
+        return vconf_get_int(VCONFKEY_SYSMAN_MMC_STATUS, &status) == 0 && status == 1;
+    }
+    bool _isMounted = isMounted();
+    std::string _root = std::string(storage_card_root()) + "/";
+};
+
 // Another process committed, or this one did (it is told too; who does not care compares the process id).
 void committed(int pid)
 {
@@ -240,6 +260,7 @@ void startWatching(Connection& held)
     held.cardWatch = platform::stateTree().watch(VCONFKEY_SYSMAN_MMC_STATUS, [&held](const std::string&) {
         watchFolders(held);
         held.rescanner->request();
+        held.notice.touch(0); // its rows come or go, changed or not
     });
 }
 
@@ -463,8 +484,11 @@ int media_info_foreach_media_from_db(filter_h filter, media_info_cb callback, vo
     const int result = read(*held, [&](media::Database& database) {
         return database.select(filter != nullptr ? filter->query : media::Query(), rows);
     });
+    const AwayRows away;
     // The rows are copied first, so the callback may change the database.
     for (auto& row : rows) {
+        if (away.contains(row))
+            continue;
         media_info_s media{std::move(row)};
         if (!callback(&media, user_data))
             break;

@@ -221,8 +221,8 @@ unsigned int MwModel::getCurrentPlayDuration() const
     Filter filter;
     if (!MW_CALL(media_filter_create, filter.out()))
         return 0;
-    const std::string condition = "MEDIA_PATH=\"" + mwAdopt(media_content_escape(path.c_str())) + "\"";
-    if (const int r = media_filter_set_condition(filter.get(), condition.c_str(), MEDIA_CONTENT_COLLATE_NOCASE);
+    const std::string condition = "MEDIA_PATH=\"" + mwAdopt(media_content_escape(path.c_str())) + "\" COLLATE BINARY";
+    if (const int r = media_filter_set_condition(filter.get(), condition.c_str(), MEDIA_CONTENT_COLLATE_DEFAULT);
         r != 0) {
         MW_LOGE("media_filter_set_condition failed : [%d]!!!", r);
         return 0;

@@ -1,6 +1,8 @@
 #include <gtest/gtest.h>
 #include <media_content.h>
 
+#include <vconf.h>
+
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -8,6 +10,7 @@
 #include <algorithm>
 #include <atomic>
 #include <functional>
+#include <map>
 #include <thread>
 
 #include "support/Amr.h"
@@ -326,15 +329,102 @@ TEST_F(MediaDatabaseTest, IsWatchedFromTheVeryFirstStart)
     ASSERT_EQ(0, media_content_connect());
 }
 
-TEST_F(MediaDatabaseTest, ScanningKeepsRowsOfAFolderThatIsAway)
+TEST_F(MediaDatabaseTest, RowsOfACardThatIsOutWaitForItThoseOfADeletedFolderGo)
+{
+    const std::string card = std::string(std::getenv("MEWLO_CARD_ROOT")) + "/Sounds";
+    const std::string onCard = card + "/Mewlo/c.m4a";
+    support::writeFile(onCard, "x");
+    vconf_set_int(VCONFKEY_SYSMAN_MMC_STATUS, 1);
+    media_content_scan_all();
+    addRecording("a.m4a");
+    ASSERT_EQ((Names{"a.m4a", "c.m4a"}), names());
+    const std::string id = idOf("c.m4a");
+    EXPECT_EQ(0, media_bookmark_insert_to_db(id.c_str(), 7, "Here"));
+    listen();
+    std::filesystem::rename(card, card + "-out");
+    vconf_set_int(VCONFKEY_SYSMAN_MMC_STATUS, 0);
+    EXPECT_EQ(Names{"a.m4a"}, names());
+    EXPECT_TRUE(support::runUntil([&] { return _heard.count > 0 && _heard.pid == 0; }));
+    std::filesystem::remove_all(support::recordingsDirectory());
+    media_content_scan_all();
+    EXPECT_EQ(Names{}, names());
+    std::filesystem::rename(card + "-out", card);
+    vconf_set_int(VCONFKEY_SYSMAN_MMC_STATUS, 1);
+    media_content_scan_all();
+    EXPECT_EQ(Names{"c.m4a"}, names());
+    EXPECT_EQ(id, idOf("c.m4a"));
+    EXPECT_EQ(1, bookmarksOf(id));
+    media_content_unset_db_updated_cb();
+    vconf_set_int(VCONFKEY_SYSMAN_MMC_STATUS, 0);
+    std::filesystem::remove_all(card);
+}
+
+TEST_F(MediaDatabaseTest, AFileBringsItsBookmarksWhereverItArrives)
+{
+    const auto file = [](const std::string& name) { return recordingPath(name + ".m4a"); };
+    const auto move = [&](const char* from, const char* to) { std::filesystem::rename(file(from), file(to)); };
+    const auto write = [&](const std::string& name, const std::string& content) {
+        support::writeFile(file(name), content);
+        std::filesystem::last_write_time(
+            file(name), std::filesystem::file_time_type::clock::now() - std::chrono::hours(content.size()));
+    };
+    struct Case {
+        const char* what;
+        std::function<void()> change;
+        std::map<std::string, std::string> owners; // of the bookmarks, by name afterwards; "" for none
+    };
+    const Case cases[] = {
+        {"overwritten", [&] { move("b", "a"); }, {{"a", "b"}}},
+        {"swapped",
+            [&] {
+                move("a", "x");
+                move("b", "a");
+                move("x", "b");
+            },
+            {{"a", "b"}, {"b", "a"}}},
+        {"made way for another",
+            [&] {
+                move("a", "c");
+                write("a", "another");
+            },
+            {{"a", ""}, {"b", "b"}, {"c", "a"}}},
+        {"other case", [&] { move("a", "B"); }, {{"B", "a"}, {"b", "b"}}},
+        {"same size, another time",
+            [&] {
+                std::filesystem::remove(file("a"));
+                support::writeFile(file("c"), "1");
+            },
+            {{"b", "b"}, {"c", ""}}},
+        {"changed", [&] { write("a", "longer"); }, {{"a", "a"}, {"b", "b"}}},
+    };
+    for (const Case& each : cases) {
+        SCOPED_TRACE(each.what);
+        std::filesystem::remove_all(support::recordingsDirectory());
+        media_content_scan_all();
+        std::map<std::string, std::string> ids;
+        write("a", "1");
+        write("b", "22");
+        media_content_scan_all();
+        for (const char* name : {"a", "b"}) {
+            ids[name] = idOf(std::string(name) + ".m4a");
+            media_bookmark_insert_to_db(ids[name].c_str(), 1, name);
+        }
+        each.change();
+        media_content_scan_all();
+        EXPECT_EQ(each.owners.size(), names().size());
+        for (const auto& [name, owner] : each.owners) {
+            const auto found = names("MEDIA_PATH=\"" + file(name) + "\" COLLATE BINARY", media_info_get_media_id);
+            ASSERT_EQ(1U, found.size()) << name;
+            EXPECT_EQ(owner.empty() ? 0 : 1, bookmarksOf(found[0])) << name;
+            EXPECT_EQ(owner.empty(), ids[owner] != found[0]) << name;
+        }
+    }
+}
+
+TEST_F(MediaDatabaseTest, ScanningKnowsWhatIsARecording)
 {
     addRecording("a.m4a");
-    const std::string away = support::recordingsDirectory() + "-away";
-    std::filesystem::rename(support::recordingsDirectory(), away);
     int removed = -1;
-    EXPECT_EQ(0, media_content_scan_folder(support::recordingsDirectory().c_str(), nullptr, &removed));
-    EXPECT_EQ(Names{"a.m4a"}, names());
-    std::filesystem::rename(away, support::recordingsDirectory());
     support::writeFile(recordingPath(".hidden.m4a"), "x");
     support::writeFile(recordingPath("notes.txt"), "x");
     support::writeFile(recordingPath("\xff\xfe.m4a"), "no UTF-8");

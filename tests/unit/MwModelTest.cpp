@@ -14,6 +14,7 @@
 #include "MwRecordingNotes.h"
 #include "MwText.h"
 #include "fakes/Fakes.h"
+#include "support/Amr.h"
 #include "support/Recordings.h"
 #include "support/TempDir.h"
 
@@ -136,6 +137,11 @@ TEST_F(MwModelTest, HostilePathsTouchNoOtherRow)
     EXPECT_FALSE(fakes::log.has("foreach_media_from_db failed"));
     _model.createRecordedFileList();
     EXPECT_NE(nullptr, _model.getRecordedFileInfoByPath(support::recordingPath(hostile)));
+    for (const auto& [name, frames] : {std::pair{"Case.amr", 50}, {"case.amr", 100}, {"CASE.amr", 150}}) {
+        addRecording(name, support::wideAmr(frames));
+        _model.setCurrentPlayPath(support::recordingPath(name));
+        EXPECT_EQ(frames * 20U, _model.getCurrentPlayDuration()) << name;
+    }
 }
 
 TEST_F(MwModelTest, BookmarksAreLimitedUniqueAndKeptBesideTheRecording)
