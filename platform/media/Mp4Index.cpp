@@ -124,7 +124,9 @@ std::string mp4IndexHead(const Mp4Track& track, uint64_t frames, uint64_t sample
         + box("hdlr", u32(0) + u32(0) + "soun" + zeros(12) + "SoundHandler" + zeros(1))
         + box("minf", information, tail);
     const std::string trackContent = trackHeader(shown) + edits(shown) + box("mdia", media, tail);
-    return box("moov", movieHeader(track, shown) + box("trak", trackContent, tail), tail);
+    // GStreamer ends a file when its frames, counted from the hidden ones on, reach the length of the movie.
+    const uint64_t movie = shown + AAC_PRIMING_SAMPLES / AAC_FRAME_SAMPLES * AAC_FRAME_SAMPLES;
+    return box("moov", movieHeader(track, movie) + box("trak", trackContent, tail), tail);
 }
 
 uint64_t mp4FileSize(uint64_t frames, uint64_t dataBytes)

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <cstring>
 #include <utility>
 
 using support::outputOf;
@@ -105,7 +106,8 @@ double probedDuration(const std::string& path)
     std::ifstream(path, std::ios::binary).read(magic, sizeof magic);
     if (std::string(magic, 5) == "#!AMR")
         return static_cast<double>(std::filesystem::file_size(path) - 6) / 32 * 20;
-    const std::string seconds = outputOf("ffprobe -v error -show_entries format=duration -of csv=p=0 '" + path + "'");
+    const std::string seconds
+        = outputOf("ffprobe -v error -select_streams a -show_entries stream=duration -of csv=p=0 '" + path + "'");
     return seconds.empty() ? -1 : std::atof(seconds.c_str()) * 1000;
 }
 
@@ -121,6 +123,19 @@ void makeRecording(const std::string& path, int seconds, bool isAmr)
     EXPECT_EQ(0, recorder_commit(recorder.handle));
     recorder_release_temporary(path.c_str());
     unsetenv("MEWLO_AUDIO_SOURCE");
+}
+
+std::vector<short> heard(const std::string& path)
+{
+    outputOf("gst-launch-1.0 -q filesrc location='" + path
+        + "' ! qtdemux ! aacparse ! avdec_aac ! audioconvert ! "
+          "audio/x-raw,format=S16LE,channels=1 ! filesink location='"
+        + path + ".raw'");
+    const std::string bytes = support::readFile(path + ".raw");
+    std::filesystem::remove(path + ".raw");
+    std::vector<short> samples(bytes.size() / 2);
+    std::memcpy(samples.data(), bytes.data(), samples.size() * 2);
+    return samples;
 }
 
 bool decodesCleanly(const std::string& path)

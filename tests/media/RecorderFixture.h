@@ -58,6 +58,8 @@ void makeRecording(const std::string& path, int seconds, bool isAmr);
 
 // Milliseconds by an independent program, -1 when it does not read the file.
 double probedDuration(const std::string& path);
+// Mono samples of an MP4 as our player's chain hands them to the speaker.
+std::vector<short> heard(const std::string& path);
 // Whether an independent program decodes all of it without complaint.
 bool decodesCleanly(const std::string& path);
 std::vector<std::string> filesIn(const std::string& directory);

@@ -142,6 +142,21 @@ TEST_F(NoiseTest, CommittedFileHasEverythingUpToTheStop)
     EXPECT_TRUE(isExact);
 }
 
+TEST_F(NoiseTest, IsHeardFromTheFirstSampleToTheLast)
+{
+    double elapsed = 0;
+    ASSERT_NO_FATAL_FAILURE(record([&](RecorderHandle& recorder) {
+        ASSERT_EQ(0, recorder_pause(recorder.handle));
+        runFor(0.05);
+        elapsed = static_cast<double>(recorder.told.elapsed.back());
+    }));
+    constexpr double FRAME = 1024;
+    const std::vector<short> played = heard(temporary);
+    EXPECT_NEAR(elapsed * 44.1, static_cast<double>(played.size()), FRAME);
+    ASSERT_GT(played.size(), 20000 + WINDOW);
+    EXPECT_EQ(20000, placeOf(&played[20000], WINDOW, support::decode(temporary), 19000, 21000));
+}
+
 TEST_F(RecorderTest, MeasuresTheInputLevel)
 {
     support::writeTone(directory.file("tone.wav"), 10, 0.1);

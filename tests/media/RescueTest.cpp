@@ -74,6 +74,9 @@ TEST_F(RescueTest, RebuildsWhatAKilledProcessLeft)
         EXPECT_NEAR(expected, found[0].duration, 50);
         EXPECT_NEAR(found[0].duration, probedDuration(found[0].path), 60);
         EXPECT_TRUE(decodesCleanly(found[0].path));
+        if (type == RECORDER_FILE_FORMAT_MP4) {
+            EXPECT_NEAR(found[0].duration * 44.1, static_cast<double>(heard(found[0].path).size()), 100);
+        }
         EXPECT_EQ("name", readFile(found[0].sidecar));
         EXPECT_FALSE(std::filesystem::exists(temporary));
 
