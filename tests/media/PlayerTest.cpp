@@ -184,6 +184,9 @@ TEST_F(PlayerTest, AnswersABurstOfSeeksOnce)
         EXPECT_NEAR(5000, player.position(), 25);
         EXPECT_EQ(PLAYER_ERROR_INVALID_PARAMETER, player.seek(-1));
         ASSERT_EQ(0, player.seek(3600000));
+        int end = 0;
+        player_get_duration(player.handle, &end);
+        EXPECT_EQ(end, player.position());
         ASSERT_EQ(0, player_start(player.handle));
         EXPECT_TRUE(runUntil([&] { return player.completed == 1; }));
         EXPECT_EQ(3, player.seeksDone);

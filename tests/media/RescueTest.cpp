@@ -1,6 +1,8 @@
 #include "RecorderFixture.h"
 
 #include <fstream>
+#include <sys/inotify.h>
+#include <unistd.h>
 
 using support::readFile;
 using support::runUntil;
@@ -20,6 +22,35 @@ public:
 
 private:
     support::Program _process;
+};
+
+// What is moved away from names in a folder.
+class Moves {
+public:
+    explicit Moves(const std::string& folder)
+        : _watch(::inotify_init1(IN_NONBLOCK | IN_CLOEXEC))
+    {
+        ::inotify_add_watch(_watch, folder.c_str(), IN_MOVED_FROM);
+    }
+    ~Moves() { ::close(_watch); }
+    Moves(const Moves&) = delete;
+    Moves& operator=(const Moves&) = delete;
+
+    [[nodiscard]] std::string last() const
+    {
+        alignas(inotify_event) char events[4096];
+        const ssize_t size = ::read(_watch, events, sizeof events);
+        std::string name;
+        for (const char* at = events; size > 0 && at < events + size;) {
+            const auto* event = reinterpret_cast<const inotify_event*>(at);
+            name = event->name;
+            at += sizeof *event + event->len;
+        }
+        return name;
+    }
+
+private:
+    int _watch;
 };
 
 bool growsTo(const std::string& path, uint64_t size)
@@ -65,7 +96,9 @@ TEST_F(RescueTest, RebuildsWhatAKilledProcessLeft)
         recordAndKill(format, static_cast<uint64_t>(bytes));
         writeFile(temporary + RECORDER_NOTES_SUFFIX, "name");
         const auto left = static_cast<double>(readFile(temporary).size());
+        const Moves moves(directory.path());
         const auto found = rescue(temporary);
+        EXPECT_EQ(".mw_temp.idx", moves.last()) << "it says what the others are, as long as they are on their way";
         ASSERT_EQ(1u, found.size());
         EXPECT_EQ(RECORDER_LEFTOVER_REBUILT, found[0].outcome);
         EXPECT_EQ(type, found[0].format);
@@ -223,6 +256,8 @@ TEST_F(RescueTest, MakesTheBestOfTornFiles)
         if (torn.outcome == RECORDER_LEFTOVER_REBUILT) {
             EXPECT_TRUE(decodesCleanly(found[0].path));
             EXPECT_NEAR(found[0].duration, probedDuration(found[0].path), 2);
+            const double frames = (found[0].duration * 44.1 + 1600) / 1024;
+            EXPECT_NEAR(56 + 2 * frames, std::filesystem::file_size(found[0].path + ".idx"), 1) << "those it has";
         } else if (torn.outcome == RECORDER_LEFTOVER_BEYOND_RESCUE) {
             EXPECT_EQ(bytes, std::filesystem::file_size(found[0].path));
             EXPECT_TRUE(rescue(path).empty()) << "kept, but not reported again";

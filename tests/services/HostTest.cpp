@@ -247,6 +247,10 @@ TEST_F(HostTest, CallsAreCountedAndRejectedOnDemand)
     rejects = true;
     ASSERT_TRUE(announce("CallAdded") && setState(0, 3));
     EXPECT_TRUE(runUntil([&] { return modems.callsOf(CALL, "Hangup") == 1; }, 20));
+    watch.stop();
+    ASSERT_TRUE(modems.control(CALL, "UpdateProperties", "sa{sv}", CALL_INTERFACE, 1, "State", "i", 3));
+    watch.start();
+    EXPECT_TRUE(runUntil([&] { return modems.callsOf(CALL, "Hangup") == 2; }, 20)) << "it rang before we looked";
 }
 
 TEST_F(HostTest, ScreenSaverLocks)

@@ -126,6 +126,27 @@ TEST_F(RecordingsOperationsTest, AsksBeforeItDeletesForGood)
     fs::remove(trash);
 }
 
+TEST_F(RecordingsOperationsTest, WhatComesDuringAnOperationIsShownAfterIt)
+{
+    for (const bool cancels : {false, true}) {
+        SCOPED_TRACE(cancels);
+        _screen->chooseMenu("Delete");
+        _screen->tap(cancels ? "b.m4a" : "a.m4a");
+        support::click(_screen->titleButton("title_right_btn"));
+        const std::string added = cancels ? "e.m4a" : "d.m4a";
+        support::addRecording(added);
+        MwSignalMgr::getInstance()->getSystemInfoSignal().emit(MwSignalMgr::MEDIA_DB_UPDATED);
+        EXPECT_EQ("deletePopup", popupName());
+        EXPECT_FALSE(isNormal());
+        if (cancels)
+            support::key(_screen->window, "Escape"); // before it begins
+        ASSERT_TRUE(runUntil([] { return WPopupController::topmost() == nullptr; }, 10));
+        support::settle(_screen->window);
+        EXPECT_NE(nullptr, _screen->row(added));
+        EXPECT_EQ(cancels, _screen->row("b.m4a") && !isNormal());
+    }
+}
+
 TEST_F(RecordingsOperationsTest, DeletesThePlayingRecordingAfterAsking)
 {
     _screen->tap("b.m4a");

@@ -10,6 +10,7 @@
 #include "MwSystemMgr.h"
 #include "MwText.h"
 #include "fakes/Fakes.h"
+#include "support/DatabaseRows.h"
 #include "support/Recordings.h"
 #include "support/RunUntil.h"
 
@@ -522,6 +523,13 @@ TEST_F(MwPlaybackTest, ResumesAfterACallButNotAfterAnUnpluggedHeadset)
         dispatch(MwAppController::STOP_PLAYING);
         EXPECT_TRUE(support::runUntil([] { return calls.has("bt_avrcp_target_notify_player_state 0"); }));
     }
+    // A call that ended unheard is not what a later interruption waits for.
+    ASSERT_TRUE(play());
+    interrupt(PLAYER_INTERRUPTED_BY_CALL, PLAYER_STATE_PAUSED);
+    ASSERT_TRUE(dispatch(MwAppController::STOP_PLAYING) && play());
+    interrupt(PLAYER_INTERRUPTED_BY_EARJACK_UNPLUG, PLAYER_STATE_PAUSED);
+    interrupt(PLAYER_INTERRUPTED_COMPLETED, PLAYER_STATE_PAUSED);
+    EXPECT_EQ(MwPlayer::PLAY_STATE_PAUSED, playing());
 }
 
 TEST_F(MwPlaybackTest, HeldKeysSeekInGrowingStepsAndShortOnesStep)
@@ -542,6 +550,14 @@ TEST_F(MwPlaybackTest, HeldKeysSeekInGrowingStepsAndShortOnesStep)
     key(MEDIA_KEY_REWIND);
     EXPECT_EQ(next, _model.getCurrentPlayPath());
     EXPECT_EQ(2u, calls.count("player_set_play_position"));
+    ASSERT_TRUE(support::execute("UPDATE media SET MEDIA_DURATION=14000"));
+    _model.setCurrentPlayPosition(9000);
+    calls.clear();
+    key(MEDIA_KEY_FASTFORWARD, MEDIA_KEY_STATUS_PRESSED);
+    EXPECT_TRUE(support::runUntil([&] { return calls.count("player_set_play_position") == 2; }));
+    key(MEDIA_KEY_FASTFORWARD);
+    EXPECT_EQ("player_set_play_position 12000", calls.matching("player_set_play_position")[0]);
+    EXPECT_EQ("player_set_play_position 14000", calls.matching("player_set_play_position")[1]) << "the very end";
 }
 
 }

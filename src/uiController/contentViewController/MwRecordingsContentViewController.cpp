@@ -217,8 +217,10 @@ void MwRecordingsContentViewController::_mediaDBUpdated()
     destroyAttachedPopup();
     _destroyShareRequest(true);
     // The operation that runs redraws the screen when it ends.
-    if (_fileOperator)
+    if (_fileOperator) {
+        _databaseChanged = true;
         return;
+    }
     getModel()->createRecordedFileList();
     _reloadNeeded = true;
     if (_viewType == RENAME && _renamePopup && !getModel()->getRecordedFileInfoByPath(_renameTarget))

@@ -161,6 +161,7 @@ private:
     void _startDeleting(int type, const std::vector<std::string>& pathList);
     void _onDeleteFiles();
     void _askToDeleteForGood(const std::vector<std::string>& pathList);
+    bool _catchUp();
     void _catalogueShrank();
     void _moveStart(const std::vector<std::string>& pathList);
     void _createMovingingPopupController();
@@ -186,6 +187,7 @@ private:
 
     ViewType _viewType = NORMAL;
     bool _reloadNeeded = false;
+    bool _databaseChanged = false; // while an operation ran
     Evas_Object* _genlist = nullptr; // at most one of these two
     Evas_Object* _noContents = nullptr;
     MwRecordingsListItem::Context _rowContext; // shared by all rows

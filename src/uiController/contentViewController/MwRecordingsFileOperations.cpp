@@ -108,6 +108,8 @@ void MwRecordingsContentViewController::_cancelDeleting()
 {
     if (!_fileOperator->hasBegun()) {
         _deleteFileOperator();
+        if (_catchUp())
+            _update();
         return;
     }
     _fileOperator->cancelAndWait();
@@ -119,6 +121,7 @@ void MwRecordingsContentViewController::_onDeleteFiles()
     getModel()->removeRecordedFiles(_fileOperator->donePaths());
     if (_fileOperator->hasFailed())
         mwPost("IDS_MW_TPOP_SOME_RECORDINGS_NOT_DELETED");
+    _catchUp();
     _catalogueShrank();
     const std::vector<std::string> rest
         = _fileOperator->isCancelRequested() ? std::vector<std::string>() : _fileOperator->withoutTrash();
@@ -141,6 +144,15 @@ void MwRecordingsContentViewController::_askToDeleteForGood(const std::vector<st
         : mwTranslateNumber("IDS_MW_POP_PD_RECORDINGS_CANNOT_GO_TO_THE_TRASH_DELETE_FOR_GOOD_Q", pathList.size());
     _createDeletePopup(
         [this, pathList] { _startDeleting(MwFileOperator::DELETE_FOR_GOOD, pathList); }, question.c_str());
+}
+
+// With what the database was told of while an operation ran. False when that was nothing.
+bool MwRecordingsContentViewController::_catchUp()
+{
+    if (!std::exchange(_databaseChanged, false))
+        return false;
+    getModel()->createRecordedFileList();
+    return _reloadNeeded = true;
 }
 
 void MwRecordingsContentViewController::_catalogueShrank()
