@@ -19,6 +19,7 @@ public:
     Evas_Object* view = nullptr; // null once the screen has been left
 
     void open();
+    using ScreenWindow::close;
     // Announces what the system manager would.
     void announce(MwSignalMgr::SystemInfo info);
     void playerChanged();

@@ -436,6 +436,25 @@ TEST_F(RecordingsScreenTest, ThousandsThatComeAtOnceHoldNobodyAndMoveNothing)
     ASSERT_TRUE(support::runUntil([&] { return screen.names().size() == MANY; }));
     support::settle(screen.window);
     EXPECT_EQ(top, screen.topRow());
+    // All go: their list does, too, but not at once.
+    bool isGone = false;
+    const auto gone = [](void* data, Evas*, Evas_Object*, void*) { *static_cast<bool*>(data) = true; };
+    for (const bool leaves : {false, true}) {
+        isGone = false;
+        evas_object_event_callback_add(screen.list(), EVAS_CALLBACK_DEL, gone, &isGone);
+        ASSERT_TRUE(support::execute("DELETE FROM media"));
+        MwSignalMgr::getInstance()->getSystemInfoSignal().emit(MwSignalMgr::MEDIA_DB_UPDATED);
+        EXPECT_EQ(nullptr, screen.list());
+        EXPECT_FALSE(isGone);
+        if (leaves)
+            screen.close();
+        EXPECT_TRUE(support::runUntil([&] { return isGone; }));
+        if (leaves)
+            return;
+        enter("old", 10000);
+        screen.announce(MwSignalMgr::MEDIA_DB_UPDATED);
+        ASSERT_TRUE(support::runUntil([&] { return screen.names().size() == MANY; }));
+    }
 }
 
 TEST_F(RecordingsScreenTest, TheKeyboardDoesWhatTheMouseDoes)

@@ -32,6 +32,7 @@ constexpr auto CONTROLLER_PART = "elm.swallow.controller";
 constexpr auto RECORD_PART = "record_button";
 constexpr auto RADIO_KEY = "radio";
 constexpr int NO_CHOICE_VALUE = -1;
+constexpr double TAKING_DOWN_SECONDS = 0.004;
 
 std::string edjePath(const char* file)
 {
@@ -51,6 +52,28 @@ void setIcon(Evas_Object* button, const char* part, const char* image, const cha
     uxt_theme_object_set_color(icon, color);
     elm_object_part_content_set(button, part, icon);
     evas_object_show(icon);
+}
+
+Eina_Bool takeDownSlice(void* list)
+{
+    const double end = ecore_time_get() + TAKING_DOWN_SECONDS;
+    while (Elm_Object_Item* row = elm_genlist_last_item_get(static_cast<Evas_Object*>(list))) {
+        elm_object_item_del(row);
+        if (ecore_time_get() > end)
+            return ECORE_CALLBACK_RENEW;
+    }
+    evas_object_del(static_cast<Evas_Object*>(list)); // and with it this idler
+    return ECORE_CALLBACK_RENEW;
+}
+
+// Thousands of rows at once would hold the main loop: they go in slices, out of sight. The list ends with its screen at
+// the latest.
+void takeDown(Evas_Object* list)
+{
+    evas_object_hide(list);
+    Ecore_Idler* idler = ecore_idler_add(takeDownSlice, list);
+    const auto gone = [](void* data, Evas*, Evas_Object*, void*) { ecore_idler_del(static_cast<Ecore_Idler*>(data)); };
+    evas_object_event_callback_add(list, EVAS_CALLBACK_DEL, gone, idler);
 }
 
 // Gives one colour of a layout the value of another one.
@@ -104,7 +127,10 @@ void MwRecordingsContentViewController::_loadContents()
     if (isEmpty ? _noContents != nullptr : _genlist != nullptr)
         return;
     _rows.reset();
-    if (Evas_Object* content = elm_object_part_content_unset(getEvasObject(), LIST_PART); content)
+    Evas_Object* content = elm_object_part_content_unset(getEvasObject(), LIST_PART);
+    if (content && content == _genlist)
+        takeDown(content);
+    else if (content)
         evas_object_del(content);
     _genlist = nullptr;
     _noContents = nullptr;
