@@ -1,3 +1,4 @@
+#define EFL_BETA_API_SUPPORT 1
 #include "ControlWindow.h"
 
 #include "device.h"
@@ -10,6 +11,7 @@
 
 #include <Ecore_Input.h>
 #include <Elementary.h>
+#include <efl_access_object.eo.h>
 
 #include <algorithm>
 #include <cstring>
@@ -75,6 +77,7 @@ Evas_Object* ControlWindow::create(
     auto* self = new ControlWindow(window, viewer, callback);
     evas_object_data_set(window, DATA_KEY, self);
     self->_listen();
+    self->_showToScreenReaders(false);
     return window;
 }
 
@@ -227,9 +230,16 @@ void ControlWindow::_setOnScreen(bool on)
         host::X11Desktop::makeAccessory(elm_win_xwindow_get(_window));
     if (on)
         _place();
+    _showToScreenReaders(on);
     _isOurs = true; // what is intercepted next
     on ? evas_object_show(_window) : evas_object_hide(_window);
     _isOurs = false;
+}
+
+// Else it would be read out while nobody sees it.
+void ControlWindow::_showToScreenReaders(bool on)
+{
+    efl_access_object_access_type_set(_window, on ? EFL_ACCESS_TYPE_REGULAR : EFL_ACCESS_TYPE_DISABLED);
 }
 
 void ControlWindow::_place()

@@ -35,6 +35,7 @@ private:
     void _apply();
     [[nodiscard]] bool _hasPlace() const;
     void _setOnScreen(bool on);
+    void _showToScreenReaders(bool on);
     void _place();
     void _tellWhetherSeen();
     void _beginDrag(int x, int y);

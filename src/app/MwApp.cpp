@@ -18,6 +18,7 @@
 #include "MwHandle.h"
 #include "MwLaunchRequests.h"
 #include "MwLog.h"
+#include "MwMiniControllerMgr.h"
 #include "MwModel.h"
 #include "MwRecorder.h"
 #include "MwRecorderContentViewController.h"
@@ -215,6 +216,7 @@ void MwApp::_launchFirst()
     if (_model->isRequestMode())
         return;
     _watchesStopRequests = MW_CALL(preference_set_changed_cb, STOP_PREFERENCE, _recordingStopRequestCb, this);
+    _miniControllerMgr = std::make_unique<MwMiniControllerMgr>(_model.get(), _appController.get(), getWindow());
 }
 
 // After a stop and for the recordings button. A list that is open already follows by itself.
@@ -281,6 +283,7 @@ void MwApp::onTerminate()
     MwSystemMgr::getInstance()->setRejectCall(false);
     MwSystemMgr::getInstance()->unregisterEvent();
     MwSignalMgr::getInstance()->getLifeCycleSignal().emit(MwSignalMgr::TERMINATE);
+    _miniControllerMgr.reset();
     MwSystemMgr::getInstance()->deinitialize();
     getWindow()->destroy(); // the screens drop their listeners while the signals still exist
     _unsetChangeableTableInfo();

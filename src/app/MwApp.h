@@ -9,6 +9,7 @@
 
 class MwAppController;
 class MwLaunchRequests;
+class MwMiniControllerMgr;
 class MwModel;
 class MwRecordingRescue;
 
@@ -57,6 +58,7 @@ private:
     std::unique_ptr<MwModel> _model;
     std::unique_ptr<MwAppController> _appController;
     std::unique_ptr<MwLaunchRequests> _requests;
+    std::unique_ptr<MwMiniControllerMgr> _miniControllerMgr; // in normal mode
     uxt_color_table_h _changeableColorTable = nullptr;
     uxt_font_table_h _changeableFontTable = nullptr;
     panekit::WPopupController* _mainAppRecordingPopup = nullptr;

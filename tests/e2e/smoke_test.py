@@ -114,6 +114,25 @@ def minimised_goes_on_and_close_saves(place):
     check(decoded_ms(recordings(place)[0][0]) > 1300, "all of it")
 
 
+def surface_controls_what_is_minimised(place):
+    start_recorder(place)
+    place.make_noise(20)
+    start_recording(place)
+    main = place.window()
+    check(len(place.call("xdotool", "search", "--onlyvisible", "--class", "mewlo-lite").split()) == 1, "no surface in front of it")
+    place.call("xdotool", "windowminimize", main)
+    place.wait_for("the surface", lambda: place.window() not in (None, main))
+    time.sleep(1)
+    place.click(678, 500)
+    place.wait_for("the pause", lambda: place.recorder_state() == "3")
+    place.click(678, 500)
+    place.wait_for("the resume", lambda: place.recorder_state() == "2")
+    time.sleep(1)
+    place.click(811, 500)
+    place.wait_for("the saved recording", lambda: len(recordings(place)) == 1)
+    place.wait_for("the end of the surface", lambda: place.window() is None)
+
+
 def request_once(place, end):
     request = place.start(os.path.join(BIN, "mewlo-tool"), "request", "--mime", "audio/AMR", "--max-kb", "100",
                           stdout=subprocess.PIPE, text=True)

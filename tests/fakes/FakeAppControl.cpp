@@ -98,4 +98,7 @@ FAKE(app_control_reply_to_launch_request, (app_control_h reply, app_control_h, a
 FAKE(app_control_send_launch_request, (app_control_h, app_control_reply_cb callback, void* data),
     ui::launches.push_back({callback, data}))
 FAKE(app_control_send_terminate_request, (app_control_h), )
+FAKE(app_manager_get_app_context, (const char* id, app_context_h*), , id)
+FAKE(app_manager_resume_app, (app_context_h), )
+FAKE(app_manager_context_destroy, (app_context_h), )
 }

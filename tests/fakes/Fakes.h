@@ -2,6 +2,7 @@
 
 #include <app_control.h>
 #include <media_key.h>
+#include <minicontrol.h>
 #include <player.h>
 #include <recorder.h>
 #include <recorder_leftover.h>
@@ -73,6 +74,15 @@ struct Sound {
     sound_manager_active_device_changed_cb deviceChanged = nullptr;
     void* userData = nullptr;
 };
+
+// A control window that was made, until it is deleted. By viewer.
+struct ControlWindow {
+    Evas_Object* window = nullptr;
+    minicontrol_provider_event_cb callback = nullptr;
+    bool isSeen = true;
+};
+extern std::map<int, ControlWindow> controlWindows;
+void setSeen(int viewer, bool seen);
 
 struct Desktop {
     media_key_event_cb mediaKey = nullptr;

@@ -10,6 +10,7 @@
 #include <vconf.h>
 
 #include "ListShots.h"
+#include "MiniShots.h"
 #include "MwRenamePopupController.h"
 #include "MwSignalMgr.h"
 #include "PanelShots.h"
@@ -137,6 +138,7 @@ int main(int argc, char** argv)
         }
         ui::takeListShots(directory, dark ? "-dark" : "-light", argc > 2 ? argv[2] : "", width, height);
         ui::takePanelShots(directory, dark ? "-dark" : "-light", argc > 2 ? argv[2] : "", width, height);
+        ui::takeMiniShots(directory, dark ? "-dark" : "-light", argc > 2 ? argv[2] : "");
         takeRename(directory, dark ? "-dark" : "-light");
         if (argc > 2 && std::string(argv[2]) != "wide")
             continue;

@@ -1,0 +1,52 @@
+#pragma once
+
+#include <panekit/WTimer.h>
+
+#include <string>
+
+#include "MwMiniController.h"
+#include "MwMiniSurface.h"
+#include "MwSignalMgr.h"
+
+// The surface over the lock screen.
+class MwLockscreenMiniController : public MwMiniController {
+public:
+    MwLockscreenMiniController(
+        MwModel* model, MwAppController* appController, panekit::WWindowController* windowController);
+    ~MwLockscreenMiniController() override;
+
+    void create() override;
+    void destroy() override;
+    void update() override;
+
+private:
+    static void _minicontrolEventCb(minicontrol_provider_event_e event, bundle* arguments);
+    static void _seenChangedCb(void* data);
+    template <void (MwLockscreenMiniController::*Operation)()>
+    static void _clickedCb(void* data, Evas_Object* button, void* info);
+
+    void _stopRecordButtonClicked() { stopRecord(); }
+    void _pauseRecordButtonClicked() { pauseRecord(); }
+    void _resumeRecordButtonClicked() { resumeRecord(); }
+    void _playPlayButtonClicked() { resumePlay(); }
+    void _pausePlayButtonClicked() { pausePlay(); }
+    void _prePlayButtonClicked() { prevPlay(); }
+    void _nextPlayButtonClicked() { nextPlay(); }
+    void _showRecording(bool paused);
+    void _showPlaying(bool paused);
+    void _setInfoText(const std::string& text);
+    void _setTimeText();
+    void _watchTime();
+    void _createUpdateTimeTimer();
+    void _destroyUpdateTimeTimer();
+    void _createPauseBlinkTimer();
+    void _destroyPauseBlinkTimer();
+    void _onSystemInfo(MwSignalMgr::SystemInfo info);
+    [[nodiscard]] bool _records() const;
+
+    MwMiniSurface _surface;
+    bool _isTimeShown = true;
+    panekit::WTimer::Weak _updateTimeTimer;
+    panekit::WTimer::Weak _pauseBlinkTimer;
+    unsigned int _systemInfoListenerId = 0;
+};

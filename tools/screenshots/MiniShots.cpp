@@ -1,0 +1,87 @@
+#include "MiniShots.h"
+
+#include <panekit/WLanguage.h>
+#include <vconf.h>
+
+#include "MwLockscreenMiniController.h"
+#include "MwNotiMiniController.h"
+#include "MwPlayer.h"
+#include "MwRecorder.h"
+#include "Picture.h"
+#include "ScreenWindow.h"
+#include "fakes/Fakes.h"
+
+namespace ui {
+
+namespace {
+
+    class Program : public ScreenWindow {
+    public:
+        Program()
+            : ScreenWindow(360, 640)
+        {
+        }
+
+    protected:
+        bool execute(MwAppController::Command) override { return true; }
+    };
+
+    struct Shot {
+        const char* name;
+        int recorder;
+        int player;
+        unsigned int seconds;
+        bool rejects;
+        const char* playing;
+        const char* language;
+    };
+
+    constexpr int READY = MwRecorder::REC_STATE_READY;
+    constexpr int SILENT = MwPlayer::PLAY_STATE_NONE;
+    constexpr Shot SHOTS[] = {
+        {"recording", MwRecorder::REC_STATE_RECORDING, SILENT, 83, false, "", "en_US"},
+        {"recording-hours", MwRecorder::REC_STATE_RECORDING, SILENT, 36061, true, "", "de_DE"},
+        {"recording-paused", MwRecorder::REC_STATE_PAUSED, SILENT, 754, false, "", "en_US"},
+        {"playing", READY, MwPlayer::PLAY_STATE_PLAYING, 0, false, "Voice 001.m4a", "en_US"},
+        {"playing-long", READY, MwPlayer::PLAY_STATE_PLAYING, 0, false,
+            "A very long conversation about everything and nothing in the old harbour.m4a", "en_US"},
+        {"play-paused", READY, MwPlayer::PLAY_STATE_PAUSED, 0, false, "Voice 001.m4a", "en_US"},
+    };
+
+    template <typename Surface>
+    void take(Program& program, minicontrol_viewer_e viewer, const std::string& file)
+    {
+        panekit::WWindowController* none = nullptr;
+        auto* surface = new Surface(&program.model, program.controller(), none);
+        surface->create();
+        surface->update();
+        support::runFor(0.4);
+        savePicture(fakes::controlWindows.at(viewer).window, file);
+        surface->destroy();
+        support::runFor(0.05);
+    }
+
+}
+
+void takeMiniShots(const std::string& directory, const std::string& suffix, const std::string& name)
+{
+    for (const Shot& shot : SHOTS) {
+        if (!name.empty() && name != std::string("mini-") + shot.name)
+            continue;
+        Program program;
+        panekit::WLanguage::use(shot.language);
+        program.model.setRecorderState(shot.recorder);
+        program.model.setPlayerState(shot.player);
+        program.model.setElapsedTime(shot.seconds * 1000ULL);
+        program.model.setCurrentPlayPath(std::string("/somewhere/") + shot.playing);
+        vconf_set_int(VCONFKEY_CALL_RECORDING_REJECT, shot.rejects ? 1 : 0);
+        take<MwNotiMiniController>(
+            program, MINICONTROL_VIEWER_PANEL, directory + "/mini-" + shot.name + "-panel" + suffix + ".png");
+        take<MwLockscreenMiniController>(
+            program, MINICONTROL_VIEWER_LOCKSCREEN, directory + "/mini-" + shot.name + "-lock" + suffix + ".png");
+        panekit::WLanguage::use("en_US");
+        vconf_set_int(VCONFKEY_CALL_RECORDING_REJECT, 0);
+    }
+}
+
+}
