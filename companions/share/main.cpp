@@ -1,56 +1,33 @@
 // Lets the user choose what to do with recordings that the recorder shares: a small window over what the desktop has.
 // Closing it, or Escape, shares nothing.
-#include <Elementary.h>
-
 #include <app.h>
-#include <panekit/WApp.h>
-#include <panekit/WLanguage.h>
 #include <panekit/WWindowController.h>
-#include <uxt_theme.h>
 
-#include <cstdlib>
 #include <cstring>
-#include <libintl.h>
 #include <memory>
 
 #include "Clipboard.h"
+#include "CompanionWindow.h"
 #include "ShareView.h"
 
 namespace {
 
-constexpr auto APP_ID = "com.tovanic.mewlo-share";
-constexpr auto TEXT_DOMAIN = "mewlo-lite";
-constexpr auto TABLES = "tables/com.tovanic.mewlo-lite_Changeable";
-constexpr double BASE_SCALE = 2.6;
 constexpr int WIDTH = 640; // design units
 constexpr int HEIGHT = 700;
 
-std::string adopt(char* text)
-{
-    const std::unique_ptr<char, decltype(&std::free)> owner(text, &std::free);
-    return text != nullptr ? text : "";
-}
+class ShareApp : public CompanionWindow {
+public:
+    ShareApp()
+        : CompanionWindow("com.tovanic.mewlo-share", "IDS_MW_BODY_SHARE", WIDTH, HEIGHT)
+    {
+    }
 
-class ShareApp : public panekit::WApp {
 protected:
     bool onCreate() override
     {
-        elm_app_base_scale_set(BASE_SCALE);
-        const std::string resources = adopt(app_get_resource_path());
-        bindtextdomain(TEXT_DOMAIN, (resources + "locale").c_str());
-        bind_textdomain_codeset(TEXT_DOMAIN, "UTF-8");
-        textdomain(TEXT_DOMAIN);
-        auto window = std::make_unique<panekit::WWindowController>(APP_ID, ELM_WIN_DIALOG_BASIC);
-        window->setTitle(panekit::WLanguage::text("IDS_MW_BODY_SHARE"));
-        if (!attachWindow(std::move(window)))
+        if (!CompanionWindow::onCreate())
             return false;
-        elm_theme_extension_add(nullptr, (resources + "edje/MwButton.edj").c_str());
-        const std::string tables = adopt(app_get_shared_resource_path()) + TABLES;
-        uxt_theme_set_color_table(uxt_theme_add_color_table((tables + "ColorInfo.xml").c_str()));
-        uxt_theme_set_font_table(uxt_theme_add_font_table((tables + "FontInfo.xml").c_str()));
-        Evas_Object* object = getWindow()->getEvasObject();
-        evas_object_resize(object, ELM_SCALE_SIZE(WIDTH), ELM_SCALE_SIZE(HEIGHT));
-        _view = std::make_unique<ShareView>(object, resources + "edje/MwShareView.edj");
+        _view = std::make_unique<ShareView>(getWindow()->getEvasObject(), resources() + "edje/MwShareView.edj");
         return true;
     }
 
@@ -95,7 +72,6 @@ int main(int argc, char** argv)
 {
     if (argc > 2 && std::strcmp(argv[1], share::HOLD_OPTION) == 0)
         return share::holdClipboard({argv + 2, argv + argc});
-    app_set_id(APP_ID);
     ShareApp app;
     return app.start(argc, argv);
 }

@@ -205,6 +205,36 @@ TEST_F(ShareWindowTest, SendsByTheChosenWayAndEscapeSharesNothing)
         support::readFile(_programs.file("xdg-email.out")));
 }
 
+TEST_F(ShareWindowTest, AsksWhetherARecordingIsToBeDiscarded)
+{
+    const std::string title = "^Discard recording$";
+    struct {
+        const char* name;
+        std::vector<std::string> act;
+        int result;
+    } const cases[] = {
+        {"escape", {"key", "Escape"}, APP_CONTROL_RESULT_FAILED},
+        {"the safe answer has the keyboard", {"key", "Return"}, APP_CONTROL_RESULT_FAILED},
+        {"confirmed", {"key", "Tab", "Return"}, APP_CONTROL_RESULT_SUCCEEDED},
+        {"killed", {"search", "--onlyvisible", "--name", title, "windowkill"}, APP_CONTROL_RESULT_FAILED},
+    };
+    for (const auto& [name, act, result] : cases) {
+        SCOPED_TRACE(name);
+        app_control_set_app_id(_request, "com.tovanic.mewlo-lite.popupapp");
+        ASSERT_EQ(0, send());
+        ASSERT_TRUE(runUntil(
+            [&] {
+                return xdotool({"search", "--onlyvisible", "--name", title, "windowfocus", "--sync"}) == 0;
+            },
+            30));
+        support::runFor(0.7); // its first frame; before it the window takes no keys
+        xdotool(act);
+        ASSERT_TRUE(runUntil([this] { return !_answer.results.empty(); }, 20));
+        EXPECT_EQ(std::vector<int>{result}, _answer.results);
+        ASSERT_TRUE(runUntil([&] { return xdotool({"search", "--onlyvisible", "--name", title}) != 0; }, 20));
+    }
+}
+
 TEST_F(ShareWindowTest, ClipboardHoldsTheFilesUntilSomebodyElseTakesIt)
 {
     Program holder({TEST_BIN_DIR "/mewlo-share", share::HOLD_OPTION, _paths[0], _paths[1]});

@@ -1,0 +1,4 @@
+[Application]
+Name=Discard recording
+Exec=mewlo-popupapp
+Reply=protocol
