@@ -7,6 +7,7 @@
 
 #include <cstdlib>
 #include <string>
+#include <string_view>
 
 #include <unistd.h>
 
@@ -80,6 +81,11 @@ void addPlaces(Report& report)
 {
     const char* display = std::getenv("DISPLAY");
     report.add("display", display != nullptr && *display != '\0', display != nullptr ? display : "", "no window");
+    // Where the toolkit shows windows on X11.
+    const char* engine = std::getenv("ELM_DISPLAY");
+    const bool x11 = display != nullptr && *display != '\0' && (engine == nullptr || std::string_view(engine) == "x11");
+    report.add("control windows", x11, "for the panel; over lock screens that let windows through",
+        "media controls (MPRIS) only");
     const bool device = ::access(storage_device_root(), W_OK) == 0;
     report.add("device storage", device, rootText(storage_device_root()), "recordings cannot be saved");
     const bool card = ::access(storage_card_root(), F_OK) == 0;
