@@ -35,10 +35,7 @@ protected:
         popup->create(getWindow()->getEvasObject());
     }
 
-    void onTerminate() override
-    {
-        _reply(APP_CONTROL_RESULT_FAILED);
-    }
+    void onTerminate() override { _reply(APP_CONTROL_RESULT_FAILED); }
 
 private:
     void _answer(app_control_result_e result)

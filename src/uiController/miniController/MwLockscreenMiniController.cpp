@@ -59,17 +59,6 @@ MwLockscreenMiniController::MwLockscreenMiniController(
 
 MwLockscreenMiniController::~MwLockscreenMiniController() { live = nullptr; }
 
-template <void (MwLockscreenMiniController::*Operation)()>
-void MwLockscreenMiniController::_clickedCb(void* data, Evas_Object*, void*)
-{
-    auto* self = static_cast<MwLockscreenMiniController*>(data);
-    if (!self) {
-        MW_LOGE("self is nullptr");
-        return;
-    }
-    (self->*Operation)();
-}
-
 void MwLockscreenMiniController::create()
 {
     MW_LOGI("BEGIN");
@@ -101,12 +90,6 @@ void MwLockscreenMiniController::_minicontrolEventCb(minicontrol_provider_event_
         live->requestHide();
 }
 
-bool MwLockscreenMiniController::_records() const
-{
-    const int state = getModel()->getRecorderState();
-    return state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED;
-}
-
 void MwLockscreenMiniController::update()
 {
     MW_LOGI("BEGIN");
@@ -126,7 +109,7 @@ void MwLockscreenMiniController::update()
     } else {
         MW_LOGI("No playing!");
         MW_LOGI("recorder state: [%d]", getModel()->getRecorderState());
-        if (_records())
+        if (isRecording())
             _showRecording(getModel()->getRecorderState() == MwRecorder::REC_STATE_PAUSED);
         else
             MW_LOGI("no recording or playing state!");
@@ -223,7 +206,7 @@ void MwLockscreenMiniController::_destroyPauseBlinkTimer() { panekit::WTimer::de
 void MwLockscreenMiniController::_seenChangedCb(void* data)
 {
     auto* self = static_cast<MwLockscreenMiniController*>(data);
-    if (self->_surface.isSeen() && self->_records())
+    if (self->_surface.isSeen() && self->isRecording())
         return self->update();
     self->_destroyUpdateTimeTimer();
     self->_destroyPauseBlinkTimer();
@@ -237,7 +220,7 @@ void MwLockscreenMiniController::_onSystemInfo(MwSignalMgr::SystemInfo info)
     if (!MwSystemMgr::getInstance()->isLCDOn()) {
         _destroyUpdateTimeTimer();
         _destroyPauseBlinkTimer();
-    } else if (_records()) {
+    } else if (isRecording()) {
         update();
     }
 }

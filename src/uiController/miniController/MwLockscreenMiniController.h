@@ -22,8 +22,8 @@ public:
 private:
     static void _minicontrolEventCb(minicontrol_provider_event_e event, bundle* arguments);
     static void _seenChangedCb(void* data);
-    template <void (MwLockscreenMiniController::*Operation)()>
-    static void _clickedCb(void* data, Evas_Object* button, void* info);
+    template <auto Operation>
+    static constexpr auto _clickedCb = mwMiniClickedCb<Operation, MwLockscreenMiniController>;
 
     void _stopRecordButtonClicked() { stopRecord(); }
     void _pauseRecordButtonClicked() { pauseRecord(); }
@@ -42,7 +42,6 @@ private:
     void _createPauseBlinkTimer();
     void _destroyPauseBlinkTimer();
     void _onSystemInfo(MwSignalMgr::SystemInfo info);
-    [[nodiscard]] bool _records() const;
 
     MwMiniSurface _surface;
     bool _isTimeShown = true;

@@ -1,6 +1,8 @@
 #include "MwMiniController.h"
 
 #include "MwLog.h"
+#include "MwModel.h"
+#include "MwRecorder.h"
 
 MwMiniController::MwMiniController(
     MwModel* model, MwAppController* appController, panekit::WWindowController* windowController)
@@ -8,6 +10,12 @@ MwMiniController::MwMiniController(
     , _appController(appController)
     , _windowController(windowController)
 {
+}
+
+bool MwMiniController::isRecording() const
+{
+    const int state = _model->getRecorderState();
+    return state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED;
 }
 
 void MwMiniController::_emit(ActionType action)

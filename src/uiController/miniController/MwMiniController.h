@@ -54,6 +54,8 @@ protected:
     void prevPlay() { _emit(ACTION_PREV_PLAY); }
     void requestHide() { _emit(ACTION_REQUEST_HIDE); }
 
+    // Whether there is a recording, running or paused.
+    [[nodiscard]] bool isRecording() const;
     [[nodiscard]] MwModel* getModel() const { return _model; }
     [[nodiscard]] MwAppController* getAppController() const { return _appController; }
     [[nodiscard]] panekit::WWindowController* getWindowController() const { return _windowController; }

@@ -6,6 +6,8 @@
 #include <string>
 #include <vector>
 
+#include "MwLog.h"
+
 // What tells one surface from another.
 struct MwMiniSurfaceLook {
     const char* window;
@@ -26,6 +28,18 @@ struct MwMiniButton {
     const char* backgroundColor;
     const char* accessibleName;
 };
+
+// A button's callback that calls an operation of its data.
+template <auto Operation, typename Self>
+void mwMiniClickedCb(void* data, Evas_Object*, void*)
+{
+    auto* self = static_cast<Self*>(data);
+    if (!self) {
+        MW_LOGE("self is nullptr");
+        return;
+    }
+    (self->*Operation)();
+}
 
 // The window of a mini controller and what is in it. Owns the window. Main loop only.
 class MwMiniSurface {

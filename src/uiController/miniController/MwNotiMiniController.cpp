@@ -64,17 +64,6 @@ MwNotiMiniController::MwNotiMiniController(
 
 MwNotiMiniController::~MwNotiMiniController() { live = nullptr; }
 
-template <void (MwNotiMiniController::*Operation)()>
-void MwNotiMiniController::_clickedCb(void* data, Evas_Object*, void*)
-{
-    auto* self = static_cast<MwNotiMiniController*>(data);
-    if (!self) {
-        MW_LOGE("self is nullptr");
-        return;
-    }
-    (self->*Operation)();
-}
-
 void MwNotiMiniController::create()
 {
     MW_LOGI("BEGIN");
@@ -175,7 +164,7 @@ void MwNotiMiniController::_menuButtonClicked()
 // Playing ends with its surface only for the eye: the program has a window that the user did not close.
 void MwNotiMiniController::_closeButtonClicked()
 {
-    if (_records()) {
+    if (isRecording()) {
         evas_object_hide(_surface.getWindow());
         return _requestCancelPopup();
     }
@@ -197,12 +186,6 @@ void MwNotiMiniController::_requestCancelPopup()
     });
     if (!asked)
         evas_object_show(_surface.getWindow());
-}
-
-bool MwNotiMiniController::_records() const
-{
-    const int state = getModel()->getRecorderState();
-    return state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED;
 }
 
 void MwNotiMiniController::update()
@@ -336,7 +319,7 @@ void MwNotiMiniController::_seenChangedCb(void* data)
     auto* self = static_cast<MwNotiMiniController*>(data);
     if (!self->_surface.isSeen())
         self->_destroyTimers();
-    else if (self->_records())
+    else if (self->isRecording())
         self->update();
 }
 
@@ -349,6 +332,6 @@ void MwNotiMiniController::_onSystemInfo(MwSignalMgr::SystemInfo info)
         return;
     if (!MwSystemMgr::getInstance()->isLCDOn())
         _destroyTimers();
-    else if (_records())
+    else if (isRecording())
         update();
 }

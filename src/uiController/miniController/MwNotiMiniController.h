@@ -25,8 +25,8 @@ private:
     static void _minicontrolEventCb(minicontrol_provider_event_e event, bundle* arguments);
     static unsigned char _clientMessageCb(void* data, int type, void* event);
     static void _seenChangedCb(void* data);
-    template <void (MwNotiMiniController::*Operation)()>
-    static void _clickedCb(void* data, Evas_Object* button, void* info);
+    template <auto Operation>
+    static constexpr auto _clickedCb = mwMiniClickedCb<Operation, MwNotiMiniController>;
 
     void _createMenuButton();
     void _createCloseButton();
@@ -53,7 +53,6 @@ private:
     void _createRecordPauseBlinkTimer();
     void _destroyTimers();
     void _onSystemInfo(MwSignalMgr::SystemInfo info);
-    [[nodiscard]] bool _records() const;
 
     MwMiniSurface _surface;
     MwCancelQuestion _cancelQuestion;
