@@ -95,6 +95,8 @@ ControlWindow::ControlWindow(Evas_Object* window, minicontrol_viewer_e viewer, m
 
 ControlWindow::~ControlWindow()
 {
+    evas_object_intercept_show_callback_del(_window, _showCb);
+    evas_object_intercept_hide_callback_del(_window, _hideCb);
     if (_job != nullptr)
         ecore_job_del(_job);
     for (Ecore_Event_Handler* handler : _handlers)
@@ -118,10 +120,8 @@ void ControlWindow::_listen()
                 callback(MINICONTROL_PROVIDER_EVENT_REQUEST_HIDE, nullptr);
         },
         this);
-    evas_object_intercept_show_callback_add(
-        _window, [](void* self, Evas_Object*) { static_cast<ControlWindow*>(self)->_wish(true); }, this);
-    evas_object_intercept_hide_callback_add(
-        _window, [](void* self, Evas_Object*) { static_cast<ControlWindow*>(self)->_wish(false); }, this);
+    evas_object_intercept_show_callback_add(_window, _showCb, this);
+    evas_object_intercept_hide_callback_add(_window, _hideCb, this);
     for (const char* key : {VCONFKEY_IDLE_LOCK_STATE, KEY_DISPLAY_STATE})
         _watches.push_back(stateTree().watch(key, [this](const std::string&) { _apply(); }));
     if (elm_win_xwindow_get(_window) != 0)
@@ -175,6 +175,10 @@ void ControlWindow::_listenToPointer()
         },
         this));
 }
+
+void ControlWindow::_showCb(void* self, Evas_Object*) { static_cast<ControlWindow*>(self)->_wish(true); }
+
+void ControlWindow::_hideCb(void* self, Evas_Object*) { static_cast<ControlWindow*>(self)->_wish(false); }
 
 void ControlWindow::_wish(bool wanted)
 {

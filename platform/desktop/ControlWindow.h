@@ -30,6 +30,8 @@ private:
     void _listen();
     void _listenToX11();
     void _listenToPointer();
+    static void _showCb(void* self, Evas_Object* window);
+    static void _hideCb(void* self, Evas_Object* window);
     void _wish(bool wanted);
     void _later();
     void _apply();

@@ -20,6 +20,9 @@ constexpr auto IMAGE_FILE = "edje/MwImages.edj";
 
 MwMiniSurface::~MwMiniSurface()
 {
+    // The window is hidden as it goes; whoever was to be told of that is going, too.
+    _seenChanged = nullptr;
+    _label = nullptr;
     if (_window)
         evas_object_del(std::exchange(_window, nullptr));
 }
@@ -54,7 +57,8 @@ bool MwMiniSurface::create(minicontrol_provider_event_cb callback, void (*seenCh
         [](void* surface, Evas_Object*, void*) {
             const auto* self = static_cast<MwMiniSurface*>(surface);
             self->_slide();
-            self->_seenChanged(self->_data);
+            if (self->_seenChanged)
+                self->_seenChanged(self->_data);
         },
         this);
     return true;
