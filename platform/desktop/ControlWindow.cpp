@@ -169,8 +169,9 @@ void ControlWindow::_listenToPointer()
         this));
     _handlers.push_back(ecore_event_handler_add(
         ECORE_EVENT_MOUSE_BUTTON_UP,
-        [](void* self, int, void*) -> Eina_Bool {
-            static_cast<ControlWindow*>(self)->_endDrag();
+        [](void* self, int, void* event) -> Eina_Bool {
+            const auto* release = static_cast<Ecore_Event_Mouse_Button*>(event);
+            static_cast<ControlWindow*>(self)->_endDrag(release->root.x, release->root.y);
             return ECORE_CALLBACK_PASS_ON;
         },
         this));
@@ -281,19 +282,18 @@ void ControlWindow::_drag(int x, int y)
         evas_object_move(_window, x - _gripX, y - _gripY);
 }
 
-void ControlWindow::_endDrag()
+// By the pointer: a window manager may still be busy with an earlier move.
+void ControlWindow::_endDrag(int x, int y)
 {
     if (!std::exchange(_isDragged, false))
         return;
-    int x = 0;
-    int y = 0;
     int width = 0;
     int height = 0;
-    evas_object_geometry_get(_window, &x, &y, &width, &height);
+    evas_object_geometry_get(_window, nullptr, nullptr, &width, &height);
     const host::ScreenArea area = host::X11Desktop::workArea();
     const auto share = [](int at, int room) { return room > 0 ? std::clamp(at * WHOLE / room, 0, WHOLE) : 0; };
-    preference_set_int(preferenceOf(_viewer, "X").c_str(), share(x - area.x, area.width - width));
-    preference_set_int(preferenceOf(_viewer, "Y").c_str(), share(y - area.y, area.height - height));
+    preference_set_int(preferenceOf(_viewer, "X").c_str(), share(x - _gripX - area.x, area.width - width));
+    preference_set_int(preferenceOf(_viewer, "Y").c_str(), share(y - _gripY - area.y, area.height - height));
     _place();
 }
 

@@ -42,7 +42,7 @@ private:
     void _tellWhetherSeen();
     void _beginDrag(int x, int y);
     void _drag(int x, int y);
-    void _endDrag();
+    void _endDrag(int x, int y);
 
     Evas_Object* _window; // it owns this object
     const minicontrol_viewer_e _viewer;

@@ -174,6 +174,11 @@ TEST_P(MinicontrolTest, StaysWhereItIsDraggedAndAsksBeforeItCloses)
     ASSERT_TRUE(xdotool({"mousemove", "320", "30", "mousedown", "1", "mousemove", "300", "100", "mousemove", "230",
         "240", "mouseup", "1"}));
     EXPECT_TRUE(isAt(window, 80, 210));
+    EXPECT_TRUE(runUntil([] {
+        int x = 500;
+        preference_get_int("PanelControlX", &x);
+        return x != 500;
+    })) << "kept when the button is let go";
     evas_object_del(window);
     window = createControl(MINICONTROL_VIEWER_PANEL);
     ASSERT_TRUE(comes(window));
