@@ -60,6 +60,26 @@ private:
     int _missing = 0;
 };
 
+bool offersActions(host::BusInLoop* session)
+{
+    sd_bus_message* reply = nullptr;
+    bool found = false;
+    if (session == nullptr
+        || sd_bus_call_method(session->get(), "org.freedesktop.Notifications", "/org/freedesktop/Notifications",
+               "org.freedesktop.Notifications", "GetCapabilities", nullptr, &reply, nullptr)
+            < 0)
+        return false;
+    char** capabilities = nullptr;
+    if (sd_bus_message_read_strv(reply, &capabilities) >= 0)
+        for (char** each = capabilities; each != nullptr && *each != nullptr; ++each) {
+            found = found || std::string_view(*each) == "actions";
+            std::free(*each);
+        }
+    std::free(capabilities);
+    sd_bus_message_unref(reply);
+    return found;
+}
+
 void addBuses(Report& report)
 {
     host::BusInLoop* session = host::sessionBus();
@@ -71,6 +91,9 @@ void addBuses(Report& report)
     report.addName("ModemManager", system, "org.freedesktop.ModemManager1", "no telephone calls");
     report.addName(
         "notifications", session, "org.freedesktop.Notifications", "messages in the background go to the log");
+    report.add("notification control", offersActions(session),
+        "buttons while recording in the background, where no control window is possible or wanted",
+        "media controls (MPRIS) only");
     report.addName("portal", session, "org.freedesktop.portal.Desktop", "light theme, clock of the region");
     report.add("MPRIS", session != nullptr, "available", "keys of the keyboard only");
 }
@@ -85,7 +108,7 @@ void addPlaces(Report& report)
     const char* engine = std::getenv("ELM_DISPLAY");
     const bool x11 = display != nullptr && *display != '\0' && (engine == nullptr || std::string_view(engine) == "x11");
     report.add("control windows", x11, "for the panel; over lock screens that let windows through",
-        "media controls (MPRIS) only");
+        "a notification, where those have buttons");
     const bool device = ::access(storage_device_root(), W_OK) == 0;
     report.add("device storage", device, rootText(storage_device_root()), "recordings cannot be saved");
     const bool card = ::access(storage_card_root(), F_OK) == 0;

@@ -14,6 +14,8 @@ typedef void (*preference_changed_cb)(const char* key, void* user_data);
 #define PREFERENCE_PRIVATE_METHOD "PrivateStorageMethod"
 // Whether any program that listens counts as another recorder, which refuses a start.
 #define PREFERENCE_STRICT_RECORDERS "StrictRecorders"
+// Whether a notification with buttons shows a recording in the background where a control window could.
+#define PREFERENCE_USE_NOTIFICATION_CONTROL "UseNotificationControl"
 
 extern "C" {
 int preference_get_int(const char* key, int* value);

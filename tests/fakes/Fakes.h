@@ -3,6 +3,7 @@
 #include <app_control.h>
 #include <media_key.h>
 #include <minicontrol.h>
+#include <notification_control.h>
 #include <player.h>
 #include <recorder.h>
 #include <recorder_leftover.h>
@@ -83,6 +84,18 @@ struct ControlWindow {
 };
 extern std::map<int, ControlWindow> controlWindows;
 void setSeen(int viewer, bool seen);
+extern bool hasControlWindows;
+
+// The notification in place of a control window: "title|text|key|key..." while it is there.
+struct Notification {
+    notification_control_changed_cb changed = nullptr;
+    void* changedData = nullptr;
+    bool isSupported = false;
+    std::string text;
+    std::function<void(const char* key)> press;
+};
+extern Notification notification;
+void setNotificationSupported(bool supported);
 
 struct Desktop {
     media_key_event_cb mediaKey = nullptr;

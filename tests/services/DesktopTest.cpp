@@ -3,6 +3,7 @@
 #include "host/Notifier.h"
 #include "media_key.h"
 #include "notification.h"
+#include "notification_control.h"
 #include "remote_player.h"
 #include "tovanic_log_manager.h"
 #include "vconf.h"
@@ -236,6 +237,136 @@ TEST(NotifierTest, ReportsWhenNobodyShowsIt)
     EXPECT_TRUE(notifier.show("no daemon", fail));
     EXPECT_TRUE(runUntil([&] { return failed == "no daemon"; }));
     host::closeBuses();
+}
+
+// A notification service that gives the next number to each new notification and keeps what it is told in files.
+class NotificationService {
+public:
+    NotificationService(const PrivateBus& bus, const std::string& capabilities, const support::TempDir& directory)
+        : _told(directory.file("told"))
+        , _daemon(bus, BusKind::SESSION, NAME, {"--template", written(directory.file("service.py"), capabilities)})
+    {
+    }
+    [[nodiscard]] bool hasHeard(const std::string& text) const
+    {
+        return runUntil([&] { return support::readFile(_told).ends_with(text + "\n"); }, 20);
+    }
+    [[nodiscard]] std::string heard() const { return support::readFile(_told); }
+    void press(unsigned int id, const char* key)
+    {
+        _daemon.control(PATH, "EmitSignal", "sssav", NAME, "ActionInvoked", "us", 2, "u", id, "s", key);
+    }
+    void close(unsigned int id)
+    {
+        _daemon.control(PATH, "EmitSignal", "sssav", NAME, "NotificationClosed", "uu", 2, "u", id, "u", 2U);
+    }
+
+private:
+    static constexpr auto NAME = "org.freedesktop.Notifications";
+    static constexpr auto PATH = "/org/freedesktop/Notifications";
+
+    // It can answer as soon as it has its name.
+    [[nodiscard]] std::string written(const std::string& file, const std::string& capabilities) const
+    {
+        std::string program = R"PY(
+BUS_NAME = MAIN_IFACE = "org.freedesktop.Notifications"
+MAIN_OBJ = "/org/freedesktop/Notifications"
+SYSTEM_BUS = False
+def load(mock, parameters):
+    tell = 'open("TOLD", "a").write'
+    mock.AddMethods(MAIN_IFACE, [
+        ("GetCapabilities", "", "as", 'ret = "CAPABILITIES".split()'),
+        ("CloseNotification", "u", "", tell + '(f"closed {args[0]}\\n")'),
+        ("Notify", "susssasa{sv}i", "u", """
+n = args[1] or len(self.GetMethodCalls("Notify")) + 100
+h = args[6]
+lasts = h["resident"] and h["suppress-sound"] and h["urgency"] == 0 and args[7] == 0
+""" + tell + """(f"{args[1]}:{n} {args[3]}|{args[4]}|{' '.join(args[5])}|{bool(lasts)}\\n")
+ret = dbus.UInt32(n)""")])
+)PY";
+        for (const auto& [word, value] : {std::pair("TOLD", _told), {"CAPABILITIES", capabilities}})
+            program.replace(program.find(word), std::strlen(word), value);
+        support::writeFile(file, program);
+        return file;
+    }
+
+    std::string _told;
+    DbusMock _daemon;
+};
+
+class NotificationControlTest : public testing::Test {
+protected:
+    NotificationControlTest() { host::closeBuses(); }
+    ~NotificationControlTest() override
+    {
+        notification_control_unwatch();
+        host::closeBuses();
+    }
+    void SetUp() override
+    {
+        if (!DbusMock::isInstalled())
+            GTEST_SKIP() << "python3-dbusmock is missing";
+        ASSERT_EQ(0, notification_control_watch([](void* self) { ++static_cast<Self*>(self)->_changes; }, this));
+    }
+    int post(const char* text)
+    {
+        const notification_control_action_s actions[] = {{"pause", "Pause"}, {"stop", "Stop"}};
+        return notification_control_post(
+            "Voice <1>", text, actions, 2,
+            [](const char* key, void* self) { static_cast<Self*>(self)->_pressed += std::string(key) + " "; }, this);
+    }
+    static bool becomes(bool supported)
+    {
+        return runUntil([=] { return notification_control_is_supported() == supported; }, 20);
+    }
+
+    using Self = NotificationControlTest;
+    const PrivateBus _bus;
+    support::TempDir _directory;
+    int _changes = 0;
+    std::string _pressed;
+};
+
+TEST_F(NotificationControlTest, IsOneThatChangesInPlaceAndActs)
+{
+    EXPECT_NE(0, post("nobody is there"));
+    NotificationService service(_bus, "body body-markup actions", _directory);
+    ASSERT_TRUE(becomes(true));
+    ASSERT_EQ(0, post("records"));
+    ASSERT_EQ(0, post("records <b>")); // before the first one has its number
+    ASSERT_TRUE(service.hasHeard("101:101 Voice <1>|records &lt;b&gt;|pause Pause stop Stop|True")) << service.heard();
+    service.press(100, "stop");
+    service.press(101, "pause");
+    EXPECT_TRUE(runUntil([&] { return _pressed == "pause "; })) << "not that of another program";
+    service.close(101);
+    support::runFor(0.1);
+    ASSERT_EQ(0, post("rests"));
+    ASSERT_TRUE(service.hasHeard("0:103 Voice <1>|rests|pause Pause stop Stop|True")) << service.heard();
+    notification_control_withdraw();
+    ASSERT_TRUE(service.hasHeard("closed 103")) << service.heard();
+    ASSERT_EQ(0, post("on its way"));
+    notification_control_unwatch();
+    ASSERT_TRUE(service.hasHeard("closed 104")) << service.heard();
+}
+
+TEST_F(NotificationControlTest, FollowsTheServiceThatIsThere)
+{
+    for (const bool hasActions : {true, false, true}) {
+        const support::TempDir directory;
+        const NotificationService service(_bus, hasActions ? "actions" : "body", directory);
+        if (!hasActions) {
+            support::runFor(0.1);
+            EXPECT_NE(0, post("no actions"));
+            continue;
+        }
+        ASSERT_TRUE(becomes(true));
+        EXPECT_EQ(0, post("plain <b>"));
+        EXPECT_TRUE(service.hasHeard("0:101 Voice <1>|plain <b>|pause Pause stop Stop|True")) << service.heard();
+        EXPECT_EQ("", _pressed);
+    }
+    EXPECT_TRUE(becomes(false)) << "it has ended";
+    EXPECT_EQ(4, _changes);
+    EXPECT_NE(0, post("nobody is there"));
 }
 
 TEST(StatusMessageTest, IsRememberedFromAnyThread)

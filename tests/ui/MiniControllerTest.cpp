@@ -4,6 +4,7 @@
 #include <Elementary.h>
 
 #include <panekit/WWindowController.h>
+#include <preference.h>
 #include <vconf.h>
 
 #include "FakeApp.h"
@@ -68,6 +69,12 @@ public:
     static void announce(MwSignalMgr::LifeCycle change)
     {
         MwSignalMgr::getInstance()->getLifeCycleSignal().emit(change);
+    }
+    // On X11 the window goes to the background; elsewhere it loses the focus.
+    void setAway(bool away)
+    {
+        model.setAppState(away ? MwModel::APP_STATE_PAUSED : MwModel::APP_STATE_RESUMED);
+        announce(away ? MwSignalMgr::PAUSE : MwSignalMgr::RESUME);
     }
     static bool has(int viewer) { return controlWindows.contains(viewer); }
     static Evas_Object* layout(int viewer)
@@ -349,6 +356,100 @@ TEST(MiniControllerTest, APausedPlaybackWaitsForTheAlarmService)
     EXPECT_FALSE(Surfaces::has(PANEL));
     surfaces.manager.reset();
     ui::answer(last, APP_CONTROL_RESULT_SUCCEEDED); // nobody waits any more
+}
+
+TEST(MiniControllerTest, ANotificationTakesThePlaceOfTheWindow)
+{
+    struct {
+        const char* name;
+        bool canBeWindow;
+        bool isPreferred;
+        bool isSupported;
+        bool window;
+        bool notification;
+    } const cases[] = {
+        {"as usual", true, false, true, true, false}, {"preferred", true, true, true, false, true},
+        {"preferred, without actions", true, true, false, true, false}, {"no window", false, false, true, false, true},
+        {"neither", false, false, false, false, true}, // refused by the service, until it comes
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.name);
+        Surfaces surfaces;
+        fakes::hasControlWindows = c.canBeWindow;
+        fakes::setNotificationSupported(c.isSupported);
+        preference_set_boolean(PREFERENCE_USE_NOTIFICATION_CONTROL, c.isPreferred);
+        const auto isShown = [] { return !fakes::notification.text.empty(); };
+        for (const int state : {RECORDS, RESTS}) {
+            surfaces.setAway(false);
+            surfaces.record(state);
+            EXPECT_EQ(c.window, Surfaces::has(PANEL));
+            EXPECT_FALSE(isShown()) << "the program is in front";
+            surfaces.setAway(true);
+            EXPECT_EQ(c.window, Surfaces::has(PANEL));
+            EXPECT_EQ(c.notification, isShown());
+        }
+        fakes::setNotificationSupported(true);
+        EXPECT_NE(Surfaces::has(PANEL), isShown()) << "never both";
+        fakes::setNotificationSupported(false);
+        EXPECT_EQ(c.canBeWindow, Surfaces::has(PANEL));
+        fakes::setNotificationSupported(true);
+        surfaces.record(READY);
+        EXPECT_FALSE(isShown() || Surfaces::has(PANEL));
+        surfaces.play(PLAYS);
+        EXPECT_FALSE(isShown()) << "players have the media controls";
+        EXPECT_EQ(c.canBeWindow && !c.isPreferred, Surfaces::has(PANEL));
+        surfaces.play(SILENT);
+        preference_set_boolean(PREFERENCE_USE_NOTIFICATION_CONTROL, false);
+    }
+    fakes::hasControlWindows = true;
+}
+
+TEST(MiniControllerTest, TheNotificationActsLikeTheWindow)
+{
+    struct {
+        int state;
+        const char* key;
+        std::vector<App::Command> commands;
+    } const presses[] = {
+        {RECORDS, "pause", {App::PAUSE_RECORDING}},
+        {RESTS, "resume", {App::RESUME_RECORDING}},
+        {RECORDS, "stop", {App::STOP_RECORDING}},
+        {RESTS, "stop", {App::STOP_RECORDING}},
+        {RECORDS, NOTIFICATION_CONTROL_OPENED, {}},
+        {RECORDS, "something else", {}},
+    };
+    fakes::hasControlWindows = false;
+    for (const auto& each : presses) {
+        SCOPED_TRACE(each.key);
+        Surfaces surfaces;
+        fakes::setNotificationSupported(true);
+        surfaces.setAway(true);
+        surfaces.model.setCurrentRecordingFileName("Voice <1>");
+        surfaces.record(each.state, 3661000);
+        EXPECT_EQ(each.state == RECORDS ? "Voice <1>|Recording|default|pause|stop|cancel"
+                                        : "Voice <1>|Paused \u00b7 01:01:01|default|resume|stop|cancel",
+            fakes::notification.text);
+        fakes::notification.press(each.key);
+        controller.finish();
+        EXPECT_EQ(each.commands, controller.commands);
+        EXPECT_EQ(std::string(each.key) == NOTIFICATION_CONTROL_OPENED, calls.has("app_manager_resume_app"));
+    }
+    Surfaces surfaces;
+    fakes::setNotificationSupported(true);
+    surfaces.setAway(true);
+    surfaces.record(RECORDS);
+    fakes::notification.press("cancel");
+    fakes::notification.press("cancel");
+    ASSERT_EQ(1U, ui::launches.size()) << "one question";
+    ui::answer(ui::launches.back(), APP_CONTROL_RESULT_FAILED);
+    EXPECT_TRUE(controller.commands.empty());
+    fakes::notification.press("cancel");
+    ui::answer(ui::launches.back(), APP_CONTROL_RESULT_SUCCEEDED);
+    EXPECT_TRUE(support::runUntil([] { return calls.has("ui_app_exit"); }));
+    EXPECT_EQ(std::vector{App::CANCEL_RECORDING}, controller.commands);
+    surfaces.setAway(false);
+    EXPECT_TRUE(fakes::notification.text.empty());
+    fakes::hasControlWindows = true;
 }
 
 TEST(MiniControllerTest, WithoutAWindowNothingIsShownAndNothingBreaks)

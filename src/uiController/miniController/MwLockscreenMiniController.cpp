@@ -24,8 +24,6 @@ constexpr auto RECORDING_COLOR = "ATO018";
 constexpr auto PLAYING_COLOR = "ATO047";
 constexpr double TIME_INTERVAL = 0.3; // seconds
 constexpr double BLINK_INTERVAL = 1.0;
-constexpr int MINUTE = 60;
-constexpr int HOUR = 3600;
 
 constexpr auto STYLE = "mewlo/circle_button/lockscreen";
 constexpr MwMiniButton STOP = {"mini_lockscreen_stop_btn", STYLE, "miniLockscreen/ls_controller_btn_stop.png", "AO047",
@@ -69,7 +67,7 @@ void MwLockscreenMiniController::create()
     }
     if (!created)
         return;
-    _systemInfoListenerId = MwSignalMgr::getInstance()->getSystemInfoSignal().addListener(
+    MwSignalMgr::getInstance()->getSystemInfoSignal().addListener(
         [this](MwSignalMgr::SystemInfo info) { _onSystemInfo(info); }, _surface.getLayout());
     MW_LOGI("END");
 }
@@ -137,11 +135,7 @@ void MwLockscreenMiniController::_showPlaying(bool paused)
 void MwLockscreenMiniController::_showRecording(bool paused)
 {
     _surface.signal(paused ? "mini_lockscreen_state_recording_paused" : "mini_lockscreen_state_recording");
-    if (paused)
-        _setInfoText("IDS_MW_BODY_PAUSED_M_NOUN");
-    else
-        _setInfoText(MwSystemMgr::getInstance()->getRejectCall() ? "IDS_MW_SBODY_REJECTING_CALLS_ABB"
-                                                                 : "IDS_MW_HEADER_RECORDING_M_VOICE");
+    _setInfoText(getRecordingText());
     _setTimeText();
     _watchTime();
     if (paused)
@@ -158,13 +152,7 @@ void MwLockscreenMiniController::_setInfoText(const std::string& text)
         text, plays ? PLAYING_COLOR : RECORDING_COLOR, plays ? PLAYING_TEXT_SIZE : RECORDING_TEXT_SIZE, true);
 }
 
-void MwLockscreenMiniController::_setTimeText()
-{
-    const int seconds = std::max(0, static_cast<int>(getModel()->getElapsedTime() / 1000));
-    const int minutes = seconds / MINUTE;
-    _surface.setTime(minutes < MINUTE ? mwFormat("%02d:%02d", minutes, seconds % MINUTE)
-                                      : mwFormat("%02d:%02d:%02d", seconds / HOUR, minutes % MINUTE, seconds % MINUTE));
-}
+void MwLockscreenMiniController::_setTimeText() { _surface.setTime(getTimeText()); }
 
 // Nothing ticks that nobody sees.
 void MwLockscreenMiniController::_watchTime()

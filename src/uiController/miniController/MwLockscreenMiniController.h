@@ -47,5 +47,4 @@ private:
     bool _isTimeShown = true;
     panekit::WTimer::Weak _updateTimeTimer;
     panekit::WTimer::Weak _pauseBlinkTimer;
-    unsigned int _systemInfoListenerId = 0;
 };

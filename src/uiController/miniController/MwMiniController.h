@@ -2,6 +2,8 @@
 
 #include <WSignal.h>
 
+#include <string>
+
 class MwAppController;
 class MwModel;
 
@@ -56,6 +58,12 @@ protected:
 
     // Whether there is a recording, running or paused.
     [[nodiscard]] bool isRecording() const;
+    // What the recording does, translated.
+    [[nodiscard]] std::string getRecordingText() const;
+    // Of the recording; with hours from the first one on.
+    [[nodiscard]] std::string getTimeText() const;
+    // Brings the program's window forward.
+    static void openProgram();
     [[nodiscard]] MwModel* getModel() const { return _model; }
     [[nodiscard]] MwAppController* getAppController() const { return _appController; }
     [[nodiscard]] panekit::WWindowController* getWindowController() const { return _windowController; }

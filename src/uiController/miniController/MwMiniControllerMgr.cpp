@@ -1,7 +1,12 @@
 #include "MwMiniControllerMgr.h"
 
+#include <Elementary.h>
 #include <app.h>
+#include <minicontrol.h>
 #include <notification.h>
+#include <notification_control.h>
+#include <panekit/WWindowController.h>
+#include <preference.h>
 
 #include <algorithm>
 #include <utility>
@@ -11,6 +16,7 @@
 #include "MwLog.h"
 #include "MwModel.h"
 #include "MwNotiMiniController.h"
+#include "MwNotificationMiniController.h"
 #include "MwPlayer.h"
 #include "MwRecorder.h"
 #include "MwSystemMgr.h"
@@ -19,7 +25,23 @@
 namespace {
 
 constexpr auto ALARM_SERVICE_ID = "com.tovanic.mewlo-alarmservice";
+constexpr const char* FOCUS_EVENTS[] = {"focused", "unfocused"};
 constexpr unsigned long long SHORTEST_RECORDING_MS = 1000;
+
+bool isRecording(const MwModel& model)
+{
+    const int state = model.getRecorderState();
+    return state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED;
+}
+
+// On the desktop's panel; the user may prefer the notification where there can be one.
+bool canBeWindow()
+{
+    bool prefersNotification = false;
+    (void)preference_get_boolean(PREFERENCE_USE_NOTIFICATION_CONTROL, &prefersNotification);
+    return minicontrol_is_supported(MINICONTROL_VIEWER_PANEL)
+        && !(prefersNotification && notification_control_is_supported());
+}
 
 }
 
@@ -50,6 +72,13 @@ MwMiniControllerMgr::~MwMiniControllerMgr()
 
 void MwMiniControllerMgr::_initialize()
 {
+    if (notification_control_watch(_notificationChangedCb, this) != 0)
+        MW_LOGW("no notification can be the surface");
+    if (preference_set_changed_cb(PREFERENCE_USE_NOTIFICATION_CONTROL, _preferenceChangedCb, this) != 0)
+        MW_LOGE("preference_set_changed_cb failed");
+    for (const char* event : FOCUS_EVENTS)
+        if (Evas_Object* window = _window())
+            evas_object_smart_callback_add(window, event, _focusChangedCb, this);
     MwSignalMgr* signals = MwSignalMgr::getInstance();
     _lifeCycleListenerId
         = signals->getLifeCycleSignal().addListener([this](MwSignalMgr::LifeCycle change) { _onLifeCycle(change); });
@@ -65,6 +94,11 @@ void MwMiniControllerMgr::_removeListeners()
 {
     if (_lifeCycleListenerId == 0)
         return;
+    preference_unset_changed_cb(PREFERENCE_USE_NOTIFICATION_CONTROL, _preferenceChangedCb);
+    notification_control_unwatch();
+    for (const char* event : FOCUS_EVENTS)
+        if (Evas_Object* window = _window())
+            evas_object_smart_callback_del_full(window, event, _focusChangedCb, this);
     MwSignalMgr* signals = MwSignalMgr::getInstance();
     signals->getLifeCycleSignal().removeListener(std::exchange(_lifeCycleListenerId, 0));
     signals->getSystemInfoSignal().removeListener(std::exchange(_systemInfoListenerId, 0));
@@ -76,6 +110,53 @@ void MwMiniControllerMgr::_removeListeners()
 void MwMiniControllerMgr::_createNotiMiniController()
 {
     _createMiniController<MwNotiMiniController>(NOTIFICATION_PANEL);
+}
+
+// The window, or the notification, never both. The notification is there while nobody looks at the program.
+void MwMiniControllerMgr::_choosePanelSurface()
+{
+    const bool records = isRecording(*_model);
+    const bool plays = _model->getPlayerState() == MwPlayer::PLAY_STATE_PLAYING;
+    if (canBeWindow()) {
+        _destroyMiniController(NOTIFICATION);
+        if (records || plays)
+            _createNotiMiniController();
+        return;
+    }
+    _destroyMiniController(NOTIFICATION_PANEL);
+    if (records && _isAway())
+        _createMiniController<MwNotificationMiniController>(NOTIFICATION);
+    else
+        _destroyMiniController(NOTIFICATION);
+}
+
+// Where a program is not told whether its window is minimised, the one without the focus may be.
+bool MwMiniControllerMgr::_isAway() const
+{
+    if (_model->getAppState() == MwModel::APP_STATE_PAUSED)
+        return true;
+    return !minicontrol_is_supported(MINICONTROL_VIEWER_PANEL) && _window()
+        && elm_win_focus_get(_window()) == EINA_FALSE;
+}
+
+Evas_Object* MwMiniControllerMgr::_window() const
+{
+    return _windowController ? _windowController->getEvasObject() : nullptr;
+}
+
+void MwMiniControllerMgr::_focusChangedCb(void* data, Evas_Object*, void*)
+{
+    static_cast<MwMiniControllerMgr*>(data)->_choosePanelSurface();
+}
+
+void MwMiniControllerMgr::_notificationChangedCb(void* data)
+{
+    static_cast<MwMiniControllerMgr*>(data)->_choosePanelSurface();
+}
+
+void MwMiniControllerMgr::_preferenceChangedCb(const char*, void* data)
+{
+    static_cast<MwMiniControllerMgr*>(data)->_choosePanelSurface();
 }
 
 void MwMiniControllerMgr::_createLockscreenMiniController()
@@ -149,7 +230,7 @@ void MwMiniControllerMgr::_onRecorderUpdated()
         return;
     }
     MW_LOGI("update mini controller");
-    _createNotiMiniController();
+    _choosePanelSurface();
     if (MwSystemMgr::getInstance()->isLockscreenOn() && state == MwRecorder::REC_STATE_RECORDING)
         _createLockscreenMiniController();
     _updateAll();
@@ -163,7 +244,7 @@ void MwMiniControllerMgr::_onPlayerUpdated()
         _later(&MwMiniControllerMgr::_playbackEnded);
         break;
     case MwPlayer::PLAY_STATE_PLAYING:
-        _createNotiMiniController();
+        _choosePanelSurface();
         if (MwSystemMgr::getInstance()->isLockscreenOn())
             _createLockscreenMiniController();
         _updateAll();
@@ -183,9 +264,7 @@ void MwMiniControllerMgr::_onPlayerUpdated()
 void MwMiniControllerMgr::_playbackEnded()
 {
     // A recording may have begun meanwhile: its surfaces are not this playback's.
-    if (_model->getPlayerState() != MwPlayer::PLAY_STATE_NONE
-        || _model->getRecorderState() == MwRecorder::REC_STATE_RECORDING
-        || _model->getRecorderState() == MwRecorder::REC_STATE_PAUSED)
+    if (_model->getPlayerState() != MwPlayer::PLAY_STATE_NONE || isRecording(*_model))
         return;
     MW_LOGI("destroy mini controller");
     _destoryAllMiniController();
@@ -198,9 +277,7 @@ void MwMiniControllerMgr::_onSystemInfo(MwSignalMgr::SystemInfo info)
     case MwSignalMgr::LOCKSCREEN_CHANGED: {
         if (!MwSystemMgr::getInstance()->isLockscreenOn())
             return _destroyMiniController(LOCKSCREEN);
-        const int state = _model->getRecorderState();
-        if (_model->getPlayerState() != MwPlayer::PLAY_STATE_PLAYING && state != MwRecorder::REC_STATE_RECORDING
-            && state != MwRecorder::REC_STATE_PAUSED)
+        if (_model->getPlayerState() != MwPlayer::PLAY_STATE_PLAYING && !isRecording(*_model))
             return;
         _createLockscreenMiniController();
         return _updateAll();
@@ -230,12 +307,14 @@ void MwMiniControllerMgr::_onLifeCycle(MwSignalMgr::LifeCycle lifeCycle)
 
 void MwMiniControllerMgr::_appPause()
 {
+    _choosePanelSurface();
     if (_model->getPlayerState() == MwPlayer::PLAY_STATE_PAUSED)
         _requestAlarmService();
 }
 
 void MwMiniControllerMgr::_appResume()
 {
+    _choosePanelSurface();
     if (_alarmAppControl)
         _terminateAlarmService();
 }

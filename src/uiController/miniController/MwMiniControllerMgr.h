@@ -22,7 +22,7 @@ public:
     MwMiniControllerMgr& operator=(const MwMiniControllerMgr&) = delete;
 
 private:
-    enum Kind { LOCKSCREEN, NOTIFICATION_PANEL };
+    enum Kind { LOCKSCREEN, NOTIFICATION_PANEL, NOTIFICATION };
     // The identifier is that of the listener on its actions.
     struct Entry {
         MwMiniController* controller; // deletes itself
@@ -34,6 +34,12 @@ private:
     void _removeListeners();
     void _createNotiMiniController();
     void _createLockscreenMiniController();
+    void _choosePanelSurface();
+    [[nodiscard]] bool _isAway() const;
+    static void _notificationChangedCb(void* data);
+    [[nodiscard]] Evas_Object* _window() const;
+    static void _focusChangedCb(void* data, Evas_Object* window, void* info);
+    static void _preferenceChangedCb(const char* key, void* data);
     template <typename Surface>
     void _createMiniController(Kind kind);
     void _destroyMiniController(Kind kind);

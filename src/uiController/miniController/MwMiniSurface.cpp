@@ -92,7 +92,7 @@ void MwMiniSurface::setInfo(const std::string& text, const char* colorCode, int 
     int blue = 0;
     int alpha = 0;
     uxt_theme_get_color(colorCode, &red, &green, &blue, &alpha);
-    const std::string line = text.empty() ? text : mwDisplayMarkup(mwTranslate(text.c_str()));
+    const std::string line = mwDisplayMarkup(text);
     const char* format = centred ? "<font_size=%d><color=#%02x%02x%02x%02x><align=center>%s</align></color></font_size>"
                                  : "<font_size=%d><color=#%02x%02x%02x%02x>%s</color></font_size>";
     // The label asks for all of its text's width; a grid gives it what there is.

@@ -25,8 +25,6 @@ constexpr int PLAYING_TEXT_SIZE = 32;
 constexpr auto TEXT_COLOR = "ATO020";
 constexpr double STATUS_INTERVAL = 0.05; // seconds
 constexpr double BLINK_INTERVAL = 1.0;
-constexpr unsigned int MINUTE = 60;
-constexpr unsigned int HOUR = 3600;
 
 constexpr auto RECORD_STYLE = "mewlo/circle_button/noti_record";
 constexpr auto PLAY_STYLE = "mewlo/circle_button/noti_play";
@@ -78,7 +76,7 @@ void MwNotiMiniController::create()
     _createCloseButton();
     _createMenuButton();
     _registerXEvent();
-    _systemInfoListenerId = MwSignalMgr::getInstance()->getSystemInfoSignal().addListener(
+    MwSignalMgr::getInstance()->getSystemInfoSignal().addListener(
         [this](MwSignalMgr::SystemInfo info) { _onSystemInfo(info); }, _surface.getLayout());
     MW_LOGI("END");
 }
@@ -145,19 +143,7 @@ void MwNotiMiniController::_minicontrolEventCb(minicontrol_provider_event_e even
 void MwNotiMiniController::_menuButtonClicked()
 {
     MW_LOGI("BEGIN");
-    char* id = nullptr;
-    app_context_h context = nullptr;
-    app_get_id(&id);
-    const std::string own = mwAdopt(id);
-    if (const int result = app_manager_get_app_context(own.c_str(), &context); result != 0) {
-        MW_LOGE("app_manager_get_app_context().. [0x%x]", static_cast<unsigned>(result));
-        return;
-    }
-    if (vconf_set_int(VCONFKEY_IDLE_LOCK_STATE, 0) != 0)
-        MW_LOGE("vconf_set_int(VCONFKEY_IDLE_LOCK_STATE, VCONFKEY_IDLE_UNLOCK)");
-    if (const int result = app_manager_resume_app(context); result != 0)
-        MW_LOGE("app_manager_resume_app().. [0x%x]", static_cast<unsigned>(result));
-    app_manager_context_destroy(context);
+    openProgram();
     MW_LOGI("END");
 }
 
@@ -237,9 +223,8 @@ void MwNotiMiniController::_showPlaying(bool paused)
 void MwNotiMiniController::_showRecording()
 {
     _surface.signal("mini_controller_state_recording");
-    _updateInfoText(MwSystemMgr::getInstance()->getRejectCall() ? "IDS_MW_SBODY_REJECTING_CALLS_ABB"
-                                                                : "IDS_MW_HEADER_RECORDING_M_VOICE");
-    _updateRecordingTime(getModel()->getElapsedTime() / 1000);
+    _updateInfoText(getRecordingText());
+    _updateRecordingTime();
     _watchTime();
     _surface.addButton(PAUSE_RECORD, _clickedCb<&MwNotiMiniController::_pauseRecordButtonClicked>, this);
     _surface.addButton(STOP, _clickedCb<&MwNotiMiniController::_stopRecordButtonClicked>, this);
@@ -248,8 +233,8 @@ void MwNotiMiniController::_showRecording()
 void MwNotiMiniController::_showRecordPaused()
 {
     _surface.signal("mini_controller_state_paused");
-    _updateInfoText("IDS_MW_BODY_PAUSED_M_NOUN");
-    _updateRecordingTime(getModel()->getElapsedTime() / 1000);
+    _updateInfoText(getRecordingText());
+    _updateRecordingTime();
     _watchTime();
     _surface.addButton(RESUME_RECORD, _clickedCb<&MwNotiMiniController::_resumeRecordButtonClicked>, this);
     _surface.addButton(STOP, _clickedCb<&MwNotiMiniController::_stopRecordButtonClicked>, this);
@@ -261,12 +246,10 @@ void MwNotiMiniController::_updateInfoText(const std::string& text)
     _surface.setInfo(text, TEXT_COLOR, plays ? PLAYING_TEXT_SIZE : RECORDING_TEXT_SIZE, plays);
 }
 
-void MwNotiMiniController::_updateRecordingTime(unsigned int seconds)
+void MwNotiMiniController::_updateRecordingTime()
 {
-    _shownSecond = seconds;
-    const unsigned int minutes = seconds % HOUR / MINUTE;
-    _surface.setTime(seconds < HOUR ? mwFormat("%02u:%02u", minutes, seconds % MINUTE)
-                                    : mwFormat("%02u:%02u:%02u", seconds / HOUR, minutes, seconds % MINUTE));
+    _shownTime = getTimeText();
+    _surface.setTime(_shownTime);
 }
 
 // Nothing ticks that nobody sees.
@@ -292,9 +275,8 @@ void MwNotiMiniController::_createRecordingStatusUpdateTimer()
             MW_LOGE("Invalid recorder state! [%d]", getModel()->getRecorderState());
             return false;
         }
-        const auto seconds = static_cast<unsigned int>(getModel()->getElapsedTime() / 1000);
-        if (seconds != _shownSecond)
-            _updateRecordingTime(seconds);
+        if (getTimeText() != _shownTime)
+            _updateRecordingTime();
         return true;
     });
 }

@@ -47,7 +47,7 @@ private:
     void _showRecordPaused();
     void _showPlaying(bool paused);
     void _updateInfoText(const std::string& text);
-    void _updateRecordingTime(unsigned int seconds);
+    void _updateRecordingTime();
     void _watchTime();
     void _createRecordingStatusUpdateTimer();
     void _createRecordPauseBlinkTimer();
@@ -57,11 +57,10 @@ private:
     MwMiniSurface _surface;
     MwCancelQuestion _cancelQuestion;
     int _rotation = 0; // degrees
-    unsigned int _shownSecond = 0;
+    std::string _shownTime;
     bool _isTimeShown = true;
     bool _isClosed = false; // by the user, for as long as this playback rests
     panekit::WTimer::Weak _statusUpdateTimer;
     panekit::WTimer::Weak _pauseBlinkTimer;
     _Ecore_Event_Handler* _clientMessageHandler = nullptr;
-    unsigned int _systemInfoListenerId = 0;
 };
