@@ -23,10 +23,10 @@ struct Shown {
 };
 
 constexpr Shown LOOKS[] = {
-    {"bg_recording_start", "media-record", "Recording"},
-    {"bg_recording_pause", "media-playback-pause", "Recording paused"},
-    {"bg_playing_start", "media-playback-start", "Playing"},
-    {"bg_playing_pause", "media-playback-pause", "Playback paused"},
+    {.data = "bg_recording_start", .icon = "media-record", .title = "Recording"},
+    {.data = "bg_recording_pause", .icon = "media-playback-pause", .title = "Recording paused"},
+    {.data = "bg_playing_start", .icon = "media-playback-start", .title = "Playing"},
+    {.data = "bg_playing_pause", .icon = "media-playback-pause", .title = "Playback paused"},
 };
 
 std::unique_ptr<TrayIcon> tray;

@@ -18,14 +18,27 @@ namespace {
         media_key_e key;
     };
 
-    constexpr Named METHODS[]
-        = {{"Play", MEDIA_KEY_PLAY}, {"Pause", MEDIA_KEY_PAUSE}, {"PlayPause", MEDIA_KEY_PLAYPAUSE},
-            {"Stop", MEDIA_KEY_STOP}, {"Next", MEDIA_KEY_NEXT}, {"Previous", MEDIA_KEY_PREVIOUS}};
+    constexpr Named METHODS[] = {
+        {.name = "Play", .key = MEDIA_KEY_PLAY},
+        {.name = "Pause", .key = MEDIA_KEY_PAUSE},
+        {.name = "PlayPause", .key = MEDIA_KEY_PLAYPAUSE},
+        {.name = "Stop", .key = MEDIA_KEY_STOP},
+        {.name = "Next", .key = MEDIA_KEY_NEXT},
+        {.name = "Previous", .key = MEDIA_KEY_PREVIOUS},
+    };
 
     // Keyboards have one key for play and pause; it bears the name of play.
-    constexpr Named KEYBOARD[] = {{"Play", MEDIA_KEY_PLAYPAUSE}, {"Pause", MEDIA_KEY_PAUSE}, {"Stop", MEDIA_KEY_STOP},
-        {"Next", MEDIA_KEY_NEXT}, {"Prev", MEDIA_KEY_PREVIOUS}, {"Forward", MEDIA_KEY_FASTFORWARD},
-        {"Rewind", MEDIA_KEY_REWIND}, {"Media", MEDIA_KEY_MEDIA}, {"Record", MEDIA_KEY_RECORD}};
+    constexpr Named KEYBOARD[] = {
+        {.name = "Play", .key = MEDIA_KEY_PLAYPAUSE},
+        {.name = "Pause", .key = MEDIA_KEY_PAUSE},
+        {.name = "Stop", .key = MEDIA_KEY_STOP},
+        {.name = "Next", .key = MEDIA_KEY_NEXT},
+        {.name = "Prev", .key = MEDIA_KEY_PREVIOUS},
+        {.name = "Forward", .key = MEDIA_KEY_FASTFORWARD},
+        {.name = "Rewind", .key = MEDIA_KEY_REWIND},
+        {.name = "Media", .key = MEDIA_KEY_MEDIA},
+        {.name = "Record", .key = MEDIA_KEY_RECORD},
+    };
 
     template <size_t Count>
     std::optional<media_key_e> keyNamed(const Named (&table)[Count], const std::string& name)

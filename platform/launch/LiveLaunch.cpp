@@ -245,7 +245,7 @@ bool isSendable(app_control_h control)
     return control != nullptr && (!control->appId.empty() || !control->fields.text("operation").empty());
 }
 
-void failLater(const std::shared_ptr<app_control_s>& request, app_control_reply_cb callback, void* userData)
+void replyFailed(const std::shared_ptr<app_control_s>& request, app_control_reply_cb callback, void* userData)
 {
     if (callback == nullptr)
         return;
@@ -264,7 +264,7 @@ int app_control_send_launch_request(app_control_h control, app_control_reply_cb 
     const auto request = std::make_shared<app_control_s>(*control);
     const bool posted = platform::onMainLoop([=] {
         if (LiveLaunch::start(*request, callback, user_data) != APP_CONTROL_ERROR_NONE)
-            failLater(request, callback, user_data);
+            replyFailed(request, callback, user_data);
     });
     return posted ? APP_CONTROL_ERROR_NONE : APP_CONTROL_ERROR_LAUNCH_FAILED;
 }

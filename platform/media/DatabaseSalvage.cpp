@@ -73,11 +73,25 @@ namespace {
         return "SELECT " + sql;
     }
 
-    constexpr Column MEDIA[] = {{"MEDIA_ID", "''"}, {"MEDIA_PATH", "''"}, {"MEDIA_DISPLAY_NAME", "''"},
-        {"MEDIA_MIME_TYPE", "''"}, {"MEDIA_MODE", "0"}, {"MEDIA_STORAGE", "0"}, {"MEDIA_SIZE", "0"},
-        {"MEDIA_ADDED_TIME", "0"}, {"MEDIA_MODIFIED_TIME", "0"}, {"MEDIA_TIMELINE", "0"}, {"MEDIA_DURATION", "-1"}};
-    constexpr Column BOOKMARK[]
-        = {{"BOOKMARK_ID", "0"}, {"MEDIA_ID", "''"}, {"BOOKMARK_MARKED_TIME", "0"}, {"BOOKMARK_NAME", "''"}};
+    constexpr Column MEDIA[] = {
+        {.name = "MEDIA_ID", .absent = "''"},
+        {.name = "MEDIA_PATH", .absent = "''"},
+        {.name = "MEDIA_DISPLAY_NAME", .absent = "''"},
+        {.name = "MEDIA_MIME_TYPE", .absent = "''"},
+        {.name = "MEDIA_MODE", .absent = "0"},
+        {.name = "MEDIA_STORAGE", .absent = "0"},
+        {.name = "MEDIA_SIZE", .absent = "0"},
+        {.name = "MEDIA_ADDED_TIME", .absent = "0"},
+        {.name = "MEDIA_MODIFIED_TIME", .absent = "0"},
+        {.name = "MEDIA_TIMELINE", .absent = "0"},
+        {.name = "MEDIA_DURATION", .absent = "-1"},
+    };
+    constexpr Column BOOKMARK[] = {
+        {.name = "BOOKMARK_ID", .absent = "0"},
+        {.name = "MEDIA_ID", .absent = "''"},
+        {.name = "BOOKMARK_MARKED_TIME", .absent = "0"},
+        {.name = "BOOKMARK_NAME", .absent = "''"},
+    };
 
     class Reader {
     public:

@@ -22,7 +22,11 @@ namespace {
         const char* extension;
         const char* mimeType;
     };
-    constexpr Kind KINDS[] = {{".m4a", "audio/mp4"}, {".amr", "audio/AMR"}, {".3ga", "audio/3gpp"}};
+    constexpr Kind KINDS[] = {
+        {.extension = ".m4a", .mimeType = "audio/mp4"},
+        {.extension = ".amr", .mimeType = "audio/AMR"},
+        {.extension = ".3ga", .mimeType = "audio/3gpp"},
+    };
 
     const char* mimeTypeOf(const std::string& path)
     {

@@ -67,7 +67,7 @@ void Recording::raise(Trouble trouble)
     Trouble none = Trouble::NONE;
     if (!_trouble.compare_exchange_strong(none, trouble))
         return;
-    _isFull = true;
+    _isOver = true;
     _notify();
     _tell([this] { _events.trouble(); });
 }
@@ -87,13 +87,12 @@ bool Recording::waitForDrain(std::chrono::milliseconds limit)
 
 void Recording::reachLimit(recorder_recording_limit_type_e type)
 {
-    if (!_isFull.exchange(true))
+    if (!_isOver.exchange(true))
         _tell([&] { _events.limit(type); });
 }
 
 void Recording::_measure(const int16_t* samples, size_t count)
 {
-    constexpr double FULL_SCALE = 32768;
     constexpr size_t BLOCK = 64;
     int peak = 0;
     for (size_t from = 0; from < count; from += BLOCK) {
@@ -112,7 +111,7 @@ void Recording::_measure(const int16_t* samples, size_t count)
 
 size_t Recording::onCaptured(const int16_t* samples, size_t count)
 {
-    if (_isHeld || _isFull)
+    if (_isHeld || _isOver)
         return 0;
     const uint64_t before = _samples;
     const bool isLast = _limits.samples > 0 && before + count >= _limits.samples;

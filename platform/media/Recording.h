@@ -43,7 +43,7 @@ public:
     [[nodiscard]] Trouble trouble() const { return _trouble; }
     [[nodiscard]] unsigned long long elapsedMs() const;
     [[nodiscard]] uint64_t samples() const { return _samples; }
-    [[nodiscard]] bool isCapturing() const { return !_isHeld && !_isFull; }
+    [[nodiscard]] bool isCapturing() const { return !_isHeld && !_isOver; }
     [[nodiscard]] RecordingFile& file() { return *_file; }
     // Decibels below full scale; starts anew.
     double takePeak();
@@ -81,7 +81,7 @@ private:
     GrowingLoudness _loudness; // of the streaming thread, until that has come to its end
     std::atomic<int> _peak{0};
     std::atomic<bool> _isHeld{false};
-    std::atomic<bool> _isFull{false};
+    std::atomic<bool> _isOver{false}; // takes no more sound: a limit or trouble
     std::atomic<bool> _isClosed{false};
     std::atomic<bool> _isDrained{false};
     std::atomic<Trouble> _trouble{Trouble::NONE};

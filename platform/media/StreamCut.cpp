@@ -22,13 +22,13 @@ namespace {
         const char* output;
     };
     constexpr std::array<Container, 7> CONTAINERS = {{
-        {"mov,mp4,m4a,3gp,3g2,mj2", "ipod"},
-        {"mp3", "mp3"},
-        {"ogg", "ogg"},
-        {"flac", "flac"},
-        {"wav", "wav"},
-        {"aac", "adts"},
-        {"matroska,webm", "matroska"},
+        {.input = "mov,mp4,m4a,3gp,3g2,mj2", .output = "ipod"},
+        {.input = "mp3", .output = "mp3"},
+        {.input = "ogg", .output = "ogg"},
+        {.input = "flac", .output = "flac"},
+        {.input = "wav", .output = "wav"},
+        {.input = "aac", .output = "adts"},
+        {.input = "matroska,webm", .output = "matroska"},
     }};
 
     // A file that is open already, so that it stays the same one whatever happens to its name.

@@ -14,7 +14,7 @@
 #include "MwPlayer.h"
 #include "MwRecorder.h"
 #include "MwSignalMgr.h"
-#include "WSignal.h"
+#include <panekit/WSignal.h>
 
 class MwAvrcp;
 class MwModel;

@@ -4,7 +4,7 @@
 
 #include <memory>
 
-#include "WSignal.h"
+#include <panekit/WSignal.h>
 
 class MwModel;
 class _MwPlayerImpl;

@@ -2,7 +2,7 @@
 
 #include <recorder.h>
 
-#include "WSignal.h"
+#include <panekit/WSignal.h>
 
 class MwModel;
 

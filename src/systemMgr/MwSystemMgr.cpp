@@ -23,7 +23,11 @@ struct ModelType {
     const char* name;
     int code;
 };
-constexpr std::array<ModelType, 3> MODEL_TYPES = {{{"QX-A110H", 1}, {"QX-A210H", 2}, {"QX-A210F", 3}}};
+constexpr std::array<ModelType, 3> MODEL_TYPES = {{
+    {.name = "QX-A110H", .code = 1},
+    {.name = "QX-A210H", .code = 2},
+    {.name = "QX-A210F", .code = 3},
+}};
 
 std::unique_ptr<MwSystemMgr>& instance()
 {

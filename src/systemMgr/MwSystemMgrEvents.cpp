@@ -36,21 +36,21 @@ struct MwSystemMgr::KeyWatch {
 
 const std::array<MwSystemMgr::KeyWatch, 8>& MwSystemMgr::_keyWatches()
 {
+#define WATCH(name, function)                                                                                          \
+    {                                                                                                                  \
+        .key = name, .callback = function, .failure = "vconf_notify_key_changed(" #name ") failed"                     \
+    }
     static const std::array<KeyWatch, 8> watches = {{
-        {VCONFKEY_SYSMAN_MMC_STATUS, _mmcStatusChangedCb,
-            "vconf_notify_key_changed(VCONFKEY_SYSMAN_MMC_STATUS) failed"},
-        {VCONFKEY_IDLE_LOCK_STATE, _lockscreenStateChangedCb,
-            "vconf_notify_key_changed(VCONFKEY_IDLE_LOCK_STATE) failed"},
-        {VCONFKEY_SYSMAN_POWER_OFF_STATUS, _powerOffStateChangedCb,
-            "vconf_notify_key_changed(VCONFKEY_SYSMAN_POWER_OFF_STATUS) failed"},
-        {VCONFKEY_SETAPPL_PSMODE, _upsModeChangedCb, "vconf_notify_key_changed(VCONFKEY_SETAPPL_PSMODE) failed"},
-        {VCONFKEY_SYSMAN_EARJACK, _earjackStateChangedCb, "vconf_notify_key_changed(VCONFKEY_SYSMAN_EARJACK) failed"},
-        {VCONFKEY_CALL_RECORDING_REJECT, _callRejectStateChangedCb,
-            "vconf_notify_key_changed(VCONFKEY_CALL_RECORDING_REJECT) failed"},
-        {VCONFKEY_MEWLO_MICROPHONE, _microphoneChangedCb, "vconf_notify_key_changed(VCONFKEY_MEWLO_MICROPHONE) failed"},
-        {VCONFKEY_PRIVATE_STORAGE_OPEN, _privateStorageChangedCb,
-            "vconf_notify_key_changed(VCONFKEY_PRIVATE_STORAGE_OPEN) failed"},
+        WATCH(VCONFKEY_SYSMAN_MMC_STATUS, _mmcStatusChangedCb),
+        WATCH(VCONFKEY_IDLE_LOCK_STATE, _lockscreenStateChangedCb),
+        WATCH(VCONFKEY_SYSMAN_POWER_OFF_STATUS, _powerOffStateChangedCb),
+        WATCH(VCONFKEY_SETAPPL_PSMODE, _upsModeChangedCb),
+        WATCH(VCONFKEY_SYSMAN_EARJACK, _earjackStateChangedCb),
+        WATCH(VCONFKEY_CALL_RECORDING_REJECT, _callRejectStateChangedCb),
+        WATCH(VCONFKEY_MEWLO_MICROPHONE, _microphoneChangedCb),
+        WATCH(VCONFKEY_PRIVATE_STORAGE_OPEN, _privateStorageChangedCb),
     }};
+#undef WATCH
     return watches;
 }
 

@@ -1,4 +1,4 @@
-#include "WSignal.h"
+#include <panekit/WSignal.h>
 
 #include <Ecore_Evas.h>
 #include <gtest/gtest.h>

@@ -195,11 +195,11 @@ void MwCircleRecordingEffect::_getImageFixelsCb(void* data, Evas_Object* image)
 void MwCircleRecordingEffect::_draw()
 {
     static constexpr std::array<Layer, 5> LAYERS = {{
-        {198, 0.6, 1.0, 2},
-        {234, 1.0, 1.0, 3},
-        {306, 0.15, 0.15, 5},
-        {342, 0.15, 0.15, 1},
-        {270, 0.9, 0.5, 2},
+        {.startAngle = 198, .idleAlpha = 0.6, .alpha = 1.0, .width = 2},
+        {.startAngle = 234, .idleAlpha = 1.0, .alpha = 1.0, .width = 3},
+        {.startAngle = 306, .idleAlpha = 0.15, .alpha = 0.15, .width = 5},
+        {.startAngle = 342, .idleAlpha = 0.15, .alpha = 0.15, .width = 1},
+        {.startAngle = 270, .idleAlpha = 0.9, .alpha = 0.5, .width = 2},
     }};
     cairo_set_source_rgba(_cairo, 0, 0, 0, 0);
     cairo_set_operator(_cairo, CAIRO_OPERATOR_SOURCE);

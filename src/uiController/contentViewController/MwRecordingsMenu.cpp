@@ -46,8 +46,14 @@ int rowsOfKey(const std::string& key, int page)
         const char* key;
         int rows;
     };
-    const std::array<Move, 6> moves
-        = {{{"Down", 1}, {"Up", -1}, {"Next", page}, {"Prior", -page}, {"End", ALL_ROWS}, {"Home", -ALL_ROWS}}};
+    const std::array<Move, 6> moves = {{
+        {.key = "Down", .rows = 1},
+        {.key = "Up", .rows = -1},
+        {.key = "Next", .rows = page},
+        {.key = "Prior", .rows = -page},
+        {.key = "End", .rows = ALL_ROWS},
+        {.key = "Home", .rows = -ALL_ROWS},
+    }};
     const auto found = std::find_if(moves.begin(), moves.end(), [&](const Move& move) { return key == move.key; });
     return found != moves.end() ? found->rows : 0;
 }

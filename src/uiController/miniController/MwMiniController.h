@@ -1,6 +1,6 @@
 #pragma once
 
-#include <WSignal.h>
+#include <panekit/WSignal.h>
 
 #include <string>
 

@@ -11,7 +11,7 @@
 #include "MwAppController.h"
 #include "MwLog.h"
 #include "MwSignalMgr.h"
-#include "WSignal.h"
+#include <panekit/WSignal.h>
 
 class MwModel;
 

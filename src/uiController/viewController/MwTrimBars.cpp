@@ -34,9 +34,21 @@ struct BarLook {
     const char* name;
 };
 constexpr std::array<BarLook, 3> LOOKS = {{
-    {"start_bar", "start_place", "start_slider", SIDE_BAR_GROUP, "IDS_MW_BODY_TRIM_START"},
-    {"end_bar", "end_place", "end_slider", SIDE_BAR_GROUP, "IDS_MW_BODY_TRIM_END"},
-    {"play_bar", "play_place", "play_slider", PLAY_BAR_GROUP, "IDS_MW_BODY_POSITION"},
+    {.part = "start_bar",
+        .place = "start_place",
+        .sliderPart = "start_slider",
+        .group = SIDE_BAR_GROUP,
+        .name = "IDS_MW_BODY_TRIM_START"},
+    {.part = "end_bar",
+        .place = "end_place",
+        .sliderPart = "end_slider",
+        .group = SIDE_BAR_GROUP,
+        .name = "IDS_MW_BODY_TRIM_END"},
+    {.part = "play_bar",
+        .place = "play_place",
+        .sliderPart = "play_slider",
+        .group = PLAY_BAR_GROUP,
+        .name = "IDS_MW_BODY_POSITION"},
 }};
 
 int scaled(int units) { return static_cast<int>(units * elm_config_scale_get() / elm_app_base_scale_get()); }

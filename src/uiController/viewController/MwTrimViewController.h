@@ -11,7 +11,7 @@
 #include "MwAppController.h"
 #include "MwSignalMgr.h"
 #include "MwTrimRange.h"
-#include "WSignal.h"
+#include <panekit/WSignal.h>
 
 class MwModel;
 class MwTrimBars;

@@ -40,13 +40,13 @@ struct Stroke {
     const char* color;
 };
 constexpr std::array<Stroke, MOST_STROKES> STROKES = {{
-    {0.0, ""},
-    {0.7, "AO007"},
-    {0.8, "AO006"},
-    {1.0, "AO005"},
-    {1.0, "AO005"},
-    {0.8, "AO006"},
-    {0.7, "AO007"},
+    {.factor = 0.0, .color = ""},
+    {.factor = 0.7, .color = "AO007"},
+    {.factor = 0.8, .color = "AO006"},
+    {.factor = 1.0, .color = "AO005"},
+    {.factor = 1.0, .color = "AO005"},
+    {.factor = 0.8, .color = "AO006"},
+    {.factor = 0.7, .color = "AO007"},
 }};
 
 // A little unevenness that looks alive, the same each time: 0.91 to 1.

@@ -1,6 +1,8 @@
 #pragma once
 
-#include "WSignal.h"
+#include <panekit/WSignal.h>
+
+#include <utility>
 
 // The signals that concern the whole application. One instance for the process, made on first use. Main loop only.
 class MwSignalMgr {
@@ -41,3 +43,11 @@ private:
     panekit::WSignal<void(SystemInfo)> _systemInfo;
     panekit::WSignal<void()> _playViewClosed;
 };
+
+// Removes a listener by the identifier its owner keeps, once; 0 is no listener.
+template <typename Signal>
+void mwForget(Signal& signal, unsigned int& listener)
+{
+    if (const unsigned int id = std::exchange(listener, 0); id != 0)
+        signal.removeListener(id);
+}

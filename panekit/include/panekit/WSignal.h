@@ -136,11 +136,3 @@ private:
 };
 
 }
-
-// Removes a listener by the identifier its owner keeps, once; 0 is no listener.
-template <typename Signal>
-void mwForget(Signal& signal, unsigned int& listener)
-{
-    if (const unsigned int id = std::exchange(listener, 0); id != 0)
-        signal.removeListener(id);
-}
