@@ -2,7 +2,7 @@
 #include "bluetooth.h"
 
 #include "desktop/RemoteControl.h"
-#include "state/MainLoop.h"
+#include <MainLoop.h>
 
 #include <atomic>
 

@@ -5,9 +5,9 @@
 #include "launch/Toolkit.h"
 #include "preference.h"
 #include "state/Keys.h"
-#include "state/MainLoop.h"
 #include "state/Trees.h"
 #include "vconf.h"
+#include <MainLoop.h>
 
 #include <Ecore_Input.h>
 #include <Elementary.h>

@@ -3,8 +3,8 @@
 #include "app.h"
 #include "launch/Toolkit.h"
 #include "state/Keys.h"
-#include "state/MainLoop.h"
 #include "state/Trees.h"
+#include <MainLoop.h>
 
 #include <atomic>
 #include <utility>

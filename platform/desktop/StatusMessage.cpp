@@ -4,7 +4,7 @@
 #include "host/Notifier.h"
 #include "launch/AppProcess.h"
 #include "state/Log.h"
-#include "state/MainLoop.h"
+#include <MainLoop.h>
 
 #include <mutex>
 #include <optional>

@@ -3,8 +3,8 @@
 #include "host/Inhibitor.h"
 #include "state/Keys.h"
 #include "state/Log.h"
-#include "state/MainLoop.h"
 #include "state/Trees.h"
+#include <MainLoop.h>
 
 #include <Ecore.h>
 

@@ -1,7 +1,5 @@
 #include "MountWatch.h"
 
-#include <Ecore.h>
-
 #include <cerrno>
 #include <cstdlib>
 #include <fstream>
@@ -44,11 +42,6 @@ namespace {
 
     bool isReadOnly(const std::string& options) { return (options + ",").starts_with("ro,"); }
 
-    struct Delivery {
-        std::weak_ptr<bool> alive;
-        std::function<void()> report;
-    };
-
 }
 
 MountWatch::MountWatch(KeySink sink, std::vector<std::string> places)
@@ -85,40 +78,31 @@ void MountWatch::start()
             ::close(table);
         return;
     }
-    _alive = std::make_shared<bool>(true);
+    _mailbox = std::make_unique<platform::MainLoopMailbox>();
     _report();
-    _thread
-        = std::thread([this, table, end = _end[0], alive = std::weak_ptr<bool>(_alive)] { _poll(table, end, alive); });
+    _thread = std::thread([this, table, end = _end[0]] { _poll(table, end, *_mailbox); });
 }
 
 void MountWatch::stop()
 {
-    _alive.reset();
     if (!_thread.joinable())
         return;
     ::close(std::exchange(_end[1], -1));
     _thread.join();
     ::close(std::exchange(_end[0], -1));
+    _mailbox.reset();
 }
 
-void MountWatch::_poll(int table, int end, const std::weak_ptr<bool>& alive) const
+void MountWatch::_poll(int table, int end, platform::MainLoopMailbox& mailbox)
 {
     pollfd waits[] = {{table, POLLPRI, 0}, {end, POLLIN, 0}};
-    auto* self = const_cast<MountWatch*>(this); // only touched on the main loop, while alive
     while (waits[1].revents == 0) {
         const int ready = ::poll(waits, 2, -1);
         if (ready < 0 && errno != EINTR)
             break;
         if (ready < 0 || waits[1].revents != 0)
             continue;
-        auto* delivery = new Delivery{alive, [self] { self->_report(); }};
-        ecore_main_loop_thread_safe_call_async(
-            [](void* data) {
-                const std::unique_ptr<Delivery> owned(static_cast<Delivery*>(data));
-                if (!owned->alive.expired())
-                    owned->report();
-            },
-            delivery);
+        mailbox.post([this] { _report(); });
     }
     ::close(table);
 }

@@ -4,6 +4,8 @@
 
 #include "KeySink.h"
 
+#include <MainLoopMailbox.h>
+
 #include <memory>
 #include <optional>
 #include <string>
@@ -26,14 +28,14 @@ public:
     static std::optional<std::string> findCard(const std::string& table, const std::vector<std::string>& places);
 
 private:
-    void _poll(int table, int end, const std::weak_ptr<bool>& alive) const; // the thread
+    void _poll(int table, int end, platform::MainLoopMailbox& mailbox); // the thread
     void _report();
 
     KeySink _sink;
     std::vector<std::string> _places;
     std::thread _thread;
     int _end[2] = {-1, -1}; // pipe; closing it ends the thread
-    std::shared_ptr<bool> _alive; // the main loop only; the thread holds a weak one of its own
+    std::unique_ptr<platform::MainLoopMailbox> _mailbox; // from start to stop
 };
 
 }

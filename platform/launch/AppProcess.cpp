@@ -7,9 +7,9 @@
 #include "launch/Toolkit.h"
 #include "state/Keys.h"
 #include "state/Log.h"
-#include "state/MainLoop.h"
 #include "state/Trees.h"
 #include "vconf.h"
+#include <MainLoop.h>
 
 #include <Ecore.h>
 

@@ -3,8 +3,8 @@
 #include "launch/Identity.h"
 #include "launch/Spawn.h"
 #include "state/Log.h"
-#include "state/MainLoop.h"
 #include "state/Trees.h"
+#include <MainLoop.h>
 
 #include <Ecore.h>
 

@@ -1,7 +1,7 @@
 #include "launch/AppControl.h"
 
 #include "state/Log.h"
-#include "state/MainLoop.h"
+#include <MainLoop.h>
 
 #include <utility>
 

@@ -4,7 +4,7 @@
 #include "launch/Identity.h"
 #include "launch/LaunchDoor.h"
 #include "message_port.h"
-#include "state/MainLoop.h"
+#include <MainLoop.h>
 
 #include <map>
 

@@ -1,7 +1,7 @@
 #pragma once
 
-#include "media/MainLoopMailbox.h"
 #include "media/Recording.h"
+#include <MainLoopMailbox.h>
 
 #include <recorder.h>
 
@@ -103,7 +103,7 @@ private:
     void _noteSound(bool hasCall);
 
     const std::shared_ptr<RecorderCallbacks> _callbacks = std::make_shared<RecorderCallbacks>();
-    MainLoopMailbox _mailbox;
+    platform::MainLoopMailbox _mailbox;
     std::atomic<recorder_state_e> _state{RECORDER_STATE_CREATED};
     std::atomic<bool> _isStatusPosted{false}; // one status under way at a time, however fast sound arrives
     std::atomic<bool> _isAnnounced{false}; // the status with elapsed 0 was sent

@@ -3,10 +3,10 @@
 #include "host/PulseWatch.h"
 #include "media/FileDuration.h"
 #include "media/LiveCall.h"
-#include "media/MainLoopMailbox.h"
 #include "media/PlayerPipeline.h"
 #include "state/Keys.h"
 #include "state/Trees.h"
+#include <MainLoopMailbox.h>
 
 #include <unistd.h>
 
@@ -97,7 +97,7 @@ private:
     bool _isInterrupted = false; // paused for another stream
     int _soundListener = 0;
     platform::KeyTree::WatchId _callWatch = 0;
-    media::MainLoopMailbox _mailbox;
+    platform::MainLoopMailbox _mailbox;
 };
 
 player_s::player_s()

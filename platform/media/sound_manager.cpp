@@ -2,7 +2,7 @@
 
 #include "host/PulseWatch.h"
 #include "media/LiveCall.h"
-#include "media/MainLoopMailbox.h"
+#include <MainLoopMailbox.h>
 
 #include <memory>
 #include <mutex>
@@ -45,7 +45,7 @@ public:
 private:
     const sound_manager_active_device_changed_cb _callback;
     void* const _userData;
-    media::MainLoopMailbox _mailbox;
+    platform::MainLoopMailbox _mailbox;
     int _listener = 0;
 };
 

@@ -96,7 +96,6 @@ bool MwAppController::initialize(MwModel* model, panekit::WWindowController* win
         MW_LOGE("_createPlayer failed");
         return false;
     }
-    _mainLoopPipe.open();
     _connectRemote();
     MW_LOGW("END");
     return true;
@@ -138,7 +137,7 @@ void MwAppController::deinitialize()
     }
     _playerUpdatedSignal.removeAll();
     _recorderUpdatedSignal.removeAll();
-    _mainLoopPipe.close(); // results still on their way are freed; nobody waits for them any more
+    _mailbox.close(); // nobody waits for what is still on its way
     MW_LOGW("END");
 }
 
@@ -164,13 +163,10 @@ void MwAppController::_executeAsyncRequest(std::unique_ptr<AsyncRequest> request
         MW_LOGE("command[%d] failed", static_cast<int>(request->command));
         request->result = FAIL;
     }
-    _callSafetyMainThread(
-        [](void* data) {
-            const std::unique_ptr<AsyncRequest> done(static_cast<AsyncRequest*>(data));
-            if (done->controller->_asyncCmdControl)
-                done->callback(done->command, done->result, done->userData);
-        },
-        request.release());
+    _callSafetyMainThread([this, done = std::shared_ptr<AsyncRequest>(std::move(request))] {
+        if (_asyncCmdControl)
+            done->callback(done->command, done->result, done->userData);
+    });
 }
 
 bool MwAppController::dispatchCommandAsync(Command command, AsyncCallback callback, void* userData)
@@ -181,11 +177,12 @@ bool MwAppController::dispatchCommandAsync(Command command, AsyncCallback callba
         return false;
     }
     _asyncCmdControl->queue(
-        std::make_unique<AsyncRequest>(AsyncRequest{this, command, SUCCESS, std::move(callback), userData, false}));
+        std::make_unique<AsyncRequest>(AsyncRequest{command, SUCCESS, std::move(callback), userData, false}));
     return true;
 }
 
-void MwAppController::_callSafetyMainThread(Closure closure, void* data) { _mainLoopPipe.call(closure, data); }
+// At once on the main loop.
+void MwAppController::_callSafetyMainThread(std::function<void()> closure) { _mailbox.call(std::move(closure)); }
 
 bool MwAppController::_createRecorder()
 {
@@ -297,12 +294,12 @@ void MwAppController::_createErrorPopup(const char* text)
 
 void MwAppController::_emitPlayerUpdatedSignal()
 {
-    _callSafetyMainThread([](void* data) { static_cast<MwAppController*>(data)->_playerUpdatedSignal.emit(); }, this);
+    _callSafetyMainThread([this] { _playerUpdatedSignal.emit(); });
 }
 
 void MwAppController::_emitRecorderUpdatedSignal()
 {
-    _callSafetyMainThread([](void* data) { static_cast<MwAppController*>(data)->_recorderUpdatedSignal.emit(); }, this);
+    _callSafetyMainThread([this] { _recorderUpdatedSignal.emit(); });
 }
 
 bool MwAppController::_sendMessagePort() { return _model != nullptr && sendToIndicator(indicatorValue(*_model)); }

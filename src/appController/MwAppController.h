@@ -1,5 +1,6 @@
 #pragma once
 
+#include <MainLoopMailbox.h>
 #include <media_key.h>
 #include <panekit/WTimer.h>
 #include <player.h>
@@ -10,7 +11,6 @@
 #include <mutex>
 #include <string>
 
-#include "MwMainLoopPipe.h"
 #include "MwPlayer.h"
 #include "MwRecorder.h"
 #include "MwSignalMgr.h"
@@ -82,12 +82,11 @@ public:
 private:
     class AsyncCmdControl;
     struct AsyncRequest;
-    using Closure = MwMainLoopPipe::Closure;
 
     void _initAsyncCmdControl();
     void _deinitAsyncCmdControl();
     void _executeAsyncRequest(std::unique_ptr<AsyncRequest> request);
-    void _callSafetyMainThread(Closure closure, void* data);
+    void _callSafetyMainThread(std::function<void()> closure);
 
     bool _createRecorder();
     bool _destroyRecorder();
@@ -205,7 +204,7 @@ private:
     panekit::WTimer::Weak _fastForwardTimer;
     panekit::WPopupController* _errorPopup = nullptr;
     unsigned int _seekStep = 0; // milliseconds
-    MwMainLoopPipe _mainLoopPipe;
+    platform::MainLoopMailbox _mailbox;
     std::function<void()> _recordingsOpener;
     // Held for the whole execution of a command, by whichever thread executes it.
     mutable std::recursive_mutex _commandMutex;

@@ -20,22 +20,18 @@ Ecore_Timer* ecoreTimer(const panekit::WTimer::Weak& timer)
 
 void MwAppController::_grabMediaKey()
 {
-    _callSafetyMainThread(
-        [](void* data) {
-            if (const int result = media_key_reserve(_mediaKeyStatusChanged, data); result != 0)
-                MW_LOGE("media_key_reserve failed [%d]", result);
-        },
-        this);
+    _callSafetyMainThread([this] {
+        if (const int result = media_key_reserve(_mediaKeyStatusChanged, this); result != 0)
+            MW_LOGE("media_key_reserve failed [%d]", result);
+    });
 }
 
 void MwAppController::_ungrabMediaKey()
 {
-    _callSafetyMainThread(
-        [](void*) {
-            if (const int result = media_key_release(); result != 0)
-                MW_LOGE("media_key_release failed [%d]", result);
-        },
-        this);
+    _callSafetyMainThread([] {
+        if (const int result = media_key_release(); result != 0)
+            MW_LOGE("media_key_release failed [%d]", result);
+    });
 }
 
 void MwAppController::_mediaKeyStatusChanged(media_key_e key, media_key_event_e status, void* userData)

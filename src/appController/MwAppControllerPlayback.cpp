@@ -163,7 +163,7 @@ void MwAppController::_closePlayView()
     if (!_model->isPlayViewShown())
         return;
     _model->setPlayViewShown(false);
-    _callSafetyMainThread([](void*) { MwSignalMgr::getInstance()->getPlayViewClosedSignal().emit(); }, nullptr);
+    _callSafetyMainThread([] { MwSignalMgr::getInstance()->getPlayViewClosedSignal().emit(); });
 }
 
 bool MwAppController::_executePlayPrevious()
@@ -253,7 +253,6 @@ void MwAppController::_playerErrorOccurred(MwPlayer::PlayerErrorType type)
     MW_LOGI("BEGIN - error type : [%d]", type);
     _sendMessagePort();
     _ungrabMediaKey();
-    _callSafetyMainThread(
-        [](void* data) { static_cast<MwAppController*>(data)->_createErrorPopup("Interal Error by player!"); }, this);
+    _callSafetyMainThread([this] { _createErrorPopup("Interal Error by player!"); });
     MwSystemMgr::getInstance()->releaseLockCPU();
 }

@@ -216,13 +216,10 @@ void MwAppController::_releaseTemporaryFile()
 
 void MwAppController::_destroyRecorderHandle()
 {
-    _callSafetyMainThread(
-        [](void* data) {
-            auto* self = static_cast<MwAppController*>(data);
-            if (self->_recorder && !self->_recorder->destroyHandle())
-                MW_LOGE("recorder destroy handle failed");
-        },
-        this);
+    _callSafetyMainThread([this] {
+        if (_recorder && !_recorder->destroyHandle())
+            MW_LOGE("recorder destroy handle failed");
+    });
 }
 
 bool MwAppController::_stopRecording(bool interrupted)

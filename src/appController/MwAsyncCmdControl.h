@@ -8,7 +8,6 @@
 #include "MwAppController.h"
 
 struct MwAppController::AsyncRequest {
-    MwAppController* controller;
     Command command;
     Result result;
     AsyncCallback callback;

@@ -16,8 +16,6 @@
 namespace {
 
 constexpr double START_DELAY = 0.3; // seconds
-constexpr auto UPDATE = "update";
-constexpr auto FINISH = "finish";
 
 uint64_t sizeOfAll(MwFileOperator::Type type, const std::vector<MwFileOperator::Source>& sources)
 {
@@ -43,7 +41,6 @@ MwFileOperator::MwFileOperator(Type type, std::vector<Source> sources, Callbacks
     , _sources(std::move(sources))
     , _totalBytes(sizeOfAll(type, _sources))
     , _callbacks(std::move(callbacks))
-    , _pipe(ecore_pipe_add(_pipeCb, this))
 {
 }
 
@@ -52,8 +49,6 @@ MwFileOperator::~MwFileOperator()
     requestCancel();
     panekit::WTimer::destroy(_startTimer);
     _join();
-    if (_pipe != nullptr)
-        ecore_pipe_del(_pipe);
 }
 
 void MwFileOperator::start()
@@ -75,7 +70,7 @@ void MwFileOperator::_begin()
 
 void MwFileOperator::requestCancel()
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
     _cancelRequested = true;
     _answered.notify_all();
 }
@@ -96,7 +91,7 @@ void MwFileOperator::_join()
 
 void MwFileOperator::answer(MwClashAction action)
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
     _action = action;
     _waiting = false;
     _answered.notify_all();
@@ -104,7 +99,7 @@ void MwFileOperator::answer(MwClashAction action)
 
 void MwFileOperator::setApplyToAll(bool on)
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
     _applyToAll = on;
 }
 
@@ -115,34 +110,32 @@ MwFileOperator::Progress MwFileOperator::progress() const
 
 std::string MwFileOperator::currentPath() const
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
     return _currentPath;
 }
 
-void MwFileOperator::_pipeCb(void* data, void* buffer, unsigned int size)
+// A callback may delete the operator, and the function that makes it with it: nothing follows.
+void MwFileOperator::_onUpdate()
 {
-    auto* self = static_cast<MwFileOperator*>(data);
-    // A callback may delete the operator, and this function with it: nothing follows.
-    self->_onMoveFilePipe(buffer != nullptr ? std::string(static_cast<char*>(buffer), size) : std::string());
+    _updateOnItsWay = false;
+    if (const auto tell = _callbacks.onUpdate; tell && !_finished)
+        tell();
 }
 
-void MwFileOperator::_onMoveFilePipe(const std::string& message)
+void MwFileOperator::_onClash(const std::string& path)
+{
+    if (const auto ask = _callbacks.onClash; ask && !_finished && !_cancelRequested)
+        ask(path);
+}
+
+void MwFileOperator::_onFinish()
 {
     if (_finished)
         return;
-    const Callbacks callbacks = _callbacks;
-    if (message == UPDATE) {
-        _updateOnItsWay = false;
-        if (callbacks.onUpdate)
-            callbacks.onUpdate();
-    } else if (message == FINISH || message.empty()) {
-        _join(); // its last words
-        _finished = true;
-        if (callbacks.onFinished)
-            callbacks.onFinished();
-    } else if (callbacks.onClash && !_cancelRequested) {
-        callbacks.onClash(message);
-    }
+    _join();
+    _finished = true;
+    if (const auto tell = _callbacks.onFinished; tell)
+        tell();
 }
 
 void MwFileOperator::_run()
@@ -169,7 +162,7 @@ void MwFileOperator::_deleteFiles()
     _doneFiles = _donePaths.size();
     _withoutTrash = deleter.withoutTrash();
     _failed = !_cancelRequested && _donePaths.size() + _withoutTrash.size() < _sources.size();
-    _tell({});
+    _tellFinish();
 }
 
 void MwFileOperator::_moveFiles()
@@ -194,7 +187,7 @@ void MwFileOperator::_moveFiles()
         ++_doneFiles;
         _tellUpdate();
     }
-    _tell(FINISH);
+    _tellFinish();
 }
 
 void MwFileOperator::_renameFile()
@@ -203,13 +196,13 @@ void MwFileOperator::_renameFile()
     _renamed = MwFileRenamer::rename(path, newPath);
     if (_renamed == MwFileRenamer::Outcome::DONE)
         _moved.push_back({path, newPath});
-    _tell(FINISH);
+    _tellFinish();
 }
 
 bool MwFileOperator::_moveFile(MwFileMover& mover, const std::string& path)
 {
     {
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         _currentPath = path;
     }
     std::string destination;
@@ -221,14 +214,12 @@ bool MwFileOperator::_moveFile(MwFileMover& mover, const std::string& path)
 
 MwClashAction MwFileOperator::_ask(const std::string& path)
 {
-    std::unique_lock lock(_mutex);
+    platform::Lock lock(_mutex);
     if (_applyToAll && _action != MwClashAction::NONE)
         return _action;
     _waiting = true;
-    lock.unlock();
-    _tell(path);
-    lock.lock();
-    _answered.wait(lock, [this] { return !_waiting || _cancelRequested; });
+    _mailbox.post([this, path] { _onClash(path); });
+    _answered.wait(lock, [this]() REQUIRES(_mutex) { return !_waiting || _cancelRequested; });
     return _cancelRequested ? MwClashAction::CANCEL : _action;
 }
 
@@ -241,11 +232,10 @@ void MwFileOperator::_report(uint64_t bytes)
 void MwFileOperator::_tellUpdate()
 {
     if (!_updateOnItsWay.exchange(true))
-        _tell(UPDATE);
+        _mailbox.post([this] { _onUpdate(); });
 }
 
-void MwFileOperator::_tell(const std::string& message)
+void MwFileOperator::_tellFinish()
 {
-    if (ecore_pipe_write(_pipe, message.data(), static_cast<unsigned int>(message.size())) == EINA_FALSE)
-        MW_LOGE("ecore_pipe_write failed!!!");
+    _mailbox.post([this] { _onFinish(); });
 }

@@ -1,20 +1,19 @@
 #pragma once
 
+#include <MainLoopMailbox.h>
+#include <Mutex.h>
 #include <panekit/WTimer.h>
 
 #include <atomic>
 #include <condition_variable>
 #include <cstdint>
 #include <functional>
-#include <mutex>
 #include <string>
 #include <thread>
 #include <vector>
 
 #include "MwFileMover.h"
 #include "MwFileRenamer.h"
-
-struct _Ecore_Pipe;
 
 // Deletes, moves or renames recordings on a thread of its own and tells the main loop how it gets on. Owned by the
 // screen that started it, which may delete it at any time, also in a callback: what runs is then cancelled and waited
@@ -84,8 +83,9 @@ public:
     [[nodiscard]] MwFileRenamer::Outcome renameOutcome() const { return _renamed; }
 
 private:
-    static void _pipeCb(void* data, void* buffer, unsigned int size);
-    void _onMoveFilePipe(const std::string& message);
+    void _onUpdate();
+    void _onClash(const std::string& path);
+    void _onFinish();
     void _begin();
     void _join();
 
@@ -98,28 +98,28 @@ private:
     MwClashAction _ask(const std::string& path);
     void _report(uint64_t bytes);
     void _tellUpdate();
-    void _tell(const std::string& message);
+    void _tellFinish();
 
     const Type _type;
     const std::vector<Source> _sources;
     const uint64_t _totalBytes;
     Callbacks _callbacks;
     panekit::WTimer::Weak _startTimer;
-    _Ecore_Pipe* _pipe = nullptr;
+    platform::MainLoopMailbox _mailbox;
     std::thread _worker;
     bool _begun = false;
     bool _finished = false;
 
     std::atomic<bool> _cancelRequested = false;
-    std::atomic<bool> _updateOnItsWay = false; // one at a time, so that the pipe never fills
+    std::atomic<bool> _updateOnItsWay = false; // one at a time
     std::atomic<uint64_t> _doneBytes = 0;
     std::atomic<size_t> _doneFiles = 0;
-    mutable std::mutex _mutex; // guards the next four
-    std::condition_variable _answered;
-    std::string _currentPath;
-    MwClashAction _action = MwClashAction::NONE;
-    bool _waiting = false;
-    bool _applyToAll = false;
+    mutable platform::Mutex _mutex;
+    std::condition_variable_any _answered;
+    std::string _currentPath GUARDED_BY(_mutex);
+    MwClashAction _action GUARDED_BY(_mutex) = MwClashAction::NONE;
+    bool _waiting GUARDED_BY(_mutex) = false;
+    bool _applyToAll GUARDED_BY(_mutex) = false;
 
     std::vector<std::string> _donePaths; // the worker's until it has ended
     std::vector<Moved> _moved;

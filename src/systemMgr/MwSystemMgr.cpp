@@ -64,13 +64,12 @@ bool MwSystemMgr::initialize(MwModel* model)
         return false;
     }
     _model = model;
-    _mainLoopPipe.open();
     return true;
 }
 
 void MwSystemMgr::deinitialize()
 {
-    _mainLoopPipe.close();
+    _mailbox.close();
     _model = nullptr;
 }
 
@@ -296,4 +295,4 @@ bool MwSystemMgr::releaseLockDisplayDim()
     return result == 0;
 }
 
-void MwSystemMgr::_callSafetyMainThread(Closure closure, void* data) { _mainLoopPipe.call(closure, data); }
+void MwSystemMgr::_callSafetyMainThread(std::function<void()> closure) { _mailbox.call(std::move(closure)); }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <MainLoopMailbox.h>
 #include <callmgr.h>
 #include <device.h>
 #include <media_content.h>
@@ -9,8 +10,7 @@
 #include <vconf.h>
 
 #include <array>
-
-#include "MwMainLoopPipe.h"
+#include <functional>
 
 class MwModel;
 
@@ -19,8 +19,6 @@ class MwModel;
 // and locks from any thread; everything else on the main loop.
 class MwSystemMgr {
 public:
-    using Closure = MwMainLoopPipe::Closure;
-
     static MwSystemMgr* getInstance();
     static void destroyInstance();
 
@@ -55,8 +53,8 @@ public:
     bool requestLockDisplayDim();
     bool releaseLockDisplayDim();
 
-    // Runs closure(data) on the main loop: at once when already there.
-    void _callSafetyMainThread(Closure closure, void* data);
+    // Runs the closure on the main loop: at once when already there.
+    void _callSafetyMainThread(std::function<void()> closure);
 
 private:
     struct KeyWatch;
@@ -83,5 +81,5 @@ private:
     MwModel* _model = nullptr;
     panekit::WTimer::Weak _mediaDBUpdateTimer;
     int _modelType = 0;
-    MwMainLoopPipe _mainLoopPipe;
+    platform::MainLoopMailbox _mailbox;
 };

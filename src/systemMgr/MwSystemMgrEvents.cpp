@@ -200,7 +200,7 @@ void MwSystemMgr::_soundActiveDeviceChangedCb(sound_device_in_e inputDevice, sou
     if (inputDevice != SOUND_DEVICE_IN_WIRED_ACCESSORY)
         return;
     MW_LOGI("earjact is inserted");
-    self->_callSafetyMainThread([](void*) { emitSystemInfo(MwSignalMgr::EARJACK_INSERTED); }, nullptr);
+    self->_callSafetyMainThread([] { emitSystemInfo(MwSignalMgr::EARJACK_INSERTED); });
 }
 
 void MwSystemMgr::_powerStateChangedCb(device_callback_e, void* value, void* userData)

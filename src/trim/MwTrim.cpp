@@ -1,6 +1,5 @@
 #include "MwTrim.h"
 
-#include <Ecore.h>
 #include <video_edit.h>
 
 #include <initializer_list>
@@ -14,11 +13,6 @@
 namespace {
 
 constexpr int MS_PER_SECOND = 1000;
-
-struct Event {
-    unsigned int number;
-    MwTrim::eventType type;
-};
 
 MwTrim::Failure failureOf(int error)
 {
@@ -40,12 +34,7 @@ void logBookmarkFailure(const char* call, int code) { MW_LOGE("%s failed : [%d]!
 
 std::atomic<MwTrim*> MwTrim::_pInstance = nullptr;
 
-MwTrim::MwTrim()
-{
-    static unsigned int made = 0;
-    _number = ++made;
-    _pInstance = this;
-}
+MwTrim::MwTrim() { _pInstance = this; }
 
 MwTrim::~MwTrim()
 {
@@ -88,7 +77,7 @@ int MwTrim::getProgress()
 
 void MwTrim::_queue(std::initializer_list<Command> commands)
 {
-    const std::lock_guard lock(_queueLock);
+    const platform::Lock lock(_queueLock);
     _commands.insert(_commands.end(), commands.begin(), commands.end());
     _queueSignal.notify_one();
 }
@@ -100,9 +89,9 @@ void MwTrim::_runThread()
 
 void MwTrim::_work()
 {
-    std::unique_lock lock(_queueLock);
+    platform::Lock lock(_queueLock);
     for (;;) {
-        _queueSignal.wait(lock, [this] { return !_commands.empty(); });
+        _queueSignal.wait(lock, [this]() REQUIRES(_queueLock) { return !_commands.empty(); });
         while (!_commands.empty()) {
             const int command = _commands.front();
             _commands.pop_front();
@@ -290,18 +279,5 @@ void MwTrim::_end(eventType event, Failure failure)
     _failure = failure;
     if (event == TRIM_EVENT_FAILED)
         _store.reset();
-    ecore_main_loop_thread_safe_call_async(_eventCb, new Event{_number, event});
-}
-
-void MwTrim::_eventCb(void* data)
-{
-    MW_LOGI("BEGIN");
-    const std::unique_ptr<Event> event(static_cast<Event*>(data));
-    MwTrim* self = _pInstance;
-    if (self == nullptr) {
-        MW_LOGE("_pInstance is nullptr");
-        return;
-    }
-    if (self->_number == event->number)
-        self->trimSignal.emit(event->type);
+    _mailbox.post([this, event] { trimSignal.emit(event); });
 }

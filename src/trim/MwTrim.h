@@ -1,12 +1,13 @@
 #pragma once
 
+#include <MainLoopMailbox.h>
+#include <Mutex.h>
 #include <panekit/WSignal.h>
 
 #include <atomic>
 #include <condition_variable>
 #include <deque>
 #include <memory>
-#include <mutex>
 #include <string>
 #include <thread>
 #include <vector>
@@ -65,7 +66,6 @@ private:
 
     static void _errorCb(int error);
     static void _stateChangedCb(int state);
-    static void _eventCb(void* data);
 
     static std::atomic<MwTrim*> _pInstance;
 
@@ -75,7 +75,6 @@ private:
     int _start = 0;
     int _finish = 0;
     int _duration = 0;
-    unsigned int _number = 0; // tells this object from those before it
 
     std::unique_ptr<MwTrimStore> _store; // of the worker, then of the engine's thread
     std::atomic<Failure> _failure = Failure::NONE;
@@ -84,7 +83,8 @@ private:
     bool _isFinished = false; // of the worker
 
     std::thread _worker;
-    std::mutex _queueLock; // guards the commands
-    std::condition_variable _queueSignal;
-    std::deque<int> _commands;
+    platform::Mutex _queueLock;
+    std::condition_variable_any _queueSignal;
+    std::deque<int> _commands GUARDED_BY(_queueLock);
+    platform::MainLoopMailbox _mailbox;
 };

@@ -8,24 +8,19 @@
 #include <thread>
 #include <utility>
 
+#include <MainLoopMailbox.h>
 #include <uxt_theme.h>
-#include <volume_samples.h>
 
 #include "MwLog.h"
 
 using panekit::WTimer;
 
-// Shared by the panel, the thread that reads the samples, and what it has on its way to the main loop.
-struct MwTrimWaveform::WaveformThreadData {
-    std::mutex mutex; // guards the owner
-    MwTrimWaveform* owner = nullptr; // null when nobody waits any more
-    std::atomic<bool> cancelled = false;
-};
+using Samples = std::shared_ptr<volume_samples_s>;
 
-struct MwTrimWaveform::Delivery {
-    std::shared_ptr<WaveformThreadData> data;
-    volume_samples_s* samples; // null when there are none
-    bool isLast;
+// Of the panel and of the thread that reads the samples; closed when nobody waits any more.
+struct MwTrimWaveform::Reading {
+    platform::MainLoopMailbox mailbox;
+    std::atomic<bool> cancelled = false;
 };
 
 namespace {
@@ -49,6 +44,15 @@ constexpr std::array<Stroke, MOST_STROKES> STROKES = {{
     {.factor = 0.7, .color = "AO007"},
 }};
 
+Samples readSamples(const std::string& path, volume_samples_quality_e quality, const std::atomic<bool>& cancelled)
+{
+    volume_samples_s* samples = nullptr;
+    const int result = mw_get_volume_samples_until(path.c_str(), quality, &cancelled, &samples);
+    if (result != 0 && quality == VOLUME_SAMPLES_EXACT && !cancelled)
+        MW_LOGE("mw_get_volume_samples failed!!!");
+    return {samples, mw_free_volume_samples};
+}
+
 // A little unevenness that looks alive, the same each time: 0.91 to 1.
 double jitter(size_t bar, int stroke, int side)
 {
@@ -66,10 +70,9 @@ MwTrimWaveform::MwTrimWaveform(Evas_Object* layout, const char* part, const std:
 
 MwTrimWaveform::~MwTrimWaveform()
 {
-    if (const auto reading = std::exchange(_waveformThread, nullptr); reading) {
-        reading->cancelled = true;
-        const std::lock_guard lock(reading->mutex);
-        reading->owner = nullptr;
+    if (_reading) {
+        _reading->cancelled = true;
+        _reading->mailbox.close();
     }
     WTimer::destroy(_growing);
     if (_image) {
@@ -133,49 +136,29 @@ void MwTrimWaveform::_resize()
 
 void MwTrimWaveform::_getVoiceSampleData(const std::string& path)
 {
-    if (_waveformThread) {
+    if (_reading) {
         MW_LOGE("Already running thread!!!");
         return;
     }
-    _waveformThread = std::make_shared<WaveformThreadData>();
-    _waveformThread->owner = this;
-    std::thread([data = _waveformThread, path] { _read(data, path); }).detach();
-}
-
-void MwTrimWaveform::_read(const std::shared_ptr<WaveformThreadData>& data, const std::string& path)
-{
-    MW_LOGI("BEGIN - sample thread");
-    for (const auto quality : {VOLUME_SAMPLES_COARSE, VOLUME_SAMPLES_EXACT}) {
-        volume_samples_s* samples = nullptr;
-        const bool isLast = quality == VOLUME_SAMPLES_EXACT;
-        if (mw_get_volume_samples_until(path.c_str(), quality, &data->cancelled, &samples) != 0 && isLast
-            && !data->cancelled)
-            MW_LOGE("mw_get_volume_samples failed!!!");
-        // A coarse look that was not to be had is nothing to tell.
-        if (data->cancelled || (!samples && !isLast)) {
-            if (samples)
-                mw_free_volume_samples(samples);
-            continue;
+    _reading = std::make_shared<Reading>();
+    std::thread([this, reading = _reading, path] {
+        MW_LOGI("BEGIN - sample thread");
+        for (const auto quality : {VOLUME_SAMPLES_COARSE, VOLUME_SAMPLES_EXACT}) {
+            const bool isLast = quality == VOLUME_SAMPLES_EXACT;
+            const Samples samples = readSamples(path, quality, reading->cancelled);
+            // A coarse look that was not to be had is nothing to tell.
+            if (samples || isLast)
+                reading->mailbox.post([this, samples, isLast] { _deliver(samples.get(), isLast); });
         }
-        ecore_main_loop_thread_safe_call_async(_deliverCb, new Delivery{data, samples, isLast});
-    }
+    }).detach();
 }
 
-void MwTrimWaveform::_deliverCb(void* received)
+void MwTrimWaveform::_deliver(const volume_samples_s* samples, bool isLast)
 {
-    const std::unique_ptr<Delivery> delivery(static_cast<Delivery*>(received));
-    MwTrimWaveform* owner = nullptr;
-    {
-        const std::lock_guard lock(delivery->data->mutex);
-        owner = delivery->data->owner;
-    }
-    if (owner && delivery->samples)
-        owner->_take(barsOf(delivery->samples->amplitude_samples,
-            static_cast<size_t>(delivery->samples->sample_size) / sizeof(uint32_t)));
-    if (owner && delivery->isLast)
-        owner->_waveformThread = nullptr;
-    if (delivery->samples && mw_free_volume_samples(delivery->samples) != 0)
-        MW_LOGE("mw_free_volume_samples failed");
+    if (samples)
+        _take(barsOf(samples->amplitude_samples, static_cast<size_t>(samples->sample_size) / sizeof(uint32_t)));
+    if (isLast)
+        _reading = nullptr;
 }
 
 MwTrimWaveform::Bars MwTrimWaveform::barsOf(const uint32_t* samples, size_t count)

@@ -6,12 +6,12 @@
 #include <cstdint>
 #include <functional>
 #include <memory>
-#include <mutex>
 #include <string>
 
 #include <Evas.h>
 
 #include <panekit/WTimer.h>
+#include <volume_samples.h>
 
 typedef struct _cairo cairo_t;
 typedef struct _cairo_surface cairo_surface_t;
@@ -36,14 +36,13 @@ public:
     [[nodiscard]] Evas_Object* getImage() const { return _image; }
     [[nodiscard]] const Bars& getBars() const { return _bars; }
     // Whether the exact look has come, or none ever will.
-    [[nodiscard]] bool isComplete() const { return _waveformThread == nullptr; }
+    [[nodiscard]] bool isComplete() const { return _reading == nullptr; }
 
     // The bars of some samples, all 0 without sound.
     static Bars barsOf(const uint32_t* samples, size_t count);
 
 private:
-    struct WaveformThreadData;
-    struct Delivery;
+    struct Reading;
 
     void _createWaveform(Evas_Object* layout, const char* part);
     void _getVoiceSampleData(const std::string& path);
@@ -51,8 +50,7 @@ private:
     bool _grow();
     void _resize();
     void _drawWaveform();
-    static void _read(const std::shared_ptr<WaveformThreadData>& data, const std::string& path);
-    static void _deliverCb(void* data);
+    void _deliver(const volume_samples_s* samples, bool isLast);
     static void _pixelsCb(void* data, Evas_Object* image);
     static void _resizedCb(void* data, Evas* canvas, Evas_Object* image, void* info);
     static void _deletedCb(void* data, Evas* canvas, Evas_Object* image, void* info);
@@ -66,5 +64,5 @@ private:
     int _growth = 0; // steps done
     bool _hasBars = false;
     panekit::WTimer::Weak _growing;
-    std::shared_ptr<WaveformThreadData> _waveformThread;
+    std::shared_ptr<Reading> _reading; // until it has delivered all
 };

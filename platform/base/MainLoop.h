@@ -1,4 +1,4 @@
-// Hand-over to the main loop.
+// The one way from another thread onto the main loop; work that belongs to an object goes by its MainLoopMailbox.
 #pragma once
 
 #include <functional>

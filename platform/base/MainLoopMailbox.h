@@ -3,10 +3,10 @@
 #include <functional>
 #include <memory>
 
-namespace media {
+namespace platform {
 
-// Hands calls from any thread to the main loop, in order. Never waits for the loop and never calls at once, so it may
-// be used while a lock is held. Nothing is delivered after close() or the destructor when those run on the main loop.
+// Hands calls from any thread to the main loop, in order. Never waits for the loop, so it may be used while a lock is
+// held. Nothing is delivered after close() or the destructor when those run on the main loop.
 class MainLoopMailbox {
 public:
     MainLoopMailbox();
@@ -14,7 +14,10 @@ public:
     MainLoopMailbox(const MainLoopMailbox&) = delete;
     MainLoopMailbox& operator=(const MainLoopMailbox&) = delete;
 
+    // Never calls at once.
     void post(std::function<void()> call);
+    // Calls at once on the main loop, also before what was posted.
+    void call(std::function<void()> call);
     void close();
 
 private:

@@ -1,4 +1,4 @@
-#include "state/MainLoop.h"
+#include "MainLoop.h"
 
 #include <Ecore.h>
 
