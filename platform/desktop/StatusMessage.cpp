@@ -5,8 +5,8 @@
 #include "launch/AppProcess.h"
 #include "state/Log.h"
 #include <MainLoop.h>
+#include <Mutex.h>
 
-#include <mutex>
 #include <optional>
 #include <string>
 
@@ -15,8 +15,8 @@ namespace {
 constexpr int INVALID_PARAMETER = -22;
 
 struct Last {
-    std::mutex mutex;
-    std::optional<std::string> text;
+    platform::Mutex mutex;
+    std::optional<std::string> text GUARDED_BY(mutex);
 };
 
 Last& last()
@@ -51,7 +51,7 @@ int notification_status_message_post(const char* message)
     if (message == nullptr)
         return INVALID_PARAMETER;
     {
-        const std::lock_guard lock(last().mutex);
+        const platform::Lock lock(last().mutex);
         last().text = message;
     }
     platform::onMainLoop([text = std::string(message)] { show(text); });
@@ -60,6 +60,6 @@ int notification_status_message_post(const char* message)
 
 const char* notification_status_message_last(void)
 {
-    const std::lock_guard lock(last().mutex);
+    const platform::Lock lock(last().mutex);
     return last().text ? last().text->c_str() : nullptr;
 }

@@ -4,10 +4,11 @@
 #include "state/Directories.h"
 #include "state/Log.h"
 
+#include <Mutex.h>
+
 #include <cerrno>
 #include <cstring>
 #include <ctime>
-#include <mutex>
 #include <string>
 
 #include <fcntl.h>
@@ -16,8 +17,8 @@
 #include <unistd.h>
 
 struct tovanic_log_manager_s {
-    std::mutex mutex;
-    int lastRequest = 0;
+    platform::Mutex mutex;
+    int lastRequest GUARDED_BY(mutex) = 0;
 };
 
 namespace {
@@ -106,7 +107,7 @@ int tovanic_log_manager_insert(tovanic_log_manager_h manager, const char* uri, b
         return INVALID_PARAMETER;
     int id = 0;
     {
-        const std::lock_guard lock(manager->mutex);
+        const platform::Lock lock(manager->mutex);
         id = ++manager->lastRequest;
     }
     const int result = append(lineOf(*record)) ? NONE : IO_ERROR;

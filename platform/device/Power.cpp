@@ -5,11 +5,11 @@
 #include "state/Log.h"
 #include "state/Trees.h"
 #include <MainLoop.h>
+#include <Mutex.h>
 
 #include <Ecore.h>
 
 #include <memory>
-#include <mutex>
 #include <set>
 #include <string>
 
@@ -23,8 +23,8 @@ constexpr int INVALID_PARAMETER = -22;
 constexpr const char* NAMES[] = {"cpu", "display", "display_dim"};
 
 struct Held {
-    std::mutex mutex;
-    std::set<power_lock_e> locks;
+    platform::Mutex mutex;
+    std::set<power_lock_e> locks GUARDED_BY(mutex);
 };
 
 Held& held()
@@ -64,7 +64,7 @@ void apply()
 {
     std::set<power_lock_e> locks;
     {
-        const std::lock_guard lock(held().mutex);
+        const platform::Lock lock(held().mutex);
         locks = held().locks;
     }
     Requests& asked = requests();
@@ -90,7 +90,7 @@ int change(power_lock_e lock, Change apply_to)
     if (!isLock(lock))
         return INVALID_PARAMETER;
     {
-        const std::lock_guard guard(held().mutex);
+        const platform::Lock guard(held().mutex);
         apply_to(held().locks);
         publish(held().locks);
     }

@@ -192,7 +192,7 @@ PulseWatch::~PulseWatch()
 
 bool PulseWatch::_start()
 {
-    const std::scoped_lock lock(_startMutex);
+    const platform::Lock lock(_startMutex);
     if (_loop != nullptr)
         return true;
     _loop = pa_threaded_mainloop_new();
@@ -281,7 +281,7 @@ void PulseWatch::_finish()
     if (!_isReady)
         return;
     {
-        const std::scoped_lock lock(_stateMutex);
+        const platform::Lock lock(_stateMutex);
         _answers = std::max(_answers, finished->asked);
     }
     _publish(finished->found);
@@ -293,7 +293,7 @@ void PulseWatch::_publish(const PulseSnapshot& now)
 {
     PulseSnapshot before;
     {
-        const std::scoped_lock lock(_stateMutex);
+        const platform::Lock lock(_stateMutex);
         before = std::exchange(_now, now);
         if (!now.isConnected)
             _answers = _asked;
@@ -301,7 +301,7 @@ void PulseWatch::_publish(const PulseSnapshot& now)
     _answered.notify_all();
     if (before == now)
         return;
-    const std::scoped_lock lock(_listenerMutex);
+    const platform::Lock lock(_listenerMutex);
     for (const auto& [id, listener] : _listeners)
         listener(before, now);
 }
@@ -309,7 +309,7 @@ void PulseWatch::_publish(const PulseSnapshot& now)
 void PulseWatch::_scheduleReconnect()
 {
     {
-        const std::scoped_lock lock(_listenerMutex);
+        const platform::Lock lock(_listenerMutex);
         if (_listeners.empty() || std::exchange(_isReconnectDue, true))
             return;
     }
@@ -330,7 +330,7 @@ void PulseWatch::_scheduleReconnect()
 
 PulseSnapshot PulseWatch::snapshot()
 {
-    const std::scoped_lock lock(_stateMutex);
+    const platform::Lock lock(_stateMutex);
     return _now;
 }
 
@@ -351,9 +351,9 @@ PulseSnapshot PulseWatch::refresh(std::chrono::milliseconds limit)
         else
             _query();
     }
-    std::unique_lock lock(_stateMutex);
+    platform::Lock lock(_stateMutex);
     // The answer counts when it was asked for after this call began.
-    _answered.wait_for(lock, limit, [&] { return _answers >= asked; });
+    _answered.wait_for(lock, limit, [&]() REQUIRES(_stateMutex) { return _answers >= asked; });
     return _now;
 }
 
@@ -361,7 +361,7 @@ int PulseWatch::addListener(Listener listener)
 {
     int id = 0;
     {
-        const std::scoped_lock lock(_listenerMutex);
+        const platform::Lock lock(_listenerMutex);
         id = ++_lastId;
         _listeners[id] = std::move(listener);
     }
@@ -375,7 +375,7 @@ int PulseWatch::addListener(Listener listener)
 
 void PulseWatch::removeListener(int id)
 {
-    const std::scoped_lock lock(_listenerMutex);
+    const platform::Lock lock(_listenerMutex);
     _listeners.erase(id);
 }
 

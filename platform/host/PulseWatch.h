@@ -1,11 +1,12 @@
 #pragma once
 
+#include <Mutex.h>
+
 #include <chrono>
 #include <condition_variable>
 #include <functional>
 #include <map>
 #include <memory>
-#include <mutex>
 #include <set>
 #include <string>
 
@@ -65,7 +66,7 @@ private:
     bool _start();
     bool _isConnectionOld() const;
 
-    std::mutex _startMutex;
+    platform::Mutex _startMutex;
     pa_threaded_mainloop* _loop = nullptr;
     pa_context* _context = nullptr; // guarded by the loop's lock, as the next five
     std::string _server;
@@ -75,15 +76,15 @@ private:
     bool _isReconnectDue = false;
     std::chrono::steady_clock::time_point _lastAttempt{};
 
-    std::mutex _stateMutex; // guards the next three
-    std::condition_variable _answered;
-    PulseSnapshot _now;
-    unsigned _answers = 0;
+    platform::Mutex _stateMutex;
+    std::condition_variable_any _answered;
+    PulseSnapshot _now GUARDED_BY(_stateMutex);
+    unsigned _answers GUARDED_BY(_stateMutex) = 0;
     unsigned _asked = 0; // guarded by the loop's lock
 
-    std::recursive_mutex _listenerMutex; // held during calls
-    std::map<int, Listener> _listeners;
-    int _lastId = 0;
+    platform::Mutex _listenerMutex; // held during calls
+    std::map<int, Listener> _listeners GUARDED_BY(_listenerMutex);
+    int _lastId GUARDED_BY(_listenerMutex) = 0;
 };
 
 }

@@ -4,10 +4,11 @@
 #include "app_control.h"
 #include "launch/Bundle.h"
 
+#include <Mutex.h>
+
 #include <atomic>
 #include <cstdint>
 #include <memory>
-#include <mutex>
 
 namespace platform {
 
@@ -24,8 +25,8 @@ public:
     [[nodiscard]] bool isAnswered() const;
 
 private:
-    mutable std::mutex _mutex;
-    sd_bus_message* _call;
+    mutable Mutex _mutex;
+    sd_bus_message* _call GUARDED_BY(_mutex);
 };
 
 }

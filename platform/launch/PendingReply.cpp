@@ -54,7 +54,7 @@ PendingReply::~PendingReply()
 
 bool PendingReply::isAnswered() const
 {
-    const std::lock_guard lock(_mutex);
+    const Lock lock(_mutex);
     return _call == nullptr;
 }
 
@@ -62,7 +62,7 @@ int PendingReply::answer(app_control_result_e result, const bundle_s& extras)
 {
     sd_bus_message* call = nullptr;
     {
-        const std::lock_guard lock(_mutex);
+        const Lock lock(_mutex);
         call = std::exchange(_call, nullptr);
     }
     if (call == nullptr) {

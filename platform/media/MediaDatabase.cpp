@@ -175,7 +175,12 @@ Database::~Database() { _close(); }
 
 int Database::open()
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
+    return _openIfClosed();
+}
+
+int Database::_openIfClosed()
+{
     if (_db != nullptr)
         return SQLITE_OK;
     std::error_code ignored;
@@ -220,13 +225,13 @@ void Database::_close()
 {
     _isOpen = false;
     sqlite3_close_v2(std::exchange(_db, nullptr));
-    const std::lock_guard lock(_readMutex);
+    const platform::Lock lock(_readMutex);
     sqlite3_close_v2(std::exchange(_reader, nullptr));
 }
 
 int Database::_migrate()
 {
-    const auto version = [this] {
+    const auto version = [this]() REQUIRES(_mutex) {
         Statement statement(_db, "PRAGMA user_version");
         return statement.step() ? static_cast<int>(statement.number(0)) : -1;
     };
@@ -308,7 +313,7 @@ void Database::_restore(const std::string& aside)
 
 void Database::keepCopy()
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
     struct stat status { };
     if (_db == nullptr || (!_isChanged && ::stat(_copyPath().c_str(), &status) == 0))
         return;
@@ -331,11 +336,9 @@ bool Database::takeReplaced() { return _replaced.exchange(false); }
 // Runs the work under the lock; a database found damaged is replaced and the work tried once more.
 int Database::_guarded(const Work& work)
 {
-    const std::lock_guard lock(_mutex);
-    if (_db == nullptr) {
-        if (const int result = open(); result != SQLITE_OK)
-            return result;
-    }
+    const platform::Lock lock(_mutex);
+    if (const int opened = _openIfClosed(); opened != SQLITE_OK)
+        return opened;
     int result = work();
     if (isDamage(result)) {
         result = _replace();
@@ -353,12 +356,12 @@ int Database::_reading(const Reading& work)
             return result;
     }
     const int result = _readBeside(work);
-    return isDamage(result) ? _guarded([&] { return work(_db); }) : result;
+    return isDamage(result) ? _guarded([&]() REQUIRES(_mutex) { return work(_db); }) : result;
 }
 
 int Database::_readBeside(const Reading& work)
 {
-    const std::lock_guard lock(_readMutex);
+    const platform::Lock lock(_readMutex);
     if (_reader == nullptr) {
         const int result
             = sqlite3_open_v2(_path.c_str(), &_reader, SQLITE_OPEN_READWRITE | SQLITE_OPEN_FULLMUTEX, nullptr);
@@ -373,7 +376,7 @@ int Database::_readBeside(const Reading& work)
 
 int Database::_transaction(const Work& work)
 {
-    return _guarded([&] {
+    return _guarded([&]() REQUIRES(_mutex) {
         int result = sqlite3_exec(_db, "BEGIN IMMEDIATE", nullptr, nullptr, nullptr);
         if (result != SQLITE_OK)
             return result;
@@ -435,7 +438,7 @@ int Database::_putRow(MediaRow& row)
 
 int Database::put(MediaRow& row)
 {
-    return _transaction([&] { return _putRow(row); });
+    return _transaction([&]() REQUIRES(_mutex) { return _putRow(row); });
 }
 
 int Database::_removePath(const std::string& path)
@@ -473,7 +476,7 @@ int Database::_moveRows(const FileChanges& changes)
 
 int Database::apply(const FileChanges& changes)
 {
-    return _transaction([&] {
+    return _transaction([&]() REQUIRES(_mutex) {
         int result = _moveRows(changes);
         for (auto put = changes.put.begin(); result == SQLITE_OK && put != changes.put.end(); ++put) {
             MediaRow row = *put;
@@ -487,12 +490,12 @@ int Database::apply(const FileChanges& changes)
 
 int Database::removeByPath(const std::string& path)
 {
-    return _transaction([&] { return _removePath(path); });
+    return _transaction([&]() REQUIRES(_mutex) { return _removePath(path); });
 }
 
 int Database::removeByIds(const std::vector<std::string>& mediaIds)
 {
-    return _transaction([&] {
+    return _transaction([&]() REQUIRES(_mutex) {
         int result = SQLITE_OK;
         for (auto id = mediaIds.begin(); result == SQLITE_OK && id != mediaIds.end(); ++id)
             result = Statement(_db, "DELETE FROM media WHERE MEDIA_ID = ?").bind(*id).run();
@@ -502,7 +505,7 @@ int Database::removeByIds(const std::vector<std::string>& mediaIds)
 
 int Database::rename(const std::string& mediaId, const MediaRow& row)
 {
-    return _transaction([&] {
+    return _transaction([&]() REQUIRES(_mutex) {
         Statement replaced(_db, "DELETE FROM media WHERE MEDIA_PATH = ? COLLATE BINARY AND MEDIA_ID <> ?");
         if (const int result = replaced.bind(row.path).bind(mediaId).run(); result != SQLITE_OK)
             return result;
@@ -515,7 +518,7 @@ int Database::rename(const std::string& mediaId, const MediaRow& row)
 
 int Database::replace(const std::string& formerId, const MediaRow& row, const std::vector<BookmarkRow>& bookmarks)
 {
-    return _transaction([&] {
+    return _transaction([&]() REQUIRES(_mutex) {
         int result = Statement(_db, "DELETE FROM media WHERE MEDIA_ID = ?").bind(formerId).run();
         if (result == SQLITE_OK)
             result = _removePath(row.path);
@@ -536,12 +539,12 @@ int Database::_insertBookmark(const std::string& mediaId, unsigned int markedTim
 
 int Database::insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name)
 {
-    return _transaction([&] { return _insertBookmark(mediaId, markedTime, name); });
+    return _transaction([&]() REQUIRES(_mutex) { return _insertBookmark(mediaId, markedTime, name); });
 }
 
 int Database::insertMissingBookmarks(const std::string& mediaId, const std::vector<BookmarkRow>& bookmarks)
 {
-    return _transaction([&] {
+    return _transaction([&]() REQUIRES(_mutex) {
         for (const BookmarkRow& mark : bookmarks) {
             Statement statement(_db,
                 "INSERT INTO bookmark(MEDIA_ID, BOOKMARK_MARKED_TIME, BOOKMARK_NAME) SELECT ?1, ?2, ?3 WHERE NOT "
@@ -557,7 +560,7 @@ int Database::insertMissingBookmarks(const std::string& mediaId, const std::vect
 
 int Database::removeBookmark(int bookmarkId)
 {
-    return _transaction([&] {
+    return _transaction([&]() REQUIRES(_mutex) {
         return Statement(_db, "DELETE FROM bookmark WHERE BOOKMARK_ID = ?")
             .bind(static_cast<long long>(bookmarkId))
             .run();
@@ -597,7 +600,7 @@ int Database::selectWaveform(const Waveform& key, std::string& samples)
 
 int Database::putWaveform(const Waveform& key, const std::string& samples)
 {
-    return _transaction([&] {
+    return _transaction([&]() REQUIRES(_mutex) {
         Statement statement(_db,
             "INSERT OR REPLACE INTO waveform(WAVEFORM_PATH, WAVEFORM_SIZE, WAVEFORM_TIME, WAVEFORM_SAMPLES) "
             "SELECT ?1, ?2, ?3, ?4 WHERE EXISTS (SELECT 1 FROM media WHERE MEDIA_PATH = ?1 COLLATE BINARY)");

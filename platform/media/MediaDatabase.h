@@ -1,11 +1,11 @@
 #pragma once
 
+#include <Mutex.h>
 #include <sqlite3.h>
 
 #include <atomic>
 #include <functional>
 #include <memory>
-#include <mutex>
 #include <optional>
 #include <string>
 #include <utility>
@@ -110,27 +110,28 @@ private:
     int _reading(const Reading& work);
     int _readBeside(const Reading& work);
     int _transaction(const Work& work);
-    int _openOnce();
-    int _putRow(MediaRow& row);
-    int _moveRows(const FileChanges& changes);
-    int _removePath(const std::string& path);
-    int _insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name);
-    int _migrate();
-    int _checkTables();
-    int _replace();
-    std::string _setAside();
-    void _restore(const std::string& aside);
+    int _openIfClosed() REQUIRES(_mutex);
+    int _openOnce() REQUIRES(_mutex);
+    int _putRow(MediaRow& row) REQUIRES(_mutex);
+    int _moveRows(const FileChanges& changes) REQUIRES(_mutex);
+    int _removePath(const std::string& path) REQUIRES(_mutex);
+    int _insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name) REQUIRES(_mutex);
+    int _migrate() REQUIRES(_mutex);
+    int _checkTables() REQUIRES(_mutex);
+    int _replace() REQUIRES(_mutex);
+    std::string _setAside() REQUIRES(_mutex);
+    void _restore(const std::string& aside) REQUIRES(_mutex);
     [[nodiscard]] std::string _copyPath() const { return _path + ".good"; }
-    void _close();
+    void _close() REQUIRES(_mutex);
 
     std::string _path;
-    sqlite3* _db = nullptr;
     std::atomic<bool> _replaced = false;
-    bool _isChanged = false; // since the good copy
-    std::recursive_mutex _mutex;
     std::atomic<bool> _isOpen = false;
-    sqlite3* _reader = nullptr;
-    std::mutex _readMutex; // of the reader; taken last
+    platform::Mutex _mutex;
+    sqlite3* _db GUARDED_BY(_mutex) = nullptr;
+    bool _isChanged GUARDED_BY(_mutex) = false; // since the good copy
+    platform::Mutex _readMutex; // taken last
+    sqlite3* _reader GUARDED_BY(_readMutex) = nullptr;
 };
 
 }

@@ -70,13 +70,13 @@ Recorder::~Recorder()
 {
     host::PulseWatch::instance().removeListener(_soundListener);
     {
-        const std::scoped_lock lock(_operation);
+        const platform::Lock lock(_operation);
         if (const auto recording = _current(); recording && _isRecordingOrPaused())
             (void)_complete(*recording);
         _setCurrent(nullptr);
     }
     {
-        const std::scoped_lock lock(_keeperMutex);
+        const platform::Lock lock(_keeperMutex);
         _isEnding = true;
     }
     _keeperWake.notify_all();
@@ -121,7 +121,7 @@ void Recorder::_setState(recorder_state_e state, bool byPolicy)
 
 int Recorder::prepare()
 {
-    const std::scoped_lock lock(_operation);
+    const platform::Lock lock(_operation);
     if (_state != RECORDER_STATE_CREATED)
         return RECORDER_ERROR_INVALID_STATE;
     const bool isAac = _settings.codec == RECORDER_AUDIO_CODEC_AAC;
@@ -140,7 +140,7 @@ int Recorder::prepare()
 
 int Recorder::unprepare()
 {
-    const std::scoped_lock lock(_operation);
+    const platform::Lock lock(_operation);
     if (_state != RECORDER_STATE_READY)
         return RECORDER_ERROR_INVALID_STATE;
     _pipeline.reset();
@@ -152,7 +152,7 @@ int Recorder::unprepare()
 
 int Recorder::start()
 {
-    const std::scoped_lock lock(_operation);
+    const platform::Lock lock(_operation);
     if (_state == RECORDER_STATE_PAUSED)
         return _resume();
     return _state == RECORDER_STATE_READY ? _startNew() : RECORDER_ERROR_INVALID_STATE;
@@ -233,7 +233,7 @@ int Recorder::_startOn(std::shared_ptr<Recording> recording)
 
 int Recorder::pause()
 {
-    const std::scoped_lock lock(_operation);
+    const platform::Lock lock(_operation);
     if (_state != RECORDER_STATE_RECORDING)
         return RECORDER_ERROR_INVALID_STATE;
     const auto recording = _current();
@@ -245,7 +245,7 @@ int Recorder::pause()
 
 int Recorder::commit()
 {
-    const std::scoped_lock lock(_operation);
+    const platform::Lock lock(_operation);
     // An interruption that came first has completed the file already.
     if (std::exchange(_isEndedByPolicy, false) && _state == RECORDER_STATE_READY)
         return RECORDER_ERROR_NONE;
@@ -285,7 +285,7 @@ void Recorder::_drain(Recording& recording)
 
 int Recorder::cancel()
 {
-    const std::scoped_lock lock(_operation);
+    const platform::Lock lock(_operation);
     const bool isEnded = std::exchange(_isEndedByPolicy, false) && _state == RECORDER_STATE_READY;
     if (!isEnded && !_isRecordingOrPaused())
         return RECORDER_ERROR_INVALID_STATE;

@@ -2,6 +2,7 @@
 
 #include "media/Recording.h"
 #include <MainLoopMailbox.h>
+#include <Mutex.h>
 
 #include <recorder.h>
 
@@ -9,7 +10,6 @@
 #include <chrono>
 #include <condition_variable>
 #include <memory>
-#include <mutex>
 #include <string>
 #include <thread>
 
@@ -69,19 +69,19 @@ public:
     double level();
 
 private:
-    int _startNew();
-    int _startOn(std::shared_ptr<Recording> recording);
-    int _resume();
+    int _startNew() REQUIRES(_operation);
+    int _startOn(std::shared_ptr<Recording> recording) REQUIRES(_operation);
+    int _resume() REQUIRES(_operation);
     int _refusal(std::chrono::milliseconds limit = std::chrono::milliseconds(200)) const;
-    std::shared_ptr<Recording> _createRecording(int& error);
+    std::shared_ptr<Recording> _createRecording(int& error) REQUIRES(_operation);
     Recording::Events _recordingEvents();
     // Writes out what was captured and closes the file; answers the system's error number.
-    int _complete(Recording& recording);
-    void _drain(Recording& recording);
-    void _discard();
+    int _complete(Recording& recording) REQUIRES(_operation);
+    void _drain(Recording& recording) REQUIRES(_operation);
+    void _discard() REQUIRES(_operation);
     void _setState(recorder_state_e state, bool byPolicy = false);
     bool _isRecordingOrPaused() const;
-    RecorderFormat _format() const;
+    RecorderFormat _format() const REQUIRES(_operation);
 
     void _postStatus(unsigned long long elapsed, unsigned long long size);
     void _postProgress();
@@ -94,8 +94,9 @@ private:
     void _keep();
     void _inspect(Recording& recording, bool isSecond);
     void _inspectStorage(Recording& recording);
-    void _watchMicrophone(const Recording& recording);
-    bool _isOnForeignMonitor();
+    void _inspectSound(Recording& recording) REQUIRES(_operation);
+    void _watchMicrophone(const Recording& recording) REQUIRES(_operation);
+    bool _isOnForeignMonitor() REQUIRES(_operation);
     void _endInterrupted(const std::shared_ptr<Recording>& recording);
     void _reportEnd(Trouble trouble, recorder_state_e before, int fileError);
     std::shared_ptr<Recording> _current();
@@ -109,19 +110,20 @@ private:
     std::atomic<bool> _isAnnounced{false}; // the status with elapsed 0 was sent
     std::atomic<bool> _isStorageFailing{false}; // and that was told
 
-    std::mutex _operation; // one operation, or the keeper's end of a recording; guards the next four
-    RecorderSettings _settings;
-    std::unique_ptr<RecorderPipeline> _pipeline;
-    bool _isEndedByPolicy = false; // the file is complete and waits for a commit, which finds nothing to do
-    int _silentTicks = 0;
-    uint64_t _samplesAtTick = 0;
-    std::string _microphone; // in use at the last look
+    platform::Mutex _operation; // one operation, or the keeper's end of a recording
+    RecorderSettings _settings GUARDED_BY(_operation);
+    std::unique_ptr<RecorderPipeline> _pipeline GUARDED_BY(_operation);
+    bool _isEndedByPolicy GUARDED_BY(_operation)
+        = false; // the file is complete and waits for a commit, which finds nothing to do
+    int _silentTicks GUARDED_BY(_operation) = 0;
+    uint64_t _samplesAtTick GUARDED_BY(_operation) = 0;
+    std::string _microphone GUARDED_BY(_operation); // in use at the last look
 
-    std::mutex _keeperMutex; // guards the next three; nothing else is locked under it
-    std::condition_variable _keeperWake;
-    std::shared_ptr<Recording> _recording;
-    bool _isEnding = false;
-    bool _hasTrouble = false;
+    platform::Mutex _keeperMutex; // nothing else is locked under it
+    std::condition_variable_any _keeperWake;
+    std::shared_ptr<Recording> _recording GUARDED_BY(_keeperMutex);
+    bool _isEnding GUARDED_BY(_keeperMutex) = false;
+    bool _hasTrouble GUARDED_BY(_keeperMutex) = false;
     int _soundListener = 0;
     std::thread _keeper;
 };

@@ -42,7 +42,7 @@ Recording::Events Recorder::_recordingEvents()
     };
     events.trouble = [this] {
         {
-            const std::scoped_lock lock(_keeperMutex);
+            const platform::Lock lock(_keeperMutex);
             _hasTrouble = true;
         }
         _keeperWake.notify_all();
@@ -52,14 +52,14 @@ Recording::Events Recorder::_recordingEvents()
 
 std::shared_ptr<Recording> Recorder::_current()
 {
-    const std::scoped_lock lock(_keeperMutex);
+    const platform::Lock lock(_keeperMutex);
     return _recording;
 }
 
 void Recorder::_setCurrent(std::shared_ptr<Recording> recording)
 {
     {
-        const std::scoped_lock lock(_keeperMutex);
+        const platform::Lock lock(_keeperMutex);
         // Trouble may have come before the keeper knew the recording.
         _hasTrouble = recording && recording->trouble() != Trouble::NONE;
         std::swap(_recording, recording);
@@ -80,12 +80,12 @@ void Recorder::_keep()
     for (unsigned tick = 0;; ++tick) {
         std::shared_ptr<Recording> recording;
         {
-            std::unique_lock lock(_keeperMutex);
-            const auto isDue = [this] { return _isEnding || _hasTrouble; };
+            platform::Lock lock(_keeperMutex);
+            const auto isDue = [this]() REQUIRES(_keeperMutex) { return _isEnding || _hasTrouble; };
             if (_recording)
                 _keeperWake.wait_for(lock, TICK, isDue);
             else
-                _keeperWake.wait(lock, [&] { return isDue() || _recording; });
+                _keeperWake.wait(lock, [&]() REQUIRES(_keeperMutex) { return isDue() || _recording; });
             if (_isEnding)
                 return;
             recording = _recording;
@@ -106,8 +106,15 @@ void Recorder::_inspect(Recording& recording, bool isSecond)
         _inspectStorage(recording);
     _noteSound(isCallLive(host::PulseWatch::instance().snapshot())); // the modem's, too
     // An operation under way moves the samples itself.
-    const std::unique_lock lock(_operation, std::try_to_lock);
-    if (!lock || _state != RECORDER_STATE_RECORDING || _current().get() != &recording)
+    if (!_operation.try_lock())
+        return;
+    _inspectSound(recording);
+    _operation.unlock();
+}
+
+void Recorder::_inspectSound(Recording& recording)
+{
+    if (_state != RECORDER_STATE_RECORDING || _current().get() != &recording)
         return;
     _watchMicrophone(recording);
     if (_silentTicks >= SILENT_TICKS || _isOnForeignMonitor())
@@ -151,7 +158,7 @@ bool Recorder::_isOnForeignMonitor()
 
 void Recorder::_endInterrupted(const std::shared_ptr<Recording>& recording)
 {
-    const std::scoped_lock lock(_operation);
+    const platform::Lock lock(_operation);
     if (_current() != recording || !_isRecordingOrPaused())
         return;
     const recorder_state_e before = _state;

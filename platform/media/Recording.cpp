@@ -47,7 +47,7 @@ void Recording::_notify()
 {
     // Taken and let go so that a waiter between its test and its sleep is not missed.
     {
-        const std::scoped_lock lock(_mutex);
+        const platform::Lock lock(_mutex);
     }
     _changed.notify_all();
 }
@@ -55,10 +55,10 @@ void Recording::_notify()
 void Recording::close()
 {
     {
-        const std::scoped_lock lock(_writing);
+        const platform::Lock lock(_writing);
         _isClosed = true;
     }
-    const std::scoped_lock lock(_telling);
+    const platform::Lock lock(_telling);
     _isMuted = true;
 }
 
@@ -74,14 +74,14 @@ void Recording::raise(Trouble trouble)
 
 bool Recording::waitForSound(std::chrono::milliseconds limit)
 {
-    std::unique_lock lock(_mutex);
+    platform::Lock lock(_mutex);
     _changed.wait_for(lock, limit, [this] { return _samples > 0 || _trouble != Trouble::NONE; });
     return _samples > 0 && _trouble == Trouble::NONE;
 }
 
 bool Recording::waitForDrain(std::chrono::milliseconds limit)
 {
-    std::unique_lock lock(_mutex);
+    platform::Lock lock(_mutex);
     return _changed.wait_for(lock, limit, [this] { return _isDrained.load(); });
 }
 
@@ -131,7 +131,7 @@ size_t Recording::onCaptured(const int16_t* samples, size_t count)
 void Recording::onFrame(const void* frame, size_t size)
 {
     // The silence that drives the last sound out of the encoder may end in frames of its own.
-    const std::scoped_lock lock(_writing);
+    const platform::Lock lock(_writing);
     const uint64_t frameSamples = _format.frameSamples();
     const uint64_t needed = (_samples + _format.lookAhead() + frameSamples - 1) / frameSamples;
     if (_isClosed || _file->frames() >= needed)

@@ -4,6 +4,7 @@
 #include "media/RecorderPipeline.h"
 #include "media/RecordingFile.h"
 
+#include <Mutex.h>
 #include <recorder.h>
 
 #include <atomic>
@@ -11,7 +12,6 @@
 #include <condition_variable>
 #include <functional>
 #include <memory>
-#include <mutex>
 
 namespace media {
 
@@ -68,7 +68,7 @@ private:
     template <typename Tell>
     void _tell(const Tell& tell)
     {
-        const std::scoped_lock lock(_telling);
+        const platform::Lock lock(_telling);
         if (!_isMuted)
             tell();
     }
@@ -85,11 +85,11 @@ private:
     std::atomic<bool> _isClosed{false};
     std::atomic<bool> _isDrained{false};
     std::atomic<Trouble> _trouble{Trouble::NONE};
-    std::mutex _writing; // held while a frame is written
-    std::mutex _telling; // held while an event is told; guards the next one
-    bool _isMuted = false;
-    std::mutex _mutex; // only for waiting
-    std::condition_variable _changed;
+    platform::Mutex _writing; // held while a frame is written
+    platform::Mutex _telling; // held while an event is told
+    bool _isMuted GUARDED_BY(_telling) = false;
+    platform::Mutex _mutex; // only for waiting
+    std::condition_variable_any _changed;
 };
 
 }

@@ -2,6 +2,7 @@
 
 #include "media/RecordingJournal.h"
 
+#include <Mutex.h>
 #include <recorder_leftover.h>
 
 #include <fcntl.h>
@@ -13,7 +14,6 @@
 #include <cstdio>
 #include <filesystem>
 #include <map>
-#include <mutex>
 #include <set>
 
 namespace fs = std::filesystem;
@@ -26,10 +26,10 @@ namespace {
     constexpr mode_t JOURNAL_MODE = 0644;
 
     struct Claims {
-        std::mutex mutex;
-        std::map<std::string, FileDescriptor> held; // by the resolved path
-        std::set<std::string> written;
-        std::set<std::string> complete;
+        platform::Mutex mutex;
+        std::map<std::string, FileDescriptor> held GUARDED_BY(mutex); // by the resolved path
+        std::set<std::string> written GUARDED_BY(mutex);
+        std::set<std::string> complete GUARDED_BY(mutex);
     };
 
     Claims& claims()
@@ -99,9 +99,8 @@ namespace {
     }
 
     // The journal here, locked; from our own table when an earlier recording was never released.
-    FileDescriptor takeOrLock(const std::string& path, int& error)
+    FileDescriptor takeOrLock(Claims& all, const std::string& path, int& error) REQUIRES(all.mutex)
     {
-        auto& all = claims();
         if (auto own = all.held.extract(path); !own.empty())
             if (isSameFile(own.mapped().get(), path + JOURNAL_SUFFIX))
                 return std::move(own.mapped());
@@ -213,12 +212,12 @@ bool hasLeftover(const std::string& path, int journal) { return exists(path) || 
 int claimTemporary(const std::string& givenPath)
 {
     const std::string path = resolved(givenPath);
-    const std::scoped_lock lock(claims().mutex);
+    const platform::Lock lock(claims().mutex);
     if (claims().written.contains(path))
         return EWOULDBLOCK;
     for (int attempt = 0; attempt < ATTEMPTS; ++attempt) {
         int error = 0;
-        FileDescriptor journal = takeOrLock(path, error);
+        FileDescriptor journal = takeOrLock(claims(), path, error);
         if (!journal)
             return error;
         if (isReadyForUse(path, journal.get(), error)) {
@@ -235,19 +234,19 @@ int claimTemporary(const std::string& givenPath)
 
 bool isClaimedHere(const std::string& path)
 {
-    const std::scoped_lock lock(claims().mutex);
+    const platform::Lock lock(claims().mutex);
     return claims().held.contains(resolved(path));
 }
 
 bool isBeingWritten(const std::string& path)
 {
-    const std::scoped_lock lock(claims().mutex);
+    const platform::Lock lock(claims().mutex);
     return claims().written.contains(resolved(path));
 }
 
 void endWriting(const std::string& path, bool isComplete)
 {
-    const std::scoped_lock lock(claims().mutex);
+    const platform::Lock lock(claims().mutex);
     claims().written.erase(resolved(path));
     if (isComplete)
         claims().complete.insert(resolved(path));
@@ -255,13 +254,13 @@ void endWriting(const std::string& path, bool isComplete)
 
 bool isComplete(const std::string& path)
 {
-    const std::scoped_lock lock(claims().mutex);
+    const platform::Lock lock(claims().mutex);
     return claims().complete.contains(resolved(path));
 }
 
 FileDescriptor claimedJournal(const std::string& path)
 {
-    const std::scoped_lock lock(claims().mutex);
+    const platform::Lock lock(claims().mutex);
     const auto found = claims().held.find(resolved(path));
     return found == claims().held.end() ? FileDescriptor()
                                         : FileDescriptor(fcntl(found->second.get(), F_DUPFD_CLOEXEC, 3));
@@ -270,7 +269,7 @@ FileDescriptor claimedJournal(const std::string& path)
 bool releaseTemporary(const std::string& givenPath)
 {
     const std::string path = resolved(givenPath);
-    const std::scoped_lock lock(claims().mutex);
+    const platform::Lock lock(claims().mutex);
     const auto found = claims().held.find(path);
     if (found == claims().held.end())
         return false;

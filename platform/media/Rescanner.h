@@ -1,8 +1,9 @@
 #pragma once
 
+#include <Mutex.h>
+
 #include <condition_variable>
 #include <functional>
-#include <mutex>
 #include <thread>
 
 namespace media {
@@ -19,7 +20,7 @@ public:
 
     void request()
     {
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         _requested = true;
         _condition.notify_one();
     }
@@ -27,8 +28,8 @@ public:
 private:
     void _run(const std::stop_token& stop)
     {
-        std::unique_lock lock(_mutex);
-        while (_condition.wait(lock, stop, [this] { return _requested; })) {
+        platform::Lock lock(_mutex);
+        while (_condition.wait(lock, stop, [this]() REQUIRES(_mutex) { return _requested; })) {
             _requested = false;
             lock.unlock();
             _work();
@@ -37,9 +38,9 @@ private:
     }
 
     std::function<void()> _work;
-    std::mutex _mutex;
+    platform::Mutex _mutex;
     std::condition_variable_any _condition;
-    bool _requested = false;
+    bool _requested GUARDED_BY(_mutex) = false;
     std::jthread _thread; // last: ends first
 };
 

@@ -15,7 +15,7 @@ std::shared_ptr<StepThread> StepThread::create()
 void StepThread::add(Step step)
 {
     {
-        const std::scoped_lock lock(_mutex);
+        const platform::Lock lock(_mutex);
         _steps.push_back(std::move(step));
     }
     _changed.notify_all();
@@ -23,14 +23,14 @@ void StepThread::add(Step step)
 
 bool StepThread::wait(std::chrono::milliseconds limit)
 {
-    std::unique_lock lock(_mutex);
-    return _changed.wait_for(lock, limit, [this] { return _steps.empty() && !_isBusy; });
+    platform::Lock lock(_mutex);
+    return _changed.wait_for(lock, limit, [this]() REQUIRES(_mutex) { return _steps.empty() && !_isBusy; });
 }
 
 void StepThread::finish()
 {
     {
-        const std::scoped_lock lock(_mutex);
+        const platform::Lock lock(_mutex);
         _isFinished = true;
     }
     _changed.notify_all();
@@ -38,9 +38,9 @@ void StepThread::finish()
 
 void StepThread::_work()
 {
-    std::unique_lock lock(_mutex);
+    platform::Lock lock(_mutex);
     for (;;) {
-        _changed.wait(lock, [this] { return !_steps.empty() || _isFinished; });
+        _changed.wait(lock, [this]() REQUIRES(_mutex) { return !_steps.empty() || _isFinished; });
         if (_steps.empty())
             return;
         Step step = std::move(_steps.front());

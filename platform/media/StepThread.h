@@ -1,11 +1,12 @@
 #pragma once
 
+#include <Mutex.h>
+
 #include <chrono>
 #include <condition_variable>
 #include <deque>
 #include <functional>
 #include <memory>
-#include <mutex>
 
 namespace media {
 
@@ -26,11 +27,11 @@ private:
     StepThread() = default;
     void _work();
 
-    std::mutex _mutex; // guards the rest
-    std::condition_variable _changed;
-    std::deque<Step> _steps;
-    bool _isBusy = false;
-    bool _isFinished = false;
+    platform::Mutex _mutex;
+    std::condition_variable_any _changed;
+    std::deque<Step> _steps GUARDED_BY(_mutex);
+    bool _isBusy GUARDED_BY(_mutex) = false;
+    bool _isFinished GUARDED_BY(_mutex) = false;
 };
 
 }

@@ -1,3 +1,4 @@
+#include <Mutex.h>
 #include <media_content.h>
 
 #include <storage.h>
@@ -66,7 +67,7 @@ struct Connection {
     }
 
     // Held from finding a database damaged until it is filled again, so that nobody reads it empty in between.
-    std::recursive_mutex mutex;
+    platform::Mutex mutex;
     media::Database database;
     media::Notice notice;
     media_content_db_updated_cb callback = nullptr;
@@ -77,13 +78,13 @@ struct Connection {
     std::unique_ptr<media::FolderWatch> folders;
 };
 
-std::mutex connectionMutex; // guards the pointer and the count
-std::shared_ptr<Connection> connection;
-int connectionCount = 0;
+platform::Mutex connectionMutex;
+std::shared_ptr<Connection> connection GUARDED_BY(connectionMutex);
+int connectionCount GUARDED_BY(connectionMutex) = 0;
 
 std::shared_ptr<Connection> current()
 {
-    const std::lock_guard lock(connectionMutex);
+    const platform::Lock lock(connectionMutex);
     return connection;
 }
 
@@ -164,7 +165,7 @@ void refill(Connection& held);
 template <typename Work>
 int read(Connection& held, const Work& work)
 {
-    const std::lock_guard lock(held.mutex);
+    const platform::Lock lock(held.mutex);
     const int result = work(held.database);
     if (!held.database.takeReplaced())
         return result;
@@ -179,7 +180,7 @@ int write(const Work& work)
     const auto held = current();
     if (!held)
         return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
-    const std::lock_guard lock(held->mutex);
+    const platform::Lock lock(held->mutex);
     const int result = work(held->database);
     if (held->database.takeReplaced())
         refill(*held);
@@ -188,9 +189,9 @@ int write(const Work& work)
     return toError(result);
 }
 
-std::mutex rememberedMutex; // guards the next two
-uint64_t rememberedInode = 0;
-media::Loudness remembered;
+platform::Mutex rememberedMutex;
+uint64_t rememberedInode GUARDED_BY(rememberedMutex) = 0;
+media::Loudness remembered GUARDED_BY(rememberedMutex);
 
 // The file at the path may be the one that was recorded last.
 void keepRemembered(const std::string& path)
@@ -198,7 +199,7 @@ void keepRemembered(const std::string& path)
     media::Loudness loudness;
     {
         struct stat status { };
-        const std::lock_guard lock(rememberedMutex);
+        const platform::Lock lock(rememberedMutex);
         if (rememberedInode == 0 || ::stat(path.c_str(), &status) != 0 || status.st_ino != rememberedInode)
             return;
         rememberedInode = 0;
@@ -235,7 +236,7 @@ void refill(Connection& held)
 void openNow(Connection& held)
 {
     {
-        const std::lock_guard lock(held.mutex);
+        const platform::Lock lock(held.mutex);
         held.database.open();
         if (held.database.takeReplaced())
             refill(held);
@@ -298,7 +299,7 @@ Loudness cachedLoudness(const std::string& path)
 
 void rememberLoudness(uint64_t inode, Loudness loudness)
 {
-    const std::lock_guard lock(rememberedMutex);
+    const platform::Lock lock(rememberedMutex);
     rememberedInode = inode;
     remembered = std::move(loudness);
 }
@@ -324,7 +325,7 @@ extern "C" {
 
 int media_content_connect(void)
 {
-    const std::lock_guard lock(connectionMutex);
+    const platform::Lock lock(connectionMutex);
     if (connectionCount++ > 0)
         return MEDIA_CONTENT_ERROR_NONE;
     connection = std::make_shared<Connection>(databasePath());
@@ -336,7 +337,7 @@ int media_content_connect(void)
 int media_content_disconnect(void)
 {
     std::shared_ptr<Connection> last; // declared first, destroyed after the lock: it waits for its opener
-    const std::lock_guard lock(connectionMutex);
+    const platform::Lock lock(connectionMutex);
     if (connectionCount == 0)
         return MEDIA_CONTENT_ERROR_INVALID_OPERATION;
     if (--connectionCount == 0)

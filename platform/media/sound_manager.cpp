@@ -1,3 +1,4 @@
+#include <Mutex.h>
 #include <sound_manager.h>
 
 #include "host/PulseWatch.h"
@@ -5,7 +6,6 @@
 #include <MainLoopMailbox.h>
 
 #include <memory>
-#include <mutex>
 #include <new>
 
 struct sound_multi_session_s { };
@@ -49,10 +49,10 @@ private:
     int _listener = 0;
 };
 
-std::mutex notifierMutex;
+platform::Mutex notifierMutex;
 
-// Guarded by notifierMutex. Made after the watch, so that it goes before it at the end of the process.
-std::unique_ptr<RouteNotifier>& notifier()
+// Made after the watch, so that it goes before it at the end of the process.
+std::unique_ptr<RouteNotifier>& notifier() REQUIRES(notifierMutex)
 {
     (void)host::PulseWatch::instance();
     static std::unique_ptr<RouteNotifier> current;
@@ -129,7 +129,7 @@ int sound_manager_set_active_device_changed_cb(sound_manager_active_device_chang
 {
     if (callback == nullptr)
         return SOUND_MANAGER_ERROR_INVALID_PARAMETER;
-    const std::scoped_lock lock(notifierMutex);
+    const platform::Lock lock(notifierMutex);
     notifier().reset();
     notifier() = std::make_unique<RouteNotifier>(callback, user_data);
     return SOUND_MANAGER_ERROR_NONE;
@@ -137,7 +137,7 @@ int sound_manager_set_active_device_changed_cb(sound_manager_active_device_chang
 
 int sound_manager_unset_active_device_changed_cb(void)
 {
-    const std::scoped_lock lock(notifierMutex);
+    const platform::Lock lock(notifierMutex);
     notifier().reset();
     return SOUND_MANAGER_ERROR_NONE;
 }

@@ -1,3 +1,4 @@
+#include <Mutex.h>
 #include <video_edit.h>
 
 #include <dlog.h>
@@ -7,7 +8,6 @@
 #include <atomic>
 #include <cerrno>
 #include <memory>
-#include <mutex>
 #include <optional>
 #include <thread>
 #include <utility>
@@ -43,7 +43,7 @@ class Engine {
 public:
     int init()
     {
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         if (_state != VIDEO_EDIT_STATE_NONE)
             return VIDEO_EDIT_ERROR_INVALID_STATE;
         _state = VIDEO_EDIT_STATE_INITIALIZED;
@@ -53,7 +53,7 @@ public:
     int deinit()
     {
         cancel();
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         if (std::exchange(_state, VIDEO_EDIT_STATE_NONE) == VIDEO_EDIT_STATE_NONE)
             return VIDEO_EDIT_ERROR_INVALID_STATE;
         _cut.reset();
@@ -64,7 +64,7 @@ public:
 
     int prepare(const video_edit_clip_s& clip)
     {
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         if (_state != VIDEO_EDIT_STATE_INITIALIZED)
             return VIDEO_EDIT_ERROR_INVALID_STATE;
         int error = 0;
@@ -79,7 +79,7 @@ public:
     int unprepare()
     {
         join();
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         if (_state == VIDEO_EDIT_STATE_NONE || _state == VIDEO_EDIT_STATE_INITIALIZED)
             return VIDEO_EDIT_ERROR_INVALID_STATE;
         _cut.reset();
@@ -89,7 +89,7 @@ public:
 
     int start(const char* path)
     {
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         if (_state != VIDEO_EDIT_STATE_PREPARED)
             return VIDEO_EDIT_ERROR_INVALID_STATE;
         media::FileDescriptor target(::open(path, O_RDWR | O_CLOEXEC | O_NOFOLLOW));
@@ -106,7 +106,7 @@ public:
     {
         watch.cancelled = true;
         join();
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         if (_state == VIDEO_EDIT_STATE_EXPORTING)
             _state = VIDEO_EDIT_STATE_PREPARED;
         return VIDEO_EDIT_ERROR_NONE;
@@ -121,14 +121,13 @@ private:
     {
         std::thread finished;
         {
-            const std::lock_guard lock(_mutex);
+            const platform::Lock lock(_mutex);
             finished = std::move(_thread);
         }
         if (finished.joinable())
             finished.join();
     }
 
-    // Nothing else touches the cut while its thread runs.
     void _export(int target)
     {
         const int result = toError(_cut->write(_range, target, watch));
@@ -141,18 +140,18 @@ private:
             return;
         }
         {
-            const std::lock_guard lock(_mutex);
+            const platform::Lock lock(_mutex);
             _state = VIDEO_EDIT_STATE_END_OF_STREAM;
         }
         if (const auto callback = stateCallback.load())
             callback(VIDEO_EDIT_STATE_END_OF_STREAM);
     }
 
-    std::mutex _mutex; // guards what follows
-    int _state = VIDEO_EDIT_STATE_NONE;
-    std::unique_ptr<media::SoundCut> _cut;
+    platform::Mutex _mutex;
+    int _state GUARDED_BY(_mutex) = VIDEO_EDIT_STATE_NONE;
+    std::thread _thread GUARDED_BY(_mutex);
+    std::unique_ptr<media::SoundCut> _cut; // of the thread while it runs
     media::SoundCut::Range _range;
-    std::thread _thread;
 };
 
 Engine& engine()

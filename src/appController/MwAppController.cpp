@@ -113,7 +113,7 @@ void MwAppController::deinitialize()
         MW_LOGE("player stop failed");
     {
         // A command of the worker is waited for, so the state read here is the final one.
-        const std::lock_guard lock(_commandMutex);
+        const platform::Lock lock(_commandMutex);
         const int recorderState = _model->getRecorderState();
         const bool records
             = recorderState == MwRecorder::REC_STATE_RECORDING || recorderState == MwRecorder::REC_STATE_PAUSED;
@@ -202,7 +202,7 @@ bool MwAppController::_createRecorder()
 
 bool MwAppController::_destroyRecorder()
 {
-    const std::lock_guard lock(_commandMutex);
+    const platform::Lock lock(_commandMutex);
     if (!_recorder)
         return false;
     mwForget(_recorder->errorSignal, _recorderErrorListener);
@@ -230,7 +230,7 @@ bool MwAppController::_createPlayer()
 
 bool MwAppController::_destroyPlayer()
 {
-    const std::lock_guard lock(_commandMutex);
+    const platform::Lock lock(_commandMutex);
     if (!_player)
         return false;
     mwForget(_player->getCompletedSignal(), _playerCompletedListener);
@@ -337,6 +337,6 @@ void MwAppController::openRecordings()
 
 std::string MwAppController::getLastSavedPath() const
 {
-    const std::lock_guard lock(_commandMutex);
+    const platform::Lock lock(_commandMutex);
     return _lastSavedPath;
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <MainLoopMailbox.h>
+#include <Mutex.h>
 #include <media_key.h>
 #include <panekit/WTimer.h>
 #include <player.h>
@@ -8,7 +9,6 @@
 
 #include <functional>
 #include <memory>
-#include <mutex>
 #include <string>
 
 #include "MwPlayer.h"
@@ -207,7 +207,7 @@ private:
     platform::MainLoopMailbox _mailbox;
     std::function<void()> _recordingsOpener;
     // Held for the whole execution of a command, by whichever thread executes it.
-    mutable std::recursive_mutex _commandMutex;
+    mutable platform::RecursiveMutex _commandMutex;
     std::string _lastSavedPath; // of this process; empty while or after one that was not saved
     bool _wasDiscarded = false; // the last recording of this process
     std::string _stopReason; // identifier of the message that says why a recording ended by itself

@@ -14,7 +14,7 @@ constexpr unsigned long long SHORTEST_RECORDING_MS = 1000;
 bool MwAppController::dispatchCommand(Command command)
 {
     // The main loop waits for the worker's running command here, and the worker for a command of the main loop.
-    const std::lock_guard lock(_commandMutex);
+    const platform::Lock lock(_commandMutex);
     MW_LOGI("BEGIN - command[%d]", static_cast<int>(command));
     if (!_recorder) {
         MW_LOGE("recorder is nullptr");

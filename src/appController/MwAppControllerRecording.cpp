@@ -428,7 +428,7 @@ void MwAppController::_stoppedByItself(Result result)
 void MwAppController::_pauseInRequestMode()
 {
     {
-        const std::lock_guard lock(_commandMutex);
+        const platform::Lock lock(_commandMutex);
         if (isRecordingOrPaused(*_model)) {
             _ungrabMediaKey();
             if (!_stopRecording(false))

@@ -2,7 +2,7 @@
 
 #include "MwLog.h"
 
-MwAppController::AsyncCmdControl::AsyncCmdControl(std::recursive_mutex& commandMutex, Execute execute)
+MwAppController::AsyncCmdControl::AsyncCmdControl(platform::RecursiveMutex& commandMutex, Execute execute)
     : _mutex(commandMutex)
     , _execute(std::move(execute))
     , _thread([this] { _work(); })
@@ -12,7 +12,7 @@ MwAppController::AsyncCmdControl::AsyncCmdControl(std::recursive_mutex& commandM
 MwAppController::AsyncCmdControl::~AsyncCmdControl()
 {
     {
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         auto request = std::make_unique<AsyncRequest>();
         request->exit = true;
         _queue.push_back(std::move(request));
@@ -23,7 +23,7 @@ MwAppController::AsyncCmdControl::~AsyncCmdControl()
 
 void MwAppController::AsyncCmdControl::queue(std::unique_ptr<AsyncRequest> request)
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
     if (!_queue.empty() && !_queue.front()->exit && _queue.front()->command == request->command) {
         MW_LOGI("same as previous command. so skip this");
         return;
@@ -35,9 +35,9 @@ void MwAppController::AsyncCmdControl::queue(std::unique_ptr<AsyncRequest> reque
 void MwAppController::AsyncCmdControl::_work()
 {
     MW_LOGI("async command control worker callback");
-    std::unique_lock lock(_mutex);
+    platform::Lock lock(_mutex);
     for (;;) {
-        _condition.wait(lock, [this] { return !_queue.empty(); });
+        _condition.wait(lock, [this]() REQUIRES(_mutex) { return !_queue.empty(); });
         std::unique_ptr<AsyncRequest> request = std::move(_queue.front());
         _queue.pop_front();
         if (request->exit) {

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <Mutex.h>
+
 #include <condition_variable>
 #include <deque>
 #include <memory>
@@ -21,7 +23,7 @@ class MwAppController::AsyncCmdControl {
 public:
     using Execute = std::function<void(std::unique_ptr<AsyncRequest> request)>;
 
-    AsyncCmdControl(std::recursive_mutex& commandMutex, Execute execute);
+    AsyncCmdControl(platform::RecursiveMutex& commandMutex, Execute execute);
     // Executes what is queued, then ends the thread.
     ~AsyncCmdControl();
     AsyncCmdControl(const AsyncCmdControl&) = delete;
@@ -33,9 +35,9 @@ public:
 private:
     void _work();
 
-    std::recursive_mutex& _mutex;
+    platform::RecursiveMutex& _mutex;
     Execute _execute;
     std::condition_variable_any _condition;
-    std::deque<std::unique_ptr<AsyncRequest>> _queue;
+    std::deque<std::unique_ptr<AsyncRequest>> _queue GUARDED_BY(_mutex);
     std::thread _thread;
 };

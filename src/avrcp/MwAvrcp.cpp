@@ -48,7 +48,7 @@ void MwAvrcp::setAvrcpState(int state)
 
 void MwAvrcp::_queue(int command)
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
     _commandQueue.push_back(command);
     _condition.notify_one();
 }
@@ -86,9 +86,9 @@ void MwAvrcp::_stopService()
 
 void MwAvrcp::_handleCommands()
 {
-    std::unique_lock lock(_mutex);
+    platform::Lock lock(_mutex);
     for (;;) {
-        _condition.wait(lock, [this] { return !_commandQueue.empty(); });
+        _condition.wait(lock, [this]() REQUIRES(_mutex) { return !_commandQueue.empty(); });
         const int command = _commandQueue.front();
         _commandQueue.pop_front();
         lock.unlock();

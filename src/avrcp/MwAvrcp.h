@@ -1,8 +1,9 @@
 #pragma once
 
+#include <Mutex.h>
+
 #include <condition_variable>
 #include <deque>
-#include <mutex>
 #include <thread>
 
 // Shows remote controls whether playback is stopped, playing or paused. The service may block, so it is called on a
@@ -31,7 +32,7 @@ private:
     static void _connectionStateChangedCb(bool connected, const char* remoteAddress, void* userData);
 
     std::thread _thread;
-    std::mutex _mutex; // guards _commandQueue
-    std::condition_variable _condition;
-    std::deque<int> _commandQueue;
+    platform::Mutex _mutex;
+    std::condition_variable_any _condition;
+    std::deque<int> _commandQueue GUARDED_BY(_mutex);
 };

@@ -205,13 +205,13 @@ bool _MwPlayerImpl::_setPlayPosition(int milliseconds)
 
 bool _MwPlayerImpl::_isSeeking()
 {
-    const std::lock_guard lock(_seekingMutex);
+    const platform::Lock lock(_seekingMutex);
     return _seeking;
 }
 
 void _MwPlayerImpl::_setSeeking(bool seeking)
 {
-    const std::lock_guard lock(_seekingMutex);
+    const platform::Lock lock(_seekingMutex);
     _seeking = seeking;
 }
 

@@ -1,8 +1,8 @@
 #pragma once
 
-#include <panekit/WTimer.h>
+#include <Mutex.h>
 
-#include <mutex>
+#include <panekit/WTimer.h>
 
 #include "MwPlayer.h"
 
@@ -49,6 +49,6 @@ private:
     static void _seekCompletedCb(void* userData);
 
     panekit::WTimer::Weak _playerTimer;
-    bool _seeking = false;
-    std::mutex _seekingMutex; // guards _seeking: the seek-completed callback may come from another thread
+    platform::Mutex _seekingMutex; // the seek-completed callback may come from another thread
+    bool _seeking GUARDED_BY(_seekingMutex) = false;
 };

@@ -1,11 +1,11 @@
 #include "MwSystemMgr.h"
 
+#include <Mutex.h>
 #include <storage.h>
 #include <system_info.h>
 
 #include <array>
 #include <memory>
-#include <mutex>
 
 #include "MwLog.h"
 #include "MwModel.h"
@@ -29,32 +29,23 @@ constexpr std::array<ModelType, 3> MODEL_TYPES = {{
     {.name = "QX-A210F", .code = 3},
 }};
 
-std::unique_ptr<MwSystemMgr>& instance()
-{
-    static std::unique_ptr<MwSystemMgr> manager;
-    return manager;
-}
-
-std::mutex& instanceMutex()
-{
-    static std::mutex mutex;
-    return mutex;
-}
+platform::Mutex instanceMutex;
+std::unique_ptr<MwSystemMgr> instance GUARDED_BY(instanceMutex);
 
 }
 
 MwSystemMgr* MwSystemMgr::getInstance()
 {
-    const std::lock_guard lock(instanceMutex());
-    if (!instance())
-        instance() = std::make_unique<MwSystemMgr>();
-    return instance().get();
+    const platform::Lock lock(instanceMutex);
+    if (!instance)
+        instance = std::make_unique<MwSystemMgr>();
+    return instance.get();
 }
 
 void MwSystemMgr::destroyInstance()
 {
-    const std::lock_guard lock(instanceMutex());
-    instance().reset();
+    const platform::Lock lock(instanceMutex);
+    instance.reset();
 }
 
 bool MwSystemMgr::initialize(MwModel* model)
