@@ -123,7 +123,7 @@ void measureDelete(const std::string& parent, int count)
         commit.push_back(timeOf([&] { MwMediaRow::remove(files.ids); }));
         files = writeRecordings(directory, count);
         own.push_back(timeOf([&] {
-            MwFileDeleter deleter;
+            MwFileDeleter deleter(false);
             for (size_t i = 0; i < files.paths.size(); ++i)
                 deleter.remove(files.paths[i], files.ids.at(i));
             (void)deleter.finish();

@@ -7,17 +7,16 @@
 #include <panekit/WNaviframeController.h>
 #include <storage.h>
 
-#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <string>
-#include <sys/select.h>
 #include <thread>
 
 #include "MwRecordingsContentViewController.h"
 #include "bench/Engines.h"
+#include "bench/LoopHold.h"
 #include "support/RunUntil.h"
 #include "support/Screen.h"
 #include "ui/UiEnvironment.h"
@@ -26,45 +25,16 @@ namespace {
 
 constexpr double PATIENCE = 60; // seconds
 
-// Since when the main loop has not waited, by the clock and in its thread's own time.
-double awake = 0;
-double awakeCpu = 0;
-double longest = 0;
-double longestCpu = 0;
-
-double cpuMilliseconds()
-{
-    timespec time{};
-    clock_gettime(CLOCK_THREAD_CPUTIME_ID, &time);
-    return static_cast<double>(time.tv_sec) * 1000 + static_cast<double>(time.tv_nsec) / 1e6;
-}
-
-void wake()
-{
-    awake = bench::milliseconds();
-    awakeCpu = cpuMilliseconds();
-}
-
-int waitingSelect(int count, fd_set* read, fd_set* write, fd_set* except, timeval* timeout)
-{
-    longest = std::max(longest, bench::milliseconds() - awake);
-    longestCpu = std::max(longestCpu, cpuMilliseconds() - awakeCpu);
-    const int result = ::select(count, read, write, except, timeout);
-    wake();
-    return result;
-}
-
 template <typename Work, typename Done>
 void measure(const char* what, const Work& work, const Done& isDone)
 {
     support::runFor(1.5);
-    wake();
-    longest = 0;
-    longestCpu = 0;
+    bench::LoopHold::restart();
     work();
     const bool done = support::runUntil(isDone, PATIENCE);
     support::runFor(1.5);
-    std::printf("%s %.1f ms, of it working %.1f ms%s\n", what, longest, longestCpu, done ? "" : " (not done)");
+    std::printf("%s %.1f ms, of it working %.1f ms%s\n", what, bench::LoopHold::longest(),
+        bench::LoopHold::longestCpu(), done ? "" : " (not done)");
 }
 
 class BottomScreen : public panekit::WContentViewController {
@@ -156,7 +126,7 @@ int main(int argc, char** argv)
     const unsigned int count = argc > 1 ? static_cast<unsigned int>(std::atoi(argv[1])) : 10000;
     const ui::Environment environment(argc, argv);
     Place place;
-    ecore_main_loop_select_func_set(waitingSelect);
+    bench::LoopHold::install();
     std::thread other;
     measure(
         "files arrive", [&] { other = std::thread(writeFiles, count); }, [&] { return place.rows() == count; });

@@ -1,5 +1,5 @@
 // The least Elementary program there is: a window with one button. Prints "first frame" when it has drawn it, then
-// stays.
+// stays. With an argument it covers the screen.
 #include <Efreet.h>
 #include <Elementary.h>
 
@@ -31,6 +31,7 @@ int main(int argc, char** argv)
     evas_object_show(button);
     evas_event_callback_add(evas_object_evas_get(window), EVAS_CALLBACK_RENDER_POST, renderedCb, nullptr);
     evas_object_resize(window, 360, 640);
+    elm_win_fullscreen_set(window, argc > 1);
     evas_object_show(window);
     elm_run();
     elm_shutdown();

@@ -12,10 +12,10 @@
 
 namespace bench {
 
-// The toolkit with its buffer engine at a scale.
-inline void initToolkit(int argc, char** argv, double scale)
+// The toolkit at a scale.
+inline void initToolkit(int argc, char** argv, double scale, const char* engine = "buffer")
 {
-    ::setenv("ELM_ENGINE", "buffer", 1);
+    ::setenv("ELM_ENGINE", engine, 1);
     efreet_cache_disable();
     ecore_app_no_system_modules();
     elm_init(argc, argv);
@@ -31,13 +31,19 @@ inline std::string resource(const char* name)
     return path;
 }
 
-// A window with the application's look, and in it a layout that panels dock in.
-inline Evas_Object* openWindow(int width, int height)
+// The application's look.
+inline void loadLook()
 {
     MwResourceMgr::getInstance()->initialize();
     elm_theme_extension_add(nullptr, resource("edje/MwButton.edj").c_str());
     uxt_theme_set_color_table(
         uxt_theme_add_color_table(resource("tables/com.tovanic.mewlo-lite_ChangeableColorInfo.xml").c_str()));
+}
+
+// A window with that look, and in it a layout that panels dock in.
+inline Evas_Object* openWindow(int width, int height)
+{
+    loadLook();
     Evas_Object* window = elm_win_util_standard_add("bench", "bench");
     evas_object_resize(window, width, height);
     Evas_Object* host = elm_layout_add(window);

@@ -22,6 +22,8 @@ namespace {
     constexpr int DESIGN_WIDTH = 720;
     constexpr int DESIGN_HEIGHT = 1280;
     constexpr double DESKTOP_SCALE = 1.3;
+    constexpr double FRAME_TIME = 1.0 / 60; // seconds
+    constexpr double HIDDEN_FRAME_TIME = 0.1; // of all windows of the program
 
     WWindowController* instance = nullptr;
 
@@ -72,8 +74,9 @@ namespace {
 
 // Follows the window manager's word on whether the window is minimised.
 struct WWindowController::Watch {
-    explicit Watch(Ecore_X_Window id)
-        : window(id)
+    explicit Watch(Evas_Object* watched)
+        : object(watched)
+        , window(elm_win_xwindow_get(watched))
         , handler(ecore_event_handler_add(ECORE_X_EVENT_WINDOW_PROPERTY, propertyCb, this))
     {
     }
@@ -83,11 +86,21 @@ struct WWindowController::Watch {
 
     static Eina_Bool propertyCb(void* data, int, void* event)
     {
-        const auto* self = static_cast<Watch*>(data);
+        auto* self = static_cast<Watch*>(data);
         const auto* property = static_cast<Ecore_X_Event_Window_Property*>(event);
         if (property->win == self->window && property->atom == ECORE_X_ATOM_NET_WM_STATE)
-            ui_app_set_window_visible(!self->isHidden());
+            self->apply(self->isHidden());
         return ECORE_CALLBACK_PASS_ON;
+    }
+    // The toolkit does not draw a minimised window, yet it wakes for every frame for as long as there is something to
+    // draw; what was to be drawn when it went away is never struck off.
+    void apply(bool hidden)
+    {
+        if (std::exchange(isUndrawn, hidden) != hidden) {
+            hidden ? elm_win_norender_push(object) : elm_win_norender_pop(object);
+            ecore_animator_frametime_set(hidden ? HIDDEN_FRAME_TIME : FRAME_TIME);
+        }
+        ui_app_set_window_visible(!hidden);
     }
     [[nodiscard]] bool isHidden() const
     {
@@ -99,6 +112,8 @@ struct WWindowController::Watch {
         return hidden;
     }
 
+    Evas_Object* object;
+    bool isUndrawn = false;
     Ecore_X_Window window;
     Ecore_Event_Handler* handler;
 };
@@ -158,8 +173,8 @@ void WWindowController::_applySize()
 
 void WWindowController::_watchVisibility()
 {
-    if (const Ecore_X_Window id = elm_win_xwindow_get(_window); id)
-        _watch = std::make_unique<Watch>(id);
+    if (elm_win_xwindow_get(_window) != 0)
+        _watch = std::make_unique<Watch>(_window);
 }
 
 bool WWindowController::attachBaseViewController(WNaviframeController* naviframe)

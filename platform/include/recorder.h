@@ -90,6 +90,9 @@ int recorder_pause(recorder_h recorder);
 int recorder_commit(recorder_h recorder);
 // Ends and deletes the recording.
 int recorder_cancel(recorder_h recorder);
+// Whether somebody watches the recording: without, its status is told five times a second instead of with every bit of
+// sound. For all recorders of the process; true at first.
+void recorder_set_watched(bool watched);
 // The largest peak since the last read, -300 to 0.
 int recorder_get_audio_level(recorder_h recorder, double* level);
 // Whether another recorder captures sound now (with PREFERENCE_STRICT_RECORDERS, any program). Kind 0 is audio, 1 video

@@ -5,12 +5,18 @@
 #include <system_error>
 #include <utility>
 
+#include <sys/inotify.h>
+#include <unistd.h>
+
 namespace media {
 
 namespace {
 
     constexpr double SETTLING_SECONDS = 0.3;
     constexpr double LONGEST_BURST_SECONDS = 1.0;
+    // Not that a file is being written: its end is what counts, and a recording would wake us fifty times a second.
+    constexpr uint32_t EVENTS
+        = IN_CREATE | IN_DELETE | IN_MOVE | IN_CLOSE_WRITE | IN_ATTRIB | IN_DELETE_SELF | IN_MOVE_SELF | IN_ONLYDIR;
 
     // The folder itself, or as long as it does not exist the nearest one above it.
     std::string nearestExisting(const std::string& folder)
@@ -28,7 +34,6 @@ FolderWatch::FolderWatch(std::vector<std::string> folders, std::function<void()>
     : _folders(std::move(folders))
     , _changed(std::move(changed))
 {
-    ecore_file_init();
     _arm();
 }
 
@@ -37,32 +42,37 @@ FolderWatch::~FolderWatch()
     if (_timer != nullptr)
         ecore_timer_del(_timer);
     _disarm();
-    ecore_file_shutdown();
 }
 
 void FolderWatch::_arm()
 {
     _disarm();
+    _inotify = ::inotify_init1(IN_NONBLOCK | IN_CLOEXEC);
+    if (_inotify < 0)
+        return;
     std::set<std::string> places;
     for (const std::string& folder : _folders)
         places.insert(nearestExisting(folder));
-    for (const std::string& place : places) {
-        if (Ecore_File_Monitor* monitor = ecore_file_monitor_add(place.c_str(), _changedCb, this); monitor != nullptr)
-            _monitors.push_back(monitor);
-    }
+    for (const std::string& place : places)
+        (void)::inotify_add_watch(_inotify, place.c_str(), EVENTS);
+    _handler = ecore_main_fd_handler_add(_inotify, ECORE_FD_READ, _changedCb, this, nullptr, nullptr);
 }
 
 void FolderWatch::_disarm()
 {
-    for (Ecore_File_Monitor* monitor : std::exchange(_monitors, {}))
-        ecore_file_monitor_del(monitor);
+    if (_handler != nullptr)
+        ecore_main_fd_handler_del(std::exchange(_handler, nullptr));
+    if (_inotify >= 0)
+        ::close(std::exchange(_inotify, -1));
 }
 
-// A file that is being written announces itself all the time; its end is what counts.
-void FolderWatch::_changedCb(void* data, Ecore_File_Monitor*, Ecore_File_Event event, const char*)
+Eina_Bool FolderWatch::_changedCb(void* data, Ecore_Fd_Handler*)
 {
-    if (event != ECORE_FILE_EVENT_MODIFIED && event != ECORE_FILE_EVENT_NONE)
-        static_cast<FolderWatch*>(data)->_settle();
+    auto* self = static_cast<FolderWatch*>(data);
+    alignas(inotify_event) char events[4096];
+    while (::read(self->_inotify, events, sizeof events) > 0) { }
+    self->_settle();
+    return ECORE_CALLBACK_RENEW;
 }
 
 void FolderWatch::_settle()

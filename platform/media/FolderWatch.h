@@ -1,7 +1,6 @@
 #pragma once
 
 #include <Ecore.h>
-#include <Ecore_File.h>
 
 #include <functional>
 #include <string>
@@ -19,7 +18,7 @@ public:
     FolderWatch& operator=(const FolderWatch&) = delete;
 
 private:
-    static void _changedCb(void* data, Ecore_File_Monitor* monitor, Ecore_File_Event event, const char* path);
+    static Eina_Bool _changedCb(void* data, Ecore_Fd_Handler* handler);
     static Eina_Bool _settledCb(void* data);
     void _arm();
     void _disarm();
@@ -27,7 +26,8 @@ private:
 
     std::vector<std::string> _folders;
     std::function<void()> _changed;
-    std::vector<Ecore_File_Monitor*> _monitors;
+    int _inotify = -1;
+    Ecore_Fd_Handler* _handler = nullptr;
     Ecore_Timer* _timer = nullptr;
     double _firstChange = 0; // when the burst began, seconds
 };

@@ -50,6 +50,7 @@ struct RecorderSettings {
 // it completes the file, makes the recorder ready and only then reports. Nobody here ever waits for the main loop.
 class Recorder {
 public:
+    static void setWatched(bool watched); // of all recorders
     Recorder();
     ~Recorder();
     Recorder(const Recorder&) = delete;
@@ -106,6 +107,7 @@ private:
     const std::shared_ptr<RecorderCallbacks> _callbacks = std::make_shared<RecorderCallbacks>();
     platform::MainLoopMailbox _mailbox;
     std::atomic<recorder_state_e> _state{RECORDER_STATE_CREATED};
+    std::chrono::steady_clock::time_point _lastStatus; // of the thread that sound arrives on
     std::atomic<bool> _isStatusPosted{false}; // one status under way at a time, however fast sound arrives
     std::atomic<bool> _isAnnounced{false}; // the status with elapsed 0 was sent
     std::atomic<bool> _isStorageFailing{false}; // and that was told

@@ -12,6 +12,9 @@ namespace {
 
     constexpr auto TICK = std::chrono::milliseconds(500);
     constexpr int SILENT_TICKS = 4; // two seconds
+    constexpr auto UNWATCHED_STATUS = std::chrono::milliseconds(200);
+
+    std::atomic<bool> isWatched = true;
     constexpr double STALLED_STORAGE_SECONDS = 1.0;
 
 }
@@ -21,11 +24,15 @@ void Recorder::_postStatus(unsigned long long elapsed, unsigned long long size)
     _post([elapsed, size](const RecorderCallbacks& to) { to.status(elapsed, size); });
 }
 
-// A main loop that falls behind gets fewer and newer numbers.
+void Recorder::setWatched(bool watched) { isWatched = watched; }
+
+// A main loop that falls behind gets fewer and newer numbers, and one that nobody watches sleeps.
 void Recorder::_postProgress()
 {
-    if (!_isAnnounced || _isStatusPosted.exchange(true))
+    const auto now = std::chrono::steady_clock::now();
+    if (!_isAnnounced || (!isWatched && now - _lastStatus < UNWATCHED_STATUS) || _isStatusPosted.exchange(true))
         return;
+    _lastStatus = now;
     _mailbox.post([this] {
         _isStatusPosted = false;
         if (const auto recording = _current(); recording)

@@ -202,6 +202,8 @@ int recorder_get_audio_level(recorder_h recorder, double* level)
     return RECORDER_ERROR_NONE;
 }
 
+void recorder_set_watched(bool watched) { media::Recorder::setWatched(watched); }
+
 int recorder_is_in_recording(int kind, bool* in_recording)
 {
     if (in_recording == nullptr)

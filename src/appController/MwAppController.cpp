@@ -4,6 +4,7 @@
 #include <message_port.h>
 #include <panekit/WPopupController.h>
 #include <panekit/WWindowController.h>
+#include <recorder.h>
 
 #include "MwAsyncCmdControl.h"
 #include "MwAvrcp.h"
@@ -245,9 +246,11 @@ void MwAppController::_lifeCycleChanged(MwSignalMgr::LifeCycle lifeCycle)
     MW_LOGI("Life Cycle : [%d]", lifeCycle);
     switch (lifeCycle) {
     case MwSignalMgr::RESUME:
+        recorder_set_watched(true);
         _sendMessagePort();
         break;
     case MwSignalMgr::PAUSE:
+        recorder_set_watched(false);
         if (_model->isRequestMode())
             _pauseInRequestMode();
         else

@@ -2,6 +2,7 @@
 """smoke_test.py ROOT BIN CASE: drives the real recorder in a real window on a virtual display, as its user would."""
 import glob
 import os
+import re
 import shutil
 import signal
 import sqlite3
@@ -114,8 +115,13 @@ def minimised_goes_on_and_close_saves(place):
     check(decoded_ms(recordings(place)[0][0]) > 1300, "all of it")
 
 
+def wakes(process):
+    with open(f"/proc/{process.pid}/status") as status:
+        return int(re.search(r"^voluntary_ctxt_switches:\s+(\d+)", status.read(), re.M).group(1))
+
+
 def surface_controls_what_is_minimised(place):
-    start_recorder(place)
+    recorder = start_recorder(place)
     place.make_noise(20)
     start_recording(place)
     main = place.window()
@@ -123,6 +129,9 @@ def surface_controls_what_is_minimised(place):
     place.call("xdotool", "windowminimize", main)
     place.wait_for("the surface", lambda: place.window() not in (None, main))
     time.sleep(1)
+    before = wakes(recorder)
+    time.sleep(1)
+    check(wakes(recorder) - before < 100, "minimised, it does not wake for every frame and every bit of sound")
     place.click(678, 500)
     place.wait_for("the pause", lambda: place.recorder_state() == "3")
     place.click(678, 500)

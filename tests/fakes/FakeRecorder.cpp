@@ -57,6 +57,7 @@ FAKE(recorder_commit, (recorder_h), recorder.state = RECORDER_STATE_READY; happe
 FAKE(recorder_cancel, (recorder_h), recorder.state = RECORDER_STATE_READY)
 
 FAKE(recorder_get_audio_level, (recorder_h, double* level), *level = recorder.level)
+void recorder_set_watched(bool) { }
 FAKE(recorder_is_in_recording, (int kind, bool* inRecording), *inRecording = recorder.someoneRecords && kind == 0, kind)
 
 int recorder_rescue_leftovers(const char* path, recorder_leftover_cb callback, void* data)
