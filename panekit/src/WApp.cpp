@@ -8,22 +8,6 @@
 
 namespace panekit {
 
-namespace {
-
-    WApp* running = nullptr;
-
-}
-
-WApp::WApp() { running = this; }
-
-WApp::~WApp()
-{
-    if (running == this)
-        running = nullptr;
-}
-
-WApp* WApp::getInstance() { return running; }
-
 int WApp::start(int argc, char** argv)
 {
     WLanguage::initialize();

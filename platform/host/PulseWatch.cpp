@@ -379,14 +379,4 @@ void PulseWatch::removeListener(int id)
     _listeners.erase(id);
 }
 
-void PulseWatch::setEarjackHook(std::function<void(bool inserted)> hook)
-{
-    auto shared = std::make_shared<std::function<void(bool)>>(std::move(hook));
-    addListener([shared](const PulseSnapshot& before, const PulseSnapshot& now) {
-        if (before.isHeadsetPlugged != now.isHeadsetPlugged)
-            (*shared)(now.isHeadsetPlugged);
-    });
-    (*shared)(snapshot().isHeadsetPlugged);
-}
-
 }

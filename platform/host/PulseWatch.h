@@ -50,8 +50,6 @@ public:
     int addListener(Listener listener);
     // No call is running any more when this returns.
     void removeListener(int id);
-    // Told at once and on every change whether a wired headset or headphone is plugged in; on the watch's thread.
-    void setEarjackHook(std::function<void(bool inserted)> hook);
 
 private:
     struct Query;

@@ -40,7 +40,6 @@ void ui_app_close(void);
 void ui_app_set_window_visible(bool visible);
 // The main window, for toasts and key grabs: an Evas_Object*, borrowed, null to forget it.
 void ui_app_set_window(void* window);
-void* ui_app_get_window(void);
 
 // The same without the toolkit and without a window: for companions. They resume at once and never pause.
 int service_app_main(int argc, char** argv, const ui_app_lifecycle_s* lifecycle, void* user_data);

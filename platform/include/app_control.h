@@ -45,7 +45,6 @@ int app_control_get_uri(app_control_h control, char** uri);
 int app_control_set_mime(app_control_h control, const char* mime);
 int app_control_get_mime(app_control_h control, char** mime);
 int app_control_set_app_id(app_control_h control, const char* app_id);
-int app_control_get_app_id(app_control_h control, char** app_id);
 int app_control_set_launch_mode(app_control_h control, app_control_launch_mode_e mode);
 int app_control_add_extra_data(app_control_h control, const char* key, const char* value);
 int app_control_add_extra_data_array(app_control_h control, const char* key, const char* values[], int count);

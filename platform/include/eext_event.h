@@ -10,8 +10,6 @@ typedef void (*Eext_Event_Cb)(void* user_data, Evas_Object* object, void* event_
 extern "C" {
 void eext_object_event_callback_add(
     Evas_Object* object, Eext_Callback_Type type, Eext_Event_Cb callback, void* user_data);
-// Answers the user data, null when it was not registered.
-void* eext_object_event_callback_del(Evas_Object* object, Eext_Callback_Type type, Eext_Event_Cb callback);
 // Call once for every window so that the keys work in it before anything is registered.
 void eext_window_arm(Evas_Object* window);
 }

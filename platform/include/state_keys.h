@@ -14,7 +14,6 @@ int state_keys_watch(state_key_cb callback, void* user_data);
 // A pinned value hides whatever the desktop reports until it is unpinned. 0 is success, -1 failure.
 int state_key_pin(const char* key, const char* value);
 int state_key_unpin(const char* key);
-int state_key_remove(const char* key);
 // Any text, as it stands. Newly allocated (free), null when absent.
 int preference_key_set(const char* key, const char* value);
 char* preference_key_get(const char* key);

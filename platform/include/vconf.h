@@ -31,6 +31,4 @@ int vconf_notify_key_changed(const char* key, vconf_callback_fn callback, void* 
 int vconf_ignore_key_changed(const char* key, vconf_callback_fn callback);
 // The value a callback was called with; 0 when it is no number.
 int vconf_keynode_get_int(const keynode_t* node);
-int vconf_keynode_get_bool(const keynode_t* node);
-const char* vconf_keynode_get_name(const keynode_t* node);
 }

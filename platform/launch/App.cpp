@@ -53,8 +53,6 @@ void ui_app_set_window_visible(bool visible)
 
 void ui_app_set_window(void* window) { platform::setMainWindow(window); }
 
-void* ui_app_get_window(void) { return platform::mainWindow(); }
-
 int app_manager_get_app_context(const char* app_id, app_context_h* context)
 {
     if (app_id == nullptr || context == nullptr || !platform::isAppId(app_id))

@@ -103,14 +103,6 @@ int app_control_set_app_id(app_control_h control, const char* app_id)
     return APP_CONTROL_ERROR_NONE;
 }
 
-int app_control_get_app_id(app_control_h control, char** app_id)
-{
-    if (control == nullptr || app_id == nullptr)
-        return APP_CONTROL_ERROR_INVALID_PARAMETER;
-    *app_id = control->appId.empty() ? nullptr : ::strdup(control->appId.c_str());
-    return *app_id != nullptr ? APP_CONTROL_ERROR_NONE : APP_CONTROL_ERROR_KEY_NOT_FOUND;
-}
-
 int app_control_set_launch_mode(app_control_h control, app_control_launch_mode_e mode)
 {
     return setField(control, "launch-mode", mode == APP_CONTROL_LAUNCH_MODE_GROUP ? "group" : "single");

@@ -161,16 +161,3 @@ void eext_object_event_callback_add(
     evas_object_event_callback_add(object, EVAS_CALLBACK_DEL, objectDeletedCb, nullptr);
     registrations().push_back({object, type, callback, userData});
 }
-
-void* eext_object_event_callback_del(Evas_Object* object, Eext_Callback_Type type, Eext_Event_Cb callback)
-{
-    auto& all = registrations();
-    const auto found = std::find_if(all.begin(), all.end(), [&](const Registration& each) {
-        return each.object == object && each.type == type && each.callback == callback;
-    });
-    if (found == all.end())
-        return nullptr;
-    void* userData = found->userData;
-    all.erase(found);
-    return userData;
-}

@@ -285,8 +285,7 @@ namespace {
         const AvCodec decoder = stream != nullptr ? decoderOf(stream) : nullptr;
         if (!decoder || input->duration <= 0 || decoder->sample_rate <= 0)
             return {};
-        const AVRational samples{1, decoder->sample_rate};
-        LoudnessSum sum(static_cast<uint64_t>(av_rescale_q(input->duration, AV_TIME_BASE_Q, samples)));
+        LoudnessSum sum(static_cast<uint64_t>(av_rescale(input->duration, decoder->sample_rate, AV_TIME_BASE)));
         const AvPacket packet(av_packet_alloc());
         const AvFrame frame(av_frame_alloc());
         int64_t position = 0;

@@ -405,7 +405,7 @@ std::string Mp4Movie::decoderConfig() const
         return {};
     std::string_view bytes = rest->substr(4);
     while (bytes.size() >= 2) {
-        const int tag = bytes[0];
+        const auto tag = static_cast<unsigned char>(bytes[0]);
         size_t size = 0;
         size_t head = 1;
         for (int i = 0; i < 4 && head < bytes.size(); ++i) {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "media/Recording.h"
+#include "media/Slot.h"
 #include <MainLoopMailbox.h>
 #include <Mutex.h>
 
@@ -17,17 +18,6 @@ namespace media {
 
 // The application's callbacks; fetched at the time of the call, on the main loop.
 struct RecorderCallbacks {
-    template <typename Function>
-    struct Slot {
-        Function function = nullptr;
-        void* userData = nullptr;
-        template <typename... Values>
-        void operator()(Values... values) const
-        {
-            if (function != nullptr)
-                function(values..., userData);
-        }
-    };
     Slot<recorder_error_cb> error;
     Slot<recorder_interrupted_cb> interrupted;
     Slot<recorder_state_changed_cb> stateChanged;

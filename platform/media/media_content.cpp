@@ -211,6 +211,7 @@ void keepRemembered(const std::string& path)
 std::vector<media::BookmarkRow> bookmarkRows(const media_bookmark_entry_s* bookmarks, int count)
 {
     std::vector<media::BookmarkRow> rows;
+    rows.reserve(static_cast<size_t>(count));
     for (int i = 0; i < count; ++i)
         rows.push_back({0, bookmarks[i].marked_time, bookmarks[i].name != nullptr ? bookmarks[i].name : ""});
     return rows;

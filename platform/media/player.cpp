@@ -4,6 +4,7 @@
 #include "media/FileDuration.h"
 #include "media/LiveCall.h"
 #include "media/PlayerPipeline.h"
+#include "media/Slot.h"
 #include "state/Keys.h"
 #include "state/Trees.h"
 #include <MainLoopMailbox.h>
@@ -18,21 +19,9 @@
 #include <utility>
 
 using media::PlayerPipeline;
+using media::Slot;
 
 namespace {
-
-template <typename Function>
-struct Slot {
-    Function function = nullptr;
-    void* userData = nullptr;
-
-    template <typename... Values>
-    void operator()(Values... values) const
-    {
-        if (function != nullptr)
-            function(values..., userData);
-    }
-};
 
 player_interrupted_code_e interruptionCode(const host::PulseSnapshot& sound)
 {

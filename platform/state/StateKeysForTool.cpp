@@ -60,8 +60,6 @@ int state_key_pin(const char* key, const char* value)
 
 int state_key_unpin(const char* key) { return statusOf(key != nullptr && stateTree().unpin(key)); }
 
-int state_key_remove(const char* key) { return statusOf(key != nullptr && stateTree().remove(key)); }
-
 int preference_key_set(const char* key, const char* value)
 {
     return statusOf(key != nullptr && value != nullptr && preferenceTree().write(key, value));

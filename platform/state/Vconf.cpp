@@ -8,7 +8,6 @@
 #include <vector>
 
 struct keynode_s {
-    std::string key;
     std::optional<std::string> value;
 };
 
@@ -92,7 +91,7 @@ int vconf_notify_key_changed(const char* key, vconf_callback_fn callback, void* 
     if (key == nullptr || *key == '\0' || callback == nullptr)
         return FAILURE;
     const auto watch = stateTree().watch(key, [callback, user_data](const std::string& changed) {
-        keynode_s node{changed, stateTree().read(changed)};
+        keynode_s node{stateTree().read(changed)};
         callback(&node, user_data);
     });
     if (watch == 0)
@@ -121,10 +120,3 @@ int vconf_keynode_get_int(const keynode_t* node)
         return 0;
     return platform::parseInt(node->value).value_or(platform::parseBool(node->value).value_or(false) ? 1 : 0);
 }
-
-int vconf_keynode_get_bool(const keynode_t* node)
-{
-    return node != nullptr && platform::parseBool(node->value).value_or(vconf_keynode_get_int(node) != 0) ? 1 : 0;
-}
-
-const char* vconf_keynode_get_name(const keynode_t* node) { return node != nullptr ? node->key.c_str() : nullptr; }

@@ -56,6 +56,7 @@ std::vector<MwSavedBookmark> mwReadBookmarks(const std::string& mediaId, MwBookm
 int mwInsertBookmarks(const std::string& mediaId, const std::vector<MwBookmark>& bookmarks)
 {
     std::vector<media_bookmark_entry_s> entries;
+    entries.reserve(bookmarks.size());
     for (const MwBookmark& bookmark : bookmarks)
         entries.push_back({bookmark.markedTime, bookmark.name.c_str()});
     return media_bookmark_insert_missing_to_db(mediaId.c_str(), entries.data(), static_cast<int>(entries.size()));

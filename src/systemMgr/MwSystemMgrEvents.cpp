@@ -38,7 +38,7 @@ const std::array<MwSystemMgr::KeyWatch, 8>& MwSystemMgr::_keyWatches()
 {
 #define WATCH(name, function)                                                                                          \
     {                                                                                                                  \
-        .key = name, .callback = function, .failure = "vconf_notify_key_changed(" #name ") failed"                     \
+        .key = (name), .callback = (function), .failure = "vconf_notify_key_changed(" #name ") failed"                 \
     }
     static const std::array<KeyWatch, 8> watches = {{
         WATCH(VCONFKEY_SYSMAN_MMC_STATUS, _mmcStatusChangedCb),

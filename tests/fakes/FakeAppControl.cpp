@@ -67,7 +67,6 @@ void ui_app_exit(void) { fakes::answer(__func__); }
 void ui_app_close(void) { fakes::answer(__func__); }
 void ui_app_set_window_visible(bool visible) { fakes::answer(__func__, visible); }
 void ui_app_set_window(void* object) { window = object; }
-void* ui_app_get_window(void) { return window; }
 
 int app_control_create(app_control_h* control)
 {

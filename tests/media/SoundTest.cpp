@@ -46,8 +46,9 @@ TEST_F(SoundTest, FollowsTheRouteAndTheEarjack)
     earjack = -1;
     static std::vector<sound_device_out_e> routes;
     routes.clear();
-    host::PulseWatch::instance().setEarjackHook([](bool isInserted) { earjack = isInserted ? 1 : 0; });
-    EXPECT_TRUE(runUntil([] { return earjack == 0; }));
+    EXPECT_FALSE(host::PulseWatch::instance().refresh().isHeadsetPlugged);
+    host::PulseWatch::instance().addListener(
+        [](const auto&, const auto& now) { earjack = now.isHeadsetPlugged ? 1 : 0; });
     ASSERT_EQ(0,
         sound_manager_set_active_device_changed_cb(
             [](sound_device_in_e, sound_device_out_e out, void*) { routes.push_back(out); }, nullptr));

@@ -68,16 +68,9 @@ TEST_F(KeyTest, TheLastRegisteredVisibleObjectWins)
     EXPECT_EQ(2, upper.back);
 }
 
-TEST_F(KeyTest, RegistrationsEndAndCallbacksMayEndThemAll)
+TEST_F(KeyTest, RegistrationsEndWithTheirObject)
 {
     Presses presses;
-    eext_object_event_callback_add(_upper, EEXT_CALLBACK_BACK, countBack, &presses);
-    EXPECT_EQ(nullptr, eext_object_event_callback_del(_upper, EEXT_CALLBACK_MORE, countBack));
-    EXPECT_EQ(&presses, eext_object_event_callback_del(_upper, EEXT_CALLBACK_BACK, countBack));
-    EXPECT_EQ(nullptr, eext_object_event_callback_del(_upper, EEXT_CALLBACK_BACK, countBack));
-    support::key(_window, "Escape");
-    EXPECT_EQ(0, presses.back);
-
     const auto deleteObject = [](void*, Evas_Object* object, void*) { evas_object_del(object); };
     eext_object_event_callback_add(_upper, EEXT_CALLBACK_BACK, deleteObject, nullptr);
     eext_object_event_callback_add(_upper, EEXT_CALLBACK_BACK, countBack, &presses);

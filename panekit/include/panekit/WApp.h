@@ -12,13 +12,12 @@ class WWindowController;
 // main loop.
 class WApp {
 public:
-    WApp();
-    virtual ~WApp();
+    WApp() = default;
+    virtual ~WApp() = default;
     WApp(const WApp&) = delete;
     WApp& operator=(const WApp&) = delete;
 
     int start(int argc, char** argv);
-    static WApp* getInstance();
 
     // Creates the window and keeps the controller until the process ends.
     bool attachWindow(std::unique_ptr<WWindowController> window);

@@ -39,8 +39,6 @@ public:
     void complete(Callback onSeen);
     // Of the question: writes its text again, for another language.
     void setClashName(const std::string& fileName);
-    [[nodiscard]] bool isMoving() const { return _progressBar != nullptr; }
-    [[nodiscard]] bool isClash() const { return _clashLayout != nullptr; }
 
 private:
     void _show(panekit::WPopupController* popup, const char* name);

@@ -86,7 +86,8 @@ MwTrimBookmarkWidget::Mark MwTrimBookmarkWidget::place(
     const Eina_Rectangle& area, const Sizes& sizes, unsigned int second, unsigned int duration)
 {
     const double ratio = duration > 0 ? second * 1000.0 / duration : 0.0;
-    const int x = static_cast<int>(area.x - sizes.iconWidth / 2 + area.w * ratio);
+    const int middle = area.x - sizes.iconWidth / 2;
+    const int x = static_cast<int>(middle + area.w * ratio);
     const int y = area.y + (area.h + sizes.iconHeight) / 2 - sizes.iconHeight;
     return {{x, y, sizes.iconWidth, sizes.iconHeight},
         {x + sizes.iconWidth / 2, y + sizes.iconHeight + sizes.gap, sizes.gap, sizes.lineHeight}};

@@ -182,7 +182,8 @@ MwTrimWaveform::Bars MwTrimWaveform::barsOf(const uint32_t* samples, size_t coun
             uint64_t sum = 0;
             for (size_t i = group * bar; i < group * (bar + 1); ++i)
                 sum += samples[i];
-            bars[bar] = static_cast<double>(sum / group);
+            const uint64_t mean = sum / group;
+            bars[bar] = static_cast<double>(mean);
         }
     }
     const double largest = *std::max_element(bars.begin(), bars.end());

@@ -33,7 +33,6 @@ public:
 
     // The colours or the place have changed.
     void _updateWaveform();
-    [[nodiscard]] Evas_Object* getImage() const { return _image; }
     [[nodiscard]] const Bars& getBars() const { return _bars; }
     // Whether the exact look has come, or none ever will.
     [[nodiscard]] bool isComplete() const { return _reading == nullptr; }
