@@ -13,7 +13,6 @@
 
 namespace {
 
-constexpr auto KEY_OPEN = "memory/setting/personal";
 constexpr mode_t OWNER_ONLY = 0700;
 
 std::string extra(app_control_h request, const char* key)
@@ -36,8 +35,8 @@ bool isUsable(const std::string& root)
 bool execute(const std::string& value)
 {
     if (value == "on")
-        return isUsable(storage_private_root()) && vconf_set_bool(KEY_OPEN, 1) == 0;
-    return value == "off" && vconf_set_bool(KEY_OPEN, 0) == 0;
+        return isUsable(storage_private_root()) && vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, 1) == 0;
+    return value == "off" && vconf_set_bool(VCONFKEY_PRIVATE_STORAGE_OPEN, 0) == 0;
 }
 
 void control(app_control_h request, bool, void*)

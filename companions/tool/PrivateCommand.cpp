@@ -10,13 +10,13 @@
 
 namespace {
 
-constexpr auto KEY_METHOD = "db/setting/personal_unlock_method"; // 0: not set up
 constexpr mode_t OWNER_ONLY = 0700;
 
 // Remembered for later sessions; the key, which the recorder reads, tells this one.
 int remember(int method)
 {
-    if (preference_set_int(PREFERENCE_PRIVATE_METHOD, method) == 0 && vconf_set_int(KEY_METHOD, method) == 0)
+    if (preference_set_int(PREFERENCE_PRIVATE_METHOD, method) == 0
+        && vconf_set_int(platform::KEY_PRIVATE_METHOD, method) == 0)
         return tool::OK;
     std::fputs("mewlo-tool: the choice cannot be stored\n", stderr);
     return tool::FAILED;

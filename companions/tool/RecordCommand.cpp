@@ -8,6 +8,7 @@
 #include <panekit/WLanguage.h>
 #include <panekit/WTimer.h>
 #include <panekit/WWindowController.h>
+#include <recorder.h>
 
 #include <cstdio>
 #include <cstdlib>
@@ -77,8 +78,8 @@ void useAmr(MwModel& model)
 {
     model.setAudioCodec(MwModel::CODEC_AMR);
     model.setFileFormat(MwModel::FORMAT_AMR);
-    model.setSampleRate(8000);
-    model.setBitRate(12200);
+    model.setSampleRate(RECORDER_AMR_SAMPLE_RATE);
+    model.setBitRate(RECORDER_AMR_BIT_RATE);
 }
 
 // Ends the loop after the time, at a signal, or when the recording ended by itself.

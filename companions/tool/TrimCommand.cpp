@@ -11,6 +11,7 @@
 #include <limits>
 #include <optional>
 
+#include "MwFileName.h"
 #include "MwHandle.h"
 #include "MwText.h"
 #include "MwTrim.h"
@@ -131,7 +132,7 @@ int tool::trim(const Arguments& arguments)
         return complain("the end must lie behind the beginning");
     if (const auto length = lengthOf(file); length && *end > *length)
         return complain(mwFormat("the recording ends after %d.%03d s", *length / 1000, *length % 1000));
-    if (given.find('/') != std::string::npos || given == "." || given == "..")
+    if (!given.empty() && !mwIsFileName(given, file.extension()))
         return complain(given + " is no name of a file: the result lies beside the recording");
     std::string name = given;
     if (!name.empty() && std::filesystem::path(name).extension() != file.extension())

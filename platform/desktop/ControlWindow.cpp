@@ -4,10 +4,10 @@
 #include "device.h"
 #include "launch/Toolkit.h"
 #include "preference.h"
-#include "state/Keys.h"
 #include "state/Trees.h"
 #include "vconf.h"
 #include <MainLoop.h>
+#include <StateKeys.h>
 
 #include <Ecore_Input.h>
 #include <Elementary.h>

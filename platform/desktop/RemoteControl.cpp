@@ -2,9 +2,9 @@
 
 #include "app.h"
 #include "launch/Toolkit.h"
-#include "state/Keys.h"
 #include "state/Trees.h"
 #include <MainLoop.h>
+#include <StateKeys.h>
 
 #include <atomic>
 #include <utility>
@@ -74,8 +74,8 @@ void RemoteControl::reserve(media_key_event_cb callback, void* userData)
             host::Mpris::Handlers{[this](const std::string& method) { _called(method); },
                 [this] { return _playback.position(_playbackData); },
                 [this](int milliseconds) { _playback.seek(milliseconds, _playbackData); }});
-    _recorderWatch = stateTree().watch(KEY_RECORDER_STATE, [this](const std::string&) { _update(); });
-    _titleWatch = stateTree().watch(KEY_TITLE, [this](const std::string&) { _update(); });
+    _recorderWatch = stateTree().watch(VCONFKEY_MEWLO_RECORDER_STATE, [this](const std::string&) { _update(); });
+    _titleWatch = stateTree().watch(VCONFKEY_MEWLO_TITLE, [this](const std::string&) { _update(); });
     _update();
 }
 
@@ -136,7 +136,7 @@ host::Mpris::State RemoteControl::_recorderState(int recorder) const
 {
     host::Mpris::State state;
     state.status = recorder == RECORDING ? "Playing" : "Paused";
-    state.title = stateTree().read(KEY_TITLE).value_or("");
+    state.title = stateTree().read(VCONFKEY_MEWLO_TITLE).value_or("");
     state.canSkip = false;
     state.hasPosition = _playback.position != nullptr;
     return state;
@@ -150,7 +150,7 @@ host::Mpris::State RemoteControl::_playerState() const
     remote_player_track_s track{};
     if (_player == BT_AVRCP_PLAYER_STATE_STOPPED || _playback.track == nullptr
         || !_playback.track(&track, _playbackData)) {
-        state.title = stateTree().read(KEY_TITLE).value_or("");
+        state.title = stateTree().read(VCONFKEY_MEWLO_TITLE).value_or("");
         return state;
     }
     state.title = track.title;
@@ -164,7 +164,7 @@ void RemoteControl::_update()
 {
     if (_mpris == nullptr)
         return;
-    const int recorder = stateInt(KEY_RECORDER_STATE).value_or(0);
+    const int recorder = stateInt(VCONFKEY_MEWLO_RECORDER_STATE).value_or(0);
     const bool records = recorder == RECORDING || recorder == RECORDING_PAUSED;
     _mpris->setState(records ? _recorderState(recorder) : _playerState());
 }

@@ -1,8 +1,8 @@
 #include "callmgr.h"
 
 #include "host/PulseWatch.h"
-#include "state/Keys.h"
 #include "state/Trees.h"
+#include <StateKeys.h>
 
 struct cm_client_s { };
 

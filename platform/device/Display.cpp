@@ -1,7 +1,7 @@
 #include "device.h"
 
-#include "state/Keys.h"
 #include "state/Trees.h"
+#include <StateKeys.h>
 
 #include <algorithm>
 #include <vector>

@@ -11,10 +11,10 @@
 #include "host/ScreenSaverWatch.h"
 #include "host/TimeWatch.h"
 #include "preference.h"
-#include "state/Keys.h"
 #include "state/Log.h"
 #include "state/Trees.h"
 #include "vconf.h"
+#include <StateKeys.h>
 
 #include <cstdlib>
 #include <memory>
@@ -75,7 +75,8 @@ namespace {
                 _earjackListener = host::PulseWatch::instance().addListener(reportEarjack);
             if (isWanted("microphone"))
                 _microphoneListener = host::PulseWatch::instance().addListener(reportMicrophone);
-            _recorderWatch = stateTree().watch(KEY_RECORDER_STATE, [this](const std::string&) { _updateBusy(); });
+            _recorderWatch
+                = stateTree().watch(VCONFKEY_MEWLO_RECORDER_STATE, [this](const std::string&) { _updateBusy(); });
             _lockWatch = stateTree().watch(VCONFKEY_IDLE_LOCK_STATE, [this](const std::string&) { _lockChanged(); });
         }
         ~HostWatchers()
@@ -101,7 +102,7 @@ namespace {
         {
             constexpr int RECORDING = 2; // and paused is 3
             if (isWanted("lock"))
-                _logind.setBusy(stateInt(KEY_RECORDER_STATE).value_or(0) >= RECORDING);
+                _logind.setBusy(stateInt(VCONFKEY_MEWLO_RECORDER_STATE).value_or(0) >= RECORDING);
         }
 
         // Somebody else than logind wrote "unlocked", such as a button of ours: ask the session to follow.

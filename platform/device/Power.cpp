@@ -1,11 +1,11 @@
 #include "device.h"
 
 #include "host/Inhibitor.h"
-#include "state/Keys.h"
 #include "state/Log.h"
 #include "state/Trees.h"
 #include <MainLoop.h>
 #include <Mutex.h>
+#include <StateKeys.h>
 
 #include <Ecore.h>
 

@@ -1,5 +1,7 @@
 #include "BatteryWatch.h"
 
+#include <StateKeys.h>
+
 namespace host {
 
 namespace {
@@ -19,7 +21,7 @@ BatteryWatch::BatteryWatch(KeySink sink)
     , _properties("org.freedesktop.UPower", "/org/freedesktop/UPower/devices/DisplayDevice",
           "org.freedesktop.UPower.Device", [this](const std::string& name, const std::string& value) {
               if (name == "WarningLevel")
-                  _sink("memory/sysman/battery_status_low", levelOf(value));
+                  _sink(VCONFKEY_SYSMAN_BATTERY_STATUS_LOW, levelOf(value));
           })
 {
 }

@@ -1,5 +1,7 @@
 #include "CallWatch.h"
 
+#include <StateKeys.h>
+
 namespace host {
 
 namespace {
@@ -128,6 +130,6 @@ void CallWatch::_stateChanged(const std::string& path, int state)
         send(bus->get(), newCall(bus->get(), SERVICE, path.c_str(), CALL, "Hangup"));
 }
 
-void CallWatch::_report() { _sink("memory/telephony/call_status", std::to_string(_calls.size())); }
+void CallWatch::_report() { _sink(platform::KEY_CALL_STATUS, std::to_string(_calls.size())); }
 
 }

@@ -1,5 +1,7 @@
 #include "DisplayWatch.h"
 
+#include <StateKeys.h>
+
 #include <Ecore_X.h>
 
 #include <utility>
@@ -62,6 +64,6 @@ void DisplayWatch::_poll()
         _report();
 }
 
-void DisplayWatch::_report() { _sink("memory/device/display_state", _saverIsOn || _powerIsOff ? "2" : "0"); }
+void DisplayWatch::_report() { _sink(platform::KEY_DISPLAY_STATE, _saverIsOn || _powerIsOff ? "2" : "0"); }
 
 }

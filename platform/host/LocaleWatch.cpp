@@ -1,5 +1,7 @@
 #include "LocaleWatch.h"
 
+#include <StateKeys.h>
+
 #include <algorithm>
 #include <cstdlib>
 #include <map>
@@ -11,8 +13,6 @@ namespace {
     constexpr auto SERVICE = "org.freedesktop.locale1";
     constexpr auto PATH = "/org/freedesktop/locale1";
     constexpr auto PROPERTIES = "org.freedesktop.DBus.Properties";
-    constexpr auto LANGUAGE_KEY = "db/menu_widget/language";
-    constexpr auto REGION_KEY = "db/menu_widget/regionformat";
 
     std::string firstSet(std::initializer_list<const char*> names)
     {
@@ -68,9 +68,9 @@ void LocaleWatch::start()
     _languageIsOpen = language.empty();
     _regionIsOpen = region.empty();
     if (!_languageIsOpen)
-        _sink(LANGUAGE_KEY, plainLocale(language));
+        _sink(platform::KEY_LANGUAGE, plainLocale(language));
     if (!_regionIsOpen)
-        _sink(REGION_KEY, regionOf(region));
+        _sink(platform::KEY_REGION, regionOf(region));
     BusInLoop* bus = systemBus();
     if (bus == nullptr || (!_languageIsOpen && !_regionIsOpen))
         return;
@@ -96,9 +96,9 @@ void LocaleWatch::_readSystem(sd_bus_message* message)
         auto all = assignments(value);
         const std::string common = all["LANG"];
         if (_languageIsOpen)
-            _sink(LANGUAGE_KEY, plainLocale(all["LC_MESSAGES"].empty() ? common : all["LC_MESSAGES"]));
+            _sink(platform::KEY_LANGUAGE, plainLocale(all["LC_MESSAGES"].empty() ? common : all["LC_MESSAGES"]));
         if (_regionIsOpen)
-            _sink(REGION_KEY, regionOf(all["LC_TIME"].empty() ? common : all["LC_TIME"]));
+            _sink(platform::KEY_REGION, regionOf(all["LC_TIME"].empty() ? common : all["LC_TIME"]));
     });
 }
 

@@ -1,5 +1,7 @@
 #include "LogindWatch.h"
 
+#include <StateKeys.h>
+
 #include <cstdlib>
 
 #include <unistd.h>
@@ -40,7 +42,7 @@ void LogindWatch::start()
             if (sd_bus_message_read(message, "b", &goesDown) < 0 || (goesDown == 0 && !_wentDown))
                 return;
             _wentDown = goesDown != 0;
-            _sink("memory/sysman/power_off", goesDown != 0 ? "2" : "0");
+            _sink(VCONFKEY_SYSMAN_POWER_OFF_STATUS, goesDown != 0 ? "2" : "0");
         }));
     _slots.push_back(callAsync(bus->get(), askForSession(bus->get()), [this](sd_bus_message* reply) {
         const char* path = nullptr;
@@ -72,7 +74,7 @@ void LogindWatch::_watchSession(const std::string& path)
     }));
 }
 
-void LogindWatch::_reportLock(bool locked) { _sink("memory/idle_lock/state", locked ? "1" : "0"); }
+void LogindWatch::_reportLock(bool locked) { _sink(VCONFKEY_IDLE_LOCK_STATE, locked ? "1" : "0"); }
 
 void LogindWatch::stop()
 {

@@ -1,5 +1,7 @@
 #include "MountWatch.h"
 
+#include <StateKeys.h>
+
 #include <cerrno>
 #include <cstdlib>
 #include <fstream>
@@ -113,8 +115,8 @@ void MountWatch::_report()
     table << std::ifstream(TABLE).rdbuf();
     const auto card = findCard(table.str(), _places);
     if (card)
-        _sink("memory/storage/card_path", *card);
-    _sink("memory/sysman/mmc", card ? "1" : "0");
+        _sink(platform::KEY_CARD_PATH, *card);
+    _sink(VCONFKEY_SYSMAN_MMC_STATUS, card ? "1" : "0");
 }
 
 }

@@ -1,5 +1,7 @@
 #include "PortalWatch.h"
 
+#include <StateKeys.h>
+
 namespace host {
 
 namespace {
@@ -50,9 +52,9 @@ void PortalWatch::_read(const char* space, const char* key)
 void PortalWatch::_report(const std::string& space, const std::string& key, const std::string& value)
 {
     if (space == APPEARANCE && key == COLOR_SCHEME)
-        _sink("db/setting/theme", value == "1" ? "dark" : "light"); // 1 prefers dark, 2 light, 0 nothing
+        _sink(platform::KEY_THEME, value == "1" ? "dark" : "light"); // 1 prefers dark, 2 light, 0 nothing
     else if (space == INTERFACE_SPACE && key == CLOCK_FORMAT)
-        _sink("db/setting/clock_24h", value == "24h" ? "1" : "0");
+        _sink(platform::KEY_CLOCK_24H, value == "24h" ? "1" : "0");
 }
 
 }

@@ -1,5 +1,7 @@
 #include "ScreenSaverWatch.h"
 
+#include <StateKeys.h>
+
 namespace host {
 
 void ScreenSaverWatch::start()
@@ -12,7 +14,7 @@ void ScreenSaverWatch::start()
             onSignal(bus->get(), nullptr, nullptr, interface, "ActiveChanged", [this](sd_bus_message* message) {
                 int active = 0;
                 if (sd_bus_message_read(message, "b", &active) >= 0)
-                    _sink("memory/idle_lock/state", active != 0 ? "1" : "0");
+                    _sink(VCONFKEY_IDLE_LOCK_STATE, active != 0 ? "1" : "0");
             }));
 }
 

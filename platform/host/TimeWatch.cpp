@@ -1,5 +1,7 @@
 #include "TimeWatch.h"
 
+#include <StateKeys.h>
+
 #include <cerrno>
 #include <cstdlib>
 #include <ctime>
@@ -17,7 +19,7 @@ TimeWatch::TimeWatch(KeySink sink)
           [this](const std::string& name, const std::string& value) {
               const char* own = std::getenv("TZ"); // the user's, for this program
               if (name == "Timezone" && !value.empty() && (own == nullptr || *own == '\0'))
-                  _sink("db/setting/timezone", value);
+                  _sink(platform::KEY_TIME_ZONE, value);
           })
 {
 }
@@ -50,7 +52,7 @@ void TimeWatch::_fired()
 {
     uint64_t expirations = 0;
     if (::read(_timer, &expirations, sizeof(expirations)) < 0 && errno == ECANCELED)
-        _sink("memory/time_changed", std::to_string(std::time(nullptr)));
+        _sink(platform::KEY_TIME_CHANGED, std::to_string(std::time(nullptr)));
     _arm();
 }
 

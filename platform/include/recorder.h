@@ -27,6 +27,12 @@ enum recorder_state_e {
     RECORDER_STATE_RECORDING,
     RECORDER_STATE_PAUSED
 };
+// What recordings of speech are made with: hertz and bits per second.
+inline constexpr int RECORDER_AAC_SAMPLE_RATE = 44100;
+inline constexpr int RECORDER_AAC_BIT_RATE = 288000;
+inline constexpr int RECORDER_AMR_SAMPLE_RATE = 8000; // AMR knows no other
+inline constexpr int RECORDER_AMR_BIT_RATE = 12200;
+
 enum recorder_audio_device_e { RECORDER_AUDIO_DEVICE_MIC = 0 };
 enum recorder_audio_codec_e { RECORDER_AUDIO_CODEC_AMR = 0, RECORDER_AUDIO_CODEC_AAC = 1 };
 enum recorder_file_format_e { RECORDER_FILE_FORMAT_MP4 = 1, RECORDER_FILE_FORMAT_AMR = 2 };

@@ -3,6 +3,8 @@
 
 #include <sys/statvfs.h>
 
+inline constexpr auto RECORDINGS_DIRECTORY = "Sounds/Mewlo"; // below each root
+
 extern "C" {
 int storage_get_internal_memory_size(struct statvfs* size);
 int storage_get_external_memory_size(struct statvfs* size);

@@ -1,8 +1,8 @@
 #include "app.h"
 
-#include "state/Keys.h"
 #include "state/Trees.h"
 #include "vconf.h"
+#include <StateKeys.h>
 
 #include <cstring>
 

@@ -5,11 +5,11 @@
 #include "launch/Identity.h"
 #include "launch/LaunchDoor.h"
 #include "launch/Toolkit.h"
-#include "state/Keys.h"
 #include "state/Log.h"
 #include "state/Trees.h"
 #include "vconf.h"
 #include <MainLoop.h>
+#include <StateKeys.h>
 
 #include <Ecore.h>
 

@@ -24,7 +24,6 @@ struct uxt_font_table_s {
 
 namespace {
 
-constexpr auto THEME_KEY = "db/setting/theme";
 constexpr auto DARK = "dark";
 
 struct TintedObject {
@@ -57,7 +56,7 @@ Theme& theme()
 
 bool readIsDark()
 {
-    const std::unique_ptr<char, decltype(&std::free)> value(vconf_get_str(THEME_KEY), &std::free);
+    const std::unique_ptr<char, decltype(&std::free)> value(vconf_get_str(platform::KEY_THEME), &std::free);
     return value && std::string(value.get()) == DARK;
 }
 
@@ -119,7 +118,7 @@ void watch()
 {
     if (theme().watching)
         return;
-    theme().watching = vconf_notify_key_changed(THEME_KEY, themeKeyCb, nullptr) == 0;
+    theme().watching = vconf_notify_key_changed(platform::KEY_THEME, themeKeyCb, nullptr) == 0;
     theme().dark = readIsDark();
 }
 

@@ -1,6 +1,8 @@
 #include "media/FileDuration.h"
 
+#include "media/AmrIndex.h"
 #include "media/FileDescriptor.h"
+#include "media/Mp4Index.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -16,16 +18,10 @@ namespace media {
 namespace {
 
     constexpr int MOST_BOXES = 20000; // more than any honest file has side by side
-    constexpr std::array<unsigned char, 16> AMR_FRAME_BYTES = {13, 14, 16, 18, 20, 21, 27, 32, 6, 1, 1, 1, 1, 1, 1, 1};
-    constexpr std::array<unsigned char, 16> AMR_WIDE_FRAME_BYTES
-        = {18, 24, 33, 37, 41, 47, 51, 59, 61, 6, 1, 1, 1, 1, 1, 1};
     constexpr auto AMR_WIDE_MAGIC = "#!AMR-WB\n";
     constexpr off_t AMR_WIDE_DATA_START = 9;
-    constexpr std::array<uint32_t, 13> ADTS_RATES
-        = {96000, 88200, 64000, 48000, 44100, 32000, 24000, 22050, 16000, 12000, 11025, 8000, 7350};
     constexpr size_t ADTS_HEAD = 7;
     constexpr off_t MOST_FRAGMENT_INDEX = 1 << 24;
-    constexpr unsigned AMR_PADDING_BITS = 0x83;
     constexpr size_t BLOCK = 65536;
 
     struct Box {
@@ -298,10 +294,10 @@ namespace {
             const unsigned char* head = block.data() + (at - begin);
             const size_t index = head[2] >> 2 & 15;
             const auto length = static_cast<off_t>(bigEndian(head + 3, 3) >> 5 & 0x1FFF);
-            if (head[0] != 0xFF || (head[1] & 0xF6) != 0xF0 || index >= ADTS_RATES.size()
+            if (head[0] != 0xFF || (head[1] & 0xF6) != 0xF0 || index >= AAC_RATES.size()
                 || length < static_cast<off_t>(ADTS_HEAD))
                 return {};
-            rate = ADTS_RATES[index];
+            rate = AAC_RATES[index];
             samples += 1024 * ((head[6] & 3) + 1u);
             at += length;
         }
@@ -337,7 +333,6 @@ FileKind kindOf(int fd)
 AmrFrames walkAmr(int fd, FileKind kind)
 {
     const bool isWide = kind == FileKind::AMR_WIDE;
-    const auto& bytes = isWide ? AMR_WIDE_FRAME_BYTES : AMR_FRAME_BYTES;
     std::vector<unsigned char> block(BLOCK);
     AmrFrames frames{0, isWide ? AMR_WIDE_DATA_START : AMR_DATA_START, true};
     const off_t size = sizeOf(fd);
@@ -347,9 +342,8 @@ AmrFrames walkAmr(int fd, FileKind kind)
             break;
         off_t at = 0;
         while (at < want) {
-            const unsigned char head = block[static_cast<size_t>(at)];
-            const off_t length = bytes[head >> 3 & 15];
-            if ((head & AMR_PADDING_BITS) != 0 || at + length > want)
+            const auto length = static_cast<off_t>(AmrIndex::frameSize(block[static_cast<size_t>(at)], isWide));
+            if (length == 0 || at + length > want)
                 break;
             at += length;
             ++frames.count;

@@ -1,7 +1,7 @@
 #include "media/LiveCall.h"
 
-#include "state/Keys.h"
 #include "state/Trees.h"
+#include <StateKeys.h>
 
 namespace media {
 

@@ -16,7 +16,6 @@ namespace {
 
     // The mode of recordings made by this program, told by where they are kept.
     constexpr int MODE_RECORDING = 10;
-    constexpr auto RECORDINGS_FOLDER = "/Sounds/Mewlo/";
 
     struct Kind {
         const char* extension;
@@ -70,7 +69,8 @@ void describePath(MediaRow& row, const std::string& path)
     row.path = path;
     row.displayName = path.substr(path.rfind('/') + 1);
     row.storage = startsWith(path, storage_card_root()) ? 1 : 0;
-    const bool ours = path.find(RECORDINGS_FOLDER) != std::string::npos || startsWith(path, storage_private_root());
+    const bool ours = path.find(std::string("/") + RECORDINGS_DIRECTORY + "/") != std::string::npos
+        || startsWith(path, storage_private_root());
     row.mode = ours ? MODE_RECORDING : 0;
 }
 

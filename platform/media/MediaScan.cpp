@@ -21,7 +21,6 @@ namespace media {
 
 namespace {
 
-    constexpr auto RECORDINGS_DIRECTORY = "/Sounds/Mewlo";
     constexpr auto LOCK_PATIENCE = std::chrono::seconds(10);
     constexpr auto LOCK_RETRY = std::chrono::milliseconds(10);
 
@@ -61,7 +60,7 @@ namespace {
     {
         const std::string root = storage_device_root();
         std::error_code ignored;
-        return error == std::errc::no_such_file_or_directory && folder == root + RECORDINGS_DIRECTORY
+        return error == std::errc::no_such_file_or_directory && folder == root + "/" + RECORDINGS_DIRECTORY
             && std::filesystem::is_directory(root, ignored);
     }
 
@@ -140,7 +139,7 @@ std::vector<std::string> recordingFolders()
 {
     std::vector<std::string> folders;
     for (const char* root : {storage_device_root(), storage_card_root(), storage_private_root()})
-        folders.push_back(std::string(root) + RECORDINGS_DIRECTORY);
+        folders.push_back(std::string(root) + "/" + RECORDINGS_DIRECTORY);
     return folders;
 }
 

@@ -8,8 +8,6 @@ namespace media {
 namespace {
 
     constexpr uint64_t INDEX_FIXED_BYTES = 640; // everything of "moov" but the frame sizes, rounded up
-    constexpr std::array<uint32_t, 13> AAC_RATES
-        = {96000, 88200, 64000, 48000, 44100, 32000, 24000, 22050, 16000, 12000, 11025, 8000, 7350};
 
     std::string number(uint64_t value, int bytes)
     {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <string>
@@ -15,6 +16,9 @@ struct Mp4Track {
     std::string decoderConfig; // the AudioSpecificConfig
 };
 
+// By the number that stands for them in a stream.
+inline constexpr std::array<uint32_t, 13> AAC_RATES
+    = {96000, 88200, 64000, 48000, 44100, 32000, 24000, 22050, 16000, 12000, 11025, 8000, 7350};
 constexpr size_t MP4_DATA_START = 48;
 constexpr uint32_t AAC_FRAME_SAMPLES = 1024;
 constexpr uint32_t AAC_PRIMING_SAMPLES = 1600; // that our encoder puts before the sound

@@ -20,7 +20,6 @@ namespace {
     constexpr auto FIRST_SOUND = std::chrono::milliseconds(3000);
     constexpr auto DRAIN = std::chrono::milliseconds(1000);
     constexpr auto QUICK_LOOK = std::chrono::milliseconds(40); // on the main loop
-    constexpr int AMR_RATE = 8000;
 
     int errorFor(int systemError)
     {
@@ -98,7 +97,7 @@ RecorderFormat Recorder::_format() const
 {
     RecorderFormat format;
     format.isAac = _settings.codec == RECORDER_AUDIO_CODEC_AAC;
-    format.sampleRate = format.isAac ? _settings.sampleRate : AMR_RATE; // AMR knows no other
+    format.sampleRate = format.isAac ? _settings.sampleRate : RECORDER_AMR_SAMPLE_RATE;
     format.bitRate = _settings.bitRate;
     format.channels = format.isAac ? 2 : 1;
     return format;

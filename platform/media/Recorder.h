@@ -28,8 +28,8 @@ struct RecorderCallbacks {
 struct RecorderSettings {
     recorder_audio_codec_e codec = RECORDER_AUDIO_CODEC_AAC;
     recorder_file_format_e format = RECORDER_FILE_FORMAT_MP4;
-    int sampleRate = 44100;
-    int bitRate = 288000;
+    int sampleRate = RECORDER_AAC_SAMPLE_RATE;
+    int bitRate = RECORDER_AAC_BIT_RATE;
     int sizeLimitKb = 0;
     int timeLimit = 0;
     std::string path;

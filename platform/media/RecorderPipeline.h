@@ -3,6 +3,7 @@
 #include "media/StepThread.h"
 
 #include <gst/gst.h>
+#include <recorder.h>
 
 #include <chrono>
 #include <cstddef>
@@ -27,8 +28,8 @@ public:
 
 struct RecorderFormat {
     bool isAac = true;
-    int sampleRate = 44100;
-    int bitRate = 288000;
+    int sampleRate = RECORDER_AAC_SAMPLE_RATE;
+    int bitRate = RECORDER_AAC_BIT_RATE;
     int channels = 2; // of the encoded sound; the microphone is one channel
 
     // The encoder works ahead by that many samples.

@@ -130,7 +130,8 @@ namespace {
     {
         switch (kindOf(file)) {
         case FileKind::AMR:
-            return rebuildAmr(file, journal, makeJournalHeader(RECORDER_FILE_FORMAT_AMR, 8000, 1, 12200));
+            return rebuildAmr(file, journal,
+                makeJournalHeader(RECORDER_FILE_FORMAT_AMR, RECORDER_AMR_SAMPLE_RATE, 1, RECORDER_AMR_BIT_RATE));
         case FileKind::AMR_WIDE:
         case FileKind::ADTS:
         case FileKind::MP4:

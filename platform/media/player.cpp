@@ -5,9 +5,9 @@
 #include "media/LiveCall.h"
 #include "media/PlayerPipeline.h"
 #include "media/Slot.h"
-#include "state/Keys.h"
 #include "state/Trees.h"
 #include <MainLoopMailbox.h>
+#include <StateKeys.h>
 
 #include <unistd.h>
 

@@ -1,8 +1,8 @@
 #include "state_keys.h"
 
 #include "state/Directories.h"
-#include "state/Keys.h"
 #include "state/Trees.h"
+#include <StateKeys.h>
 
 #include <cerrno>
 #include <csignal>

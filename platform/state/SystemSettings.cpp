@@ -1,7 +1,7 @@
 #include "system_settings.h"
 
-#include "state/Keys.h"
 #include "state/Trees.h"
+#include <StateKeys.h>
 
 #include <algorithm>
 #include <array>

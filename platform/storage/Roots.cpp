@@ -1,10 +1,10 @@
 #include "storage/Roots.h"
 
 #include "state/Directories.h"
-#include "state/Keys.h"
 #include "state/Log.h"
 #include "state/Trees.h"
 #include "vconf.h"
+#include <StateKeys.h>
 
 #include <cstdlib>
 #include <filesystem>

@@ -11,9 +11,6 @@
 
 namespace {
 
-constexpr int SAMPLE_RATE = 44100, SAMPLE_RATE_AMR = 8000; // hertz
-constexpr int BIT_RATE = 288000, BIT_RATE_AMR = 12200; // bits per second
-
 // Text that is no number counts as 0, a number beyond an int as the nearest int.
 int parseKilobytes(const std::string& text)
 {
@@ -45,8 +42,8 @@ void MwRequestParser::_resetData(MwModel* model)
     model->setTypeRequested(false);
     model->setAudioCodec(MwModel::CODEC_AAC);
     model->setFileFormat(MwModel::FORMAT_MP4);
-    model->setSampleRate(SAMPLE_RATE);
-    model->setBitRate(BIT_RATE);
+    model->setSampleRate(RECORDER_AAC_SAMPLE_RATE);
+    model->setBitRate(RECORDER_AAC_BIT_RATE);
     model->setSizeLimit(MwModel::NO_SIZE_LIMIT);
 }
 
@@ -74,8 +71,8 @@ void MwRequestParser::_parseExtraData(app_control_h request, MwModel* model)
         if (mime.find("AMR") != std::string::npos || mime.find("amr") != std::string::npos) {
             model->setAudioCodec(MwModel::CODEC_AMR);
             model->setFileFormat(MwModel::FORMAT_AMR);
-            model->setSampleRate(SAMPLE_RATE_AMR);
-            model->setBitRate(BIT_RATE_AMR);
+            model->setSampleRate(RECORDER_AMR_SAMPLE_RATE);
+            model->setBitRate(RECORDER_AMR_BIT_RATE);
         }
     }
     text = nullptr;

@@ -9,5 +9,4 @@ inline std::string mwDeviceRoot() { return storage_device_root(); }
 inline std::string mwCardRoot() { return storage_card_root(); }
 inline std::string mwPrivateRoot() { return storage_private_root(); }
 
-inline constexpr auto RECORDINGS_DIRECTORY = "Sounds/Mewlo";
 inline constexpr auto TEMP_FILE_NAME = ".mw_temp";

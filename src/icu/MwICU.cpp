@@ -16,7 +16,6 @@
 
 namespace {
 
-constexpr auto REGION_KEY = "db/menu_widget/regionformat";
 constexpr auto FALLBACK_REGION = "en_US";
 constexpr std::string_view CODESET = "UTF-8";
 constexpr int32_t MAX_UNITS = 64;
@@ -36,7 +35,7 @@ std::string withoutTail(std::string region)
 
 std::string readRegion()
 {
-    char* text = vconf_get_str(REGION_KEY);
+    char* text = vconf_get_str(platform::KEY_REGION);
     if (text == nullptr)
         MW_LOGW("Cannot get region format.");
     const std::string region = withoutTail(mwAdopt(text));

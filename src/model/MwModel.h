@@ -2,6 +2,7 @@
 
 #include <app_control.h>
 #include <media_content.h>
+#include <recorder.h>
 
 #include <atomic>
 #include <ctime>
@@ -209,8 +210,8 @@ private:
     std::atomic<int> _audioCodec = CODEC_AAC;
     std::atomic<int> _fileFormat = FORMAT_MP4;
     std::atomic<int> _sizeLimit = NO_SIZE_LIMIT;
-    std::atomic<int> _sampleRate = 44100;
-    std::atomic<int> _bitRate = 288000;
+    std::atomic<int> _sampleRate = RECORDER_AAC_SAMPLE_RATE;
+    std::atomic<int> _bitRate = RECORDER_AAC_BIT_RATE;
     std::atomic<int> _maxTime = 0;
     std::string _currentName;
     bool _nameIsChosen = false;

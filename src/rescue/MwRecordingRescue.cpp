@@ -9,6 +9,7 @@
 #include <optional>
 
 #include "MwFileName.h"
+#include "MwFilePlaces.h"
 #include "MwFiles.h"
 #include "MwHandle.h"
 #include "MwLog.h"
@@ -33,14 +34,12 @@ struct Work {
     int beyondRescue = 0;
 };
 
-std::string directoryOf(const std::string& root) { return mwFormat("%s/%s", root.c_str(), RECORDINGS_DIRECTORY); }
-
 // Moves a rebuilt file to a name of its own in the recordings directory; nothing when that is impossible.
 std::optional<std::string> place(
     const std::string& file, const std::string& directory, const std::string& name, const char* extension)
 {
     std::string path = mwFormat("%s/%s%s", directory.c_str(), name.c_str(), extension);
-    for (int counter = 1;; ++counter) {
+    for (;;) {
         switch (MwFiles::moveWithoutOverwriting(file, path)) {
         case MwFiles::Move::DONE:
             MwFiles::flushDirectoryOf(path);
@@ -49,7 +48,7 @@ std::optional<std::string> place(
         case MwFiles::Move::FAILED:
             return std::nullopt;
         case MwFiles::Move::EXISTS:
-            path = mwFormat("%s/%s_%03d%s", directory.c_str(), name.c_str(), counter, extension);
+            path = MwFilePlaces::freePath(mwFormat("%s%s", name.c_str(), extension), directory);
         }
     }
 }
@@ -81,7 +80,7 @@ void leftoverCb(recorder_leftover_e outcome, const char* file, recorder_file_for
     const std::string name
         = notes && mwIsFileName(notes->name, ".amr") ? notes->name : work->model->getDefaultRecordingFileName();
     const char* extension = format == RECORDER_FILE_FORMAT_AMR ? ".amr" : ".m4a";
-    const std::string directory = directoryOf(work->root);
+    const std::string directory = MwFilePlaces::directoryBelow(work->root);
     if (!MwFiles::makeDirectories(directory))
         return;
     const auto path = place(file, directory, name, extension);
@@ -162,10 +161,10 @@ std::vector<std::string> MwRecordingRescue::run(MwModel& model)
         const std::string temporary = mwFormat("%s/%s", root.c_str(), TEMP_FILE_NAME);
         if (const int found = recorder_rescue_leftovers(temporary.c_str(), leftoverCb, &work); found < 0)
             MW_LOGE("recorder_rescue_leftovers failed : [%d]!!!", found);
-        catalogueWaitingNotes(directoryOf(root));
-        finishInterrupted(directoryOf(root));
+        catalogueWaitingNotes(MwFilePlaces::directoryBelow(root));
+        finishInterrupted(MwFilePlaces::directoryBelow(root));
     }
-    finishInterrupted(directoryOf(mwPrivateRoot()));
+    finishInterrupted(MwFilePlaces::directoryBelow(mwPrivateRoot()));
     MW_CALL(media_content_scan_all);
     if (!work.rescued.empty())
         notification_status_message_post(tellRescued(work.rescued).c_str());

@@ -16,7 +16,6 @@ namespace {
 constexpr double STORAGE_THRESHOLD = 107520.0; // bytes
 constexpr int CARD_MOUNTED = 1;
 constexpr int ULTRA_POWER_SAVING = 2;
-constexpr auto KEY_PERSONAL_UNLOCK_METHOD = "db/setting/personal_unlock_method";
 constexpr auto KEY_MOVE_TO_PRIVATE = "memory/setting/move_to_private";
 
 struct ModelType {
@@ -184,7 +183,7 @@ bool MwSystemMgr::isUPSModeEnabled() const
 bool MwSystemMgr::isPrivateModeInitialized() const
 {
     int method = 0;
-    if (vconf_get_int(KEY_PERSONAL_UNLOCK_METHOD, &method) != 0) {
+    if (vconf_get_int(platform::KEY_PRIVATE_METHOD, &method) != 0) {
         MW_LOGE("get private unlock mode vconf failed");
         return false;
     }
