@@ -5,12 +5,6 @@
 #include "MwModel.h"
 #include "MwText.h"
 
-namespace {
-
-constexpr unsigned long long SHORTEST_RECORDING_MS = 1000;
-
-}
-
 bool MwAppController::dispatchCommand(Command command)
 {
     // The main loop waits for the worker's running command here, and the worker for a command of the main loop.
@@ -131,7 +125,7 @@ bool MwAppController::_executeStop(bool interrupted)
     }
     _ungrabMediaKey();
     bool stopped = false;
-    if (_model->getElapsedTime() < SHORTEST_RECORDING_MS) {
+    if (_model->isTooShort()) {
         mwPost("IDS_MW_TPOP_COULDNT_SAVE_RECORDING_RECODING_TOO_SHORT");
         stopped = _cancelRecording(interrupted);
     } else {

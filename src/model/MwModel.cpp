@@ -90,13 +90,13 @@ void MwModel::holdStorage()
 {
     releaseStorage();
     const MwStorageType type = getStorageType();
-    const std::lock_guard lock(_storageMutex);
+    const platform::Lock lock(_storageMutex);
     _storage = Storage{type, type == MW_STORAGE_DEVICE ? mwDeviceRoot() : mwCardRoot()};
 }
 
 void MwModel::releaseStorage()
 {
-    const std::lock_guard lock(_storageMutex);
+    const platform::Lock lock(_storageMutex);
     _storage.reset();
 }
 
@@ -162,7 +162,7 @@ bool MwModel::addBookMark(unsigned int& markedTime)
 {
     const auto second = static_cast<unsigned int>(_elapsedTime / 1000);
     {
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         if (_bookmarks.size() >= MAX_BOOKMARKS) {
             MW_LOGE("Max book mark count reached!!");
             postTooManyBookmarks();
@@ -185,7 +185,7 @@ bool MwModel::addBookMark(unsigned int& markedTime)
 
 void MwModel::clearBookMark()
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
     _bookmarks.clear();
 }
 
@@ -205,7 +205,7 @@ bool MwModel::saveBookMark(const char* mediaId)
 
 std::vector<MwBookmark> MwModel::getBookmarkList() const
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
     return _bookmarks;
 }
 

@@ -1,12 +1,12 @@
 #pragma once
 
+#include <Mutex.h>
 #include <app_control.h>
 #include <media_content.h>
 #include <recorder.h>
 
 #include <atomic>
 #include <ctime>
-#include <mutex>
 #include <optional>
 #include <string>
 #include <vector>
@@ -113,8 +113,8 @@ public:
     void setRequestHandle(app_control_h request);
     [[nodiscard]] app_control_h getRequestHandle() const { return _request.get(); }
     // The recording that was saved for the request; empty when there is none.
-    void setAnswerPath(const std::string& path) { _setText(_answerPath, path); }
-    [[nodiscard]] std::string getAnswerPath() const { return _text(_answerPath); }
+    void setAnswerPath(const std::string& path) { _setText(&Texts::answerPath, path); }
+    [[nodiscard]] std::string getAnswerPath() const { return _text(&Texts::answerPath); }
 
     // Whether a file is there, of the type that was asked for, and no larger.
     [[nodiscard]] bool fitsRequest(const std::string& path) const;
@@ -141,21 +141,23 @@ public:
     void setBitRate(int bitsPerSecond) { _bitRate = bitsPerSecond; }
     int getEstimatedRecordingMaxTime() const { return _maxTime; } // seconds, 0 for no limit
     void setEstimatedRecordingMaxTime(int seconds) { _maxTime = seconds; }
-    [[nodiscard]] std::string getCurrentRecordingFileName() const { return _text(_currentName); }
-    void setCurrentRecordingFileName(const std::string& name) { _setText(_currentName, name); }
+    [[nodiscard]] std::string getCurrentRecordingFileName() const { return _text(&Texts::currentName); }
+    void setCurrentRecordingFileName(const std::string& name) { _setText(&Texts::currentName, name); }
     // A name of the user's, which stays with the recording until it ends.
     void chooseCurrentRecordingFileName(const std::string& name);
     // The user's name for the next recording, empty for the default one.
-    [[nodiscard]] std::string getRenameString() const { return _text(_renameString); }
-    void setRenameString(const std::string& name) { _setText(_renameString, name); }
+    [[nodiscard]] std::string getRenameString() const { return _text(&Texts::renameString); }
+    void setRenameString(const std::string& name) { _setText(&Texts::renameString, name); }
     unsigned long long getElapsedTime() const { return _elapsedTime; } // milliseconds recorded
     void setElapsedTime(unsigned long long milliseconds) { _elapsedTime = milliseconds; }
+    // What was recorded is not worth keeping: a stop throws it away.
+    [[nodiscard]] bool isTooShort() const { return _elapsedTime < SHORTEST_RECORDING; }
     double getLevel() const { return _level; } // decibels
     void setLevel(double decibels) { _level = decibels; }
     int getPlayerState() const { return _playerState; }
     void setPlayerState(int state) { _playerState = state; }
-    [[nodiscard]] std::string getCurrentPlayPath() const { return _text(_playPath); }
-    void setCurrentPlayPath(const std::string& path) { _setText(_playPath, path); }
+    [[nodiscard]] std::string getCurrentPlayPath() const { return _text(&Texts::playPath); }
+    void setCurrentPlayPath(const std::string& path) { _setText(&Texts::playPath, path); }
     unsigned int getCurrentPlayPosition() const { return _playPosition; } // milliseconds
     void setCurrentPlayPosition(unsigned int milliseconds) { _playPosition = milliseconds; }
     bool isRequestMode() const { return _requestMode; }
@@ -166,6 +168,8 @@ public:
     void setPlayViewShown(bool shown) { _playView = shown; }
 
 private:
+    static constexpr unsigned long long SHORTEST_RECORDING = 1000; // milliseconds
+
     struct FileNumbers {
         unsigned long long last = 0;
         unsigned long long prefix = 0;
@@ -179,15 +183,21 @@ private:
     std::string _advanceToFreeName(FileNumbers& numbers) const;
     [[nodiscard]] std::optional<size_t> _currentPlayIndex() const;
 
-    std::string _text(const std::string& field) const
+    struct Texts {
+        std::string currentName;
+        std::string renameString;
+        std::string playPath;
+        std::string answerPath;
+    };
+    std::string _text(std::string Texts::*field) const
     {
-        const std::lock_guard lock(_mutex);
-        return field;
+        const platform::Lock lock(_mutex);
+        return _texts.*field;
     }
-    void _setText(std::string& field, const std::string& value)
+    void _setText(std::string Texts::*field, const std::string& value)
     {
-        const std::lock_guard lock(_mutex);
-        field = value;
+        const platform::Lock lock(_mutex);
+        _texts.*field = value;
     }
 
     using RequestHandle = MwHandle<app_control_h, app_control_destroy>;
@@ -198,13 +208,14 @@ private:
     };
     [[nodiscard]] std::optional<Storage> _heldStorage() const
     {
-        const std::lock_guard lock(_storageMutex);
+        const platform::Lock lock(_storageMutex);
         return _storage;
     }
 
-    mutable std::mutex _storageMutex; // guards the next one; nothing else is locked under it
-    std::optional<Storage> _storage; // of the running recording
-    mutable std::mutex _mutex; // guards names, numbers, paths and bookmarks
+    mutable platform::Mutex _storageMutex; // nothing else is locked under it
+    std::optional<Storage> _storage GUARDED_BY(_storageMutex); // of the running recording
+    mutable platform::Mutex _mutex;
+    Texts _texts GUARDED_BY(_mutex);
     std::atomic<int> _appState = APP_STATE_CREATED;
     std::atomic<int> _recorderState = 0;
     std::atomic<int> _audioCodec = CODEC_AAC;
@@ -213,15 +224,11 @@ private:
     std::atomic<int> _sampleRate = RECORDER_AAC_SAMPLE_RATE;
     std::atomic<int> _bitRate = RECORDER_AAC_BIT_RATE;
     std::atomic<int> _maxTime = 0;
-    std::string _currentName;
-    bool _nameIsChosen = false;
-    std::string _renameString;
-    FileNumbers _numbers;
+    bool _nameIsChosen GUARDED_BY(_mutex) = false;
+    FileNumbers _numbers GUARDED_BY(_mutex);
     std::atomic<unsigned long long> _elapsedTime = 0;
     std::atomic<double> _level = SILENCE;
     std::atomic<int> _playerState = 0;
-    std::string _playPath;
-    std::string _answerPath;
     std::atomic<unsigned int> _playPosition = 0;
     std::atomic<bool> _requestMode = false;
     std::atomic<bool> _typeRequested = false;
@@ -231,5 +238,5 @@ private:
     std::vector<MwFileInfo> _recordedFiles;
     unsigned int _catalogueRevision = 1;
     bool _hasHidden = false;
-    std::vector<MwBookmark> _bookmarks;
+    std::vector<MwBookmark> _bookmarks GUARDED_BY(_mutex);
 };

@@ -105,7 +105,7 @@ bool MwModel::updateLastRecordedFileNumber()
     FileNumbers highest;
     foreachRecordedFiles(_collectNumbersCb, &highest);
     {
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         _numbers = highest;
     }
     MW_LOGI("last number: [%llu]", highest.last);
@@ -137,21 +137,21 @@ std::string MwModel::_advanceToFreeName(FileNumbers& numbers) const
 
 void MwModel::chooseCurrentRecordingFileName(const std::string& name)
 {
-    const std::lock_guard lock(_mutex);
-    _currentName = name;
+    const platform::Lock lock(_mutex);
+    _texts.currentName = name;
     _nameIsChosen = true;
 }
 
 bool MwModel::updateNextRecordingFileName()
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
     // The screen asks again whenever it comes back; a running recording keeps the name that the screen shows.
     const bool runs
         = _recorderState == MwRecorder::REC_STATE_RECORDING || _recorderState == MwRecorder::REC_STATE_PAUSED;
     if (runs)
         return true;
     _nameIsChosen = false;
-    _currentName = _advanceToFreeName(_numbers);
+    _texts.currentName = _advanceToFreeName(_numbers);
     return true;
 }
 
@@ -159,7 +159,7 @@ std::string MwModel::getDefaultRecordingFileName() const
 {
     FileNumbers numbers;
     {
-        const std::lock_guard lock(_mutex);
+        const platform::Lock lock(_mutex);
         numbers = _numbers;
     }
     return _advanceToFreeName(numbers);
@@ -174,9 +174,9 @@ bool MwModel::checkRecordFileNameExist(const std::string& name) const
 // file there is, would only end at the same: the next start probes upward again.
 void MwModel::windBackRecordingFileName()
 {
-    const std::lock_guard lock(_mutex);
+    const platform::Lock lock(_mutex);
     if (_numbers.last > 0 && !_nameIsChosen)
         --_numbers.last;
     FileNumbers numbers = _numbers;
-    _currentName = _advanceToFreeName(numbers);
+    _texts.currentName = _advanceToFreeName(numbers);
 }

@@ -19,7 +19,6 @@ using panekit::WTimer;
 
 namespace {
 
-constexpr unsigned long long SHORTEST_RECORDING = 1000; // milliseconds
 constexpr double BOOKMARK_PAUSE = 1.0; // seconds
 
 }
@@ -93,7 +92,7 @@ void MwRecorderContentViewController::_stopButtonClicked()
     }
     if (_isStopping)
         return;
-    if (getModel()->getElapsedTime() < SHORTEST_RECORDING)
+    if (getModel()->isTooShort())
         _cancelTooShortRecording();
     else
         _stopRecording();

@@ -26,7 +26,6 @@ namespace {
 
 constexpr auto ALARM_SERVICE_ID = "com.tovanic.mewlo-alarmservice";
 constexpr const char* FOCUS_EVENTS[] = {"focused", "unfocused"};
-constexpr unsigned long long SHORTEST_RECORDING_MS = 1000;
 
 bool isRecording(const MwModel& model)
 {
@@ -376,7 +375,7 @@ bool MwMiniControllerMgr::_dispatch(MwAppController::Command command, const char
 
 void MwMiniControllerMgr::_stopRecord()
 {
-    if (_model->getElapsedTime() >= SHORTEST_RECORDING_MS) {
+    if (!_model->isTooShort()) {
         _appController->dispatchCommandAsync(MwAppController::STOP_RECORDING, _stopCb, nullptr);
         return;
     }
