@@ -13,6 +13,7 @@
 #include <unistd.h>
 
 #include "MwAvrcp.h"
+#include "MwFilePlaces.h"
 #include "MwFiles.h"
 #include "MwHandle.h"
 #include "MwLog.h"
@@ -272,15 +273,15 @@ bool MwAppController::_saveRecordingFile()
     }
     if (!_checkRecordedFileDir())
         return false;
-    const std::string name = _model->getCurrentRecordingFileName();
-    std::string path = _model->getRecordingPath(name);
-    for (int counter = 1; !_moveTempRecordingFile(path.c_str()); ++counter) {
+    const std::string wanted = _model->getRecordingPath(_model->getCurrentRecordingFileName());
+    std::string path = wanted;
+    while (!_moveTempRecordingFile(path.c_str())) {
         // Only a name that is taken (perhaps since a moment ago, by another instance) is worth another try.
         if (ecore_file_exists(path.c_str()) == EINA_FALSE) {
             MW_LOGE("move temp recording file failed!");
             return false;
         }
-        path = _model->getRecordingPath(name, counter);
+        path = MwFilePlaces::freePath(wanted, _model->getRecordingsDirectory());
     }
     _lastSavedPath = path;
     if (_model->isRequestMode())

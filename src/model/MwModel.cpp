@@ -152,12 +152,6 @@ std::string MwModel::getRecordingPath(const std::string& name) const
     return mwFormat("%s/%s/%s%s", getStorageRoot().c_str(), RECORDINGS_DIRECTORY, name.c_str(), getFileExtension());
 }
 
-std::string MwModel::getRecordingPath(const std::string& name, int counter) const
-{
-    return mwFormat(
-        "%s/%s/%s_%03d%s", getStorageRoot().c_str(), RECORDINGS_DIRECTORY, name.c_str(), counter, getFileExtension());
-}
-
 bool MwModel::addBookMark(unsigned int& markedTime)
 {
     const auto second = static_cast<unsigned int>(_elapsedTime / 1000);

@@ -87,8 +87,6 @@ public:
     [[nodiscard]] std::string getTemporaryFilePath() const;
     [[nodiscard]] std::string getRecordingsDirectory() const;
     [[nodiscard]] std::string getRecordingPath(const std::string& name) const;
-    // The n-th path to try when the plain one is taken.
-    [[nodiscard]] std::string getRecordingPath(const std::string& name, int counter) const;
     [[nodiscard]] const char* getFileExtension() const;
 
     // Names and numbering

@@ -243,6 +243,13 @@ TEST_F(RecordingFlowTest, ARunningRecordingKeepsItsName)
     EXPECT_EQ(name, _model.getCurrentRecordingFileName());
     EXPECT_TRUE(stop());
     EXPECT_EQ(support::recordingPath(name + "_001.m4a"), _controller.getLastSavedPath());
+
+    startRecording();
+    const std::string longest(251, 'n'); // leaves no room for a counter
+    _model.chooseCurrentRecordingFileName(longest);
+    support::addRecording(longest + ".m4a", "of another instance");
+    EXPECT_TRUE(stop());
+    EXPECT_EQ(0u, _controller.getLastSavedPath().find(support::recordingPath("nnn")));
 }
 
 TEST_F(RecordingFlowTest, ARefusedStartGivesItsNameBack)

@@ -307,6 +307,11 @@ TEST_F(MwRecordingRescueTest, ALeftoverBecomesAnOrdinaryRecording)
     EXPECT_EQ(2, bookmarksOf(support::recordingPath("Talk_001.amr")));
     EXPECT_FALSE(std::filesystem::exists(support::deviceRoot() + "/.mw_rescue_1.notes"));
     EXPECT_TRUE(calls.has("post"));
+
+    const std::string longest(251, 'n'); // leaves no room for a counter
+    support::addRecording(longest + ".amr", "mine");
+    leave("rebuilt", MwRecordingNotes::Content{longest, {}}, RECORDER_FILE_FORMAT_AMR);
+    EXPECT_EQ(1u, MwRecordingRescue::run(_model).size());
 }
 
 TEST_F(MwRecordingRescueTest, HostileOrMissingNotesGetADefaultName)
