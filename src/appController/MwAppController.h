@@ -206,7 +206,8 @@ private:
     unsigned int _seekStep = 0; // milliseconds
     platform::MainLoopMailbox _mailbox;
     std::function<void()> _recordingsOpener;
-    // Held for the whole execution of a command, by whichever thread executes it.
+    // Held for the whole execution of a command, by whichever thread executes it; recursive, for what a command tells
+    // its listeners may make them send another.
     mutable platform::RecursiveMutex _commandMutex;
     std::string _lastSavedPath; // of this process; empty while or after one that was not saved
     bool _wasDiscarded = false; // the last recording of this process
