@@ -22,6 +22,7 @@ struct MwFileInfo {
     std::string mediaId;
     time_t modifiedTime = 0;
     int duration = 0; // milliseconds
+    bool operator==(const MwFileInfo&) const = default;
 };
 
 struct MwBookmark {
@@ -51,11 +52,14 @@ public:
     // Catalogue and play order
     // Without those of the private storage while it is closed.
     bool createRecordedFileList();
+    // The two halves of it: the first one is for any thread.
+    static std::vector<MwFileInfo> readRecordedFiles();
+    void setRecordedFiles(std::vector<MwFileInfo> files);
     // Whether the list leaves any out.
     [[nodiscard]] bool hasHiddenRecordings() const { return _hasHidden; }
     [[nodiscard]] static bool isHiddenRecording(const std::string& path);
     void destroyRecordedFileList();
-    bool foreachRecordedFiles(RecordedFileCallback callback, void* userData);
+    static bool foreachRecordedFiles(RecordedFileCallback callback, void* userData);
     [[nodiscard]] const std::vector<MwFileInfo>& getRecordedFileList() const { return _recordedFiles; }
     // Another number after every change of the list, never 0.
     [[nodiscard]] unsigned int getCatalogueRevision() const { return _catalogueRevision; }

@@ -146,11 +146,25 @@ bool MwModel::_collectFileCb(media_info_h media, void* userData)
 
 bool MwModel::createRecordedFileList()
 {
-    destroyRecordedFileList();
-    foreachRecordedFiles(_collectFileCb, &_recordedFiles);
-    _hasHidden = !isPrivateStorageOpen()
-        && std::erase_if(_recordedFiles, [](const MwFileInfo& info) { return isPrivate(info.path); }) > 0;
+    setRecordedFiles(readRecordedFiles());
     return true;
+}
+
+std::vector<MwFileInfo> MwModel::readRecordedFiles()
+{
+    std::vector<MwFileInfo> files;
+    foreachRecordedFiles(_collectFileCb, &files);
+    return files;
+}
+
+void MwModel::setRecordedFiles(std::vector<MwFileInfo> files)
+{
+    _hasHidden = !isPrivateStorageOpen()
+        && std::erase_if(files, [](const MwFileInfo& info) { return isPrivate(info.path); }) > 0;
+    if (files == _recordedFiles)
+        return;
+    ++_catalogueRevision;
+    _recordedFiles = std::move(files);
 }
 
 bool MwModel::isHiddenRecording(const std::string& path) { return isPrivate(path) && !isPrivateStorageOpen(); }

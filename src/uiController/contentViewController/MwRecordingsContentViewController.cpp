@@ -8,6 +8,7 @@
 #include <panekit/WMenuPopupController.h>
 #include <panekit/WPopupController.h>
 
+#include "MwCatalogueReader.h"
 #include "MwFileOperationPopup.h"
 #include "MwFileOperator.h"
 #include "MwListDates.h"
@@ -26,6 +27,7 @@ namespace {
 constexpr auto LAYOUT_FILE = "edje/MwRecordingsContentView.edj";
 constexpr auto LAYOUT_GROUP = "recordings_content_view";
 constexpr auto TITLE = "IDS_MW_HEADER_RECORDINGS_M_VOICE_ABB";
+constexpr size_t READ_AT_ONCE = 500; // recordings: nobody notices a few milliseconds
 
 }
 
@@ -33,6 +35,8 @@ MwRecordingsContentViewController::MwRecordingsContentViewController(MwModel* mo
     : MwContentViewController(model, appController)
 {
     setTitle(TITLE);
+    _catalogueReader = std::make_unique<MwCatalogueReader>(
+        [this](std::vector<MwFileInfo> files) { _adoptCatalogue(std::move(files)); });
     _rowContext.model = model;
     _rowContext.getListType = [this] { return _getListType(); };
     _rowContext.onSelected = [this](MwRecordingsListItem& item) { _onSelectListItem(item); };
@@ -221,7 +225,31 @@ void MwRecordingsContentViewController::_mediaDBUpdated()
         _databaseChanged = true;
         return;
     }
-    getModel()->createRecordedFileList();
+    if (getModel()->getRecordedFileList().size() < READ_AT_ONCE) {
+        getModel()->createRecordedFileList();
+        return _catalogueRead();
+    }
+    _askedRevision = getModel()->getCatalogueRevision();
+    _catalogueReader->ask();
+}
+
+// What has changed here meanwhile is newer than what was read.
+void MwRecordingsContentViewController::_adoptCatalogue(std::vector<MwFileInfo> files)
+{
+    if (_fileOperator) {
+        _databaseChanged = true;
+        return;
+    }
+    if (_askedRevision != getModel()->getCatalogueRevision()) {
+        _askedRevision = getModel()->getCatalogueRevision();
+        return _catalogueReader->ask();
+    }
+    getModel()->setRecordedFiles(std::move(files));
+    _catalogueRead();
+}
+
+void MwRecordingsContentViewController::_catalogueRead()
+{
     _reloadNeeded = true;
     if (_viewType == RENAME && _renamePopup && !getModel()->getRecordedFileInfoByPath(_renameTarget))
         _closeRenamePopup();

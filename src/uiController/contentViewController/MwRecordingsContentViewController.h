@@ -17,6 +17,7 @@
 #include "MwRecordingsListItem.h"
 #include "MwSignalMgr.h"
 
+class MwCatalogueReader;
 class MwFileOperationPopup;
 class MwFileOperator;
 class MwPlayViewController;
@@ -63,6 +64,8 @@ private:
     void _onSystemInfoSignal(MwSignalMgr::SystemInfo info);
     void _privateStorageChanged();
     void _mediaDBUpdated();
+    void _adoptCatalogue(std::vector<MwFileInfo> files);
+    void _catalogueRead();
     void _forgetVanishedPlayPath();
     void _formatChanged();
     void _themeChanged();
@@ -82,6 +85,8 @@ private:
     void _createList();
     void _focusList();
     void _loadListItems();
+    void _renewList();
+    void _makeRows();
     Evas_Object* _radioGroup() const;
     void _loadSelectAllItem();
     void _removeSelectAllItem();
@@ -188,6 +193,8 @@ private:
     ViewType _viewType = NORMAL;
     bool _reloadNeeded = false;
     bool _databaseChanged = false; // while an operation ran
+    unsigned int _askedRevision = 0; // of the catalogue when the reader was asked
+    std::unique_ptr<MwCatalogueReader> _catalogueReader;
     Evas_Object* _genlist = nullptr; // at most one of these two
     Evas_Object* _noContents = nullptr;
     MwRecordingsListItem::Context _rowContext; // shared by all rows

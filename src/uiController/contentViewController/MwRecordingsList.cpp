@@ -100,6 +100,8 @@ void MwRecordingsContentViewController::_update()
         _loadContents();
     if (_genlist) {
         const MwRecordingsRows::Place place = _rows->getPlace();
+        if (_rows->isRenewalCheaper(mwRecordingsMode(_viewType).files))
+            _renewList();
         _rows->show(mwRecordingsMode(_viewType).files);
         if (playsHere && getModel()->getCurrentPlayPath().empty()) {
             _removeSelectAllItem();
@@ -192,15 +194,33 @@ void MwRecordingsContentViewController::_focusList()
 
 void MwRecordingsContentViewController::_loadListItems()
 {
+    _makeRows();
+    _rows->show(mwRecordingsMode(_viewType).files);
+    if (_viewType == PICK)
+        _preselect();
+}
+
+// The rows come again in another list; the former one goes in slices.
+void MwRecordingsContentViewController::_renewList()
+{
+    const int chosen = elm_radio_value_get(_radioGroup());
+    const std::unique_ptr<MwRecordingsRows> former = std::move(_rows);
+    takeDown(elm_object_part_content_unset(getEvasObject(), LIST_PART));
+    _genlist = nullptr;
+    _createList();
+    _makeRows();
+    _rows->succeed(*former);
+    elm_radio_value_set(_radioGroup(), chosen);
+}
+
+void MwRecordingsContentViewController::_makeRows()
+{
     // The group itself, hidden: the radios of the rows come and go with scrolling.
     Evas_Object* radioMain = elm_radio_add(_genlist);
     elm_radio_state_value_set(radioMain, NO_CHOICE_VALUE);
     elm_radio_value_set(radioMain, NO_CHOICE_VALUE);
     evas_object_data_set(_genlist, RADIO_KEY, radioMain);
     _rows = std::make_unique<MwRecordingsRows>(_genlist, _rowContext);
-    _rows->show(mwRecordingsMode(_viewType).files);
-    if (_viewType == PICK)
-        _preselect();
 }
 
 Evas_Object* MwRecordingsContentViewController::_radioGroup() const

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <optional>
 #include <string_view>
 #include <utility>
 
@@ -18,6 +19,7 @@ namespace {
 constexpr size_t FIRST_ROWS = 64;
 // Each row that comes in between has the toolkit lay out the list at once, at its end thousands are laid out together.
 constexpr size_t MOST_CHANGES = 128;
+constexpr unsigned int MOST_TO_CLEAR = 256;
 constexpr double FIRST_FRAME_SECONDS = 0.03;
 constexpr double SLICE_SECONDS = 0.004;
 constexpr int SELECT_ALL_HEIGHT = 112; // design units, as in its layout
@@ -55,15 +57,19 @@ MwRecordingsRows::MwRecordingsRows(Evas_Object* genlist, const Item::Context& co
 {
 }
 
-MwRecordingsRows::~MwRecordingsRows() { WTimer::destroy(_loader); }
+MwRecordingsRows::~MwRecordingsRows()
+{
+    WTimer::destroy(_loader);
+    WTimer::destroy(_scroller);
+}
 
 const std::vector<MwFileInfo>& MwRecordingsRows::_catalogue() const { return _context.model->getRecordedFileList(); }
 
-bool MwRecordingsRows::_accepts(const MwFileInfo& info) const
+bool MwRecordingsRows::_accepts(const MwFileInfo& info, Files files) const
 {
-    if (_files == FOR_REQUEST)
+    if (files == FOR_REQUEST)
         return _context.model->fitsRequest(info.path);
-    return _files == ALL || info.path.starts_with(_privateFolder) == (_files == IN_PRIVATE);
+    return files == ALL || info.path.starts_with(_privateFolder) == (files == IN_PRIVATE);
 }
 
 MwRecordingsListItem* MwRecordingsRows::_first() const
@@ -90,10 +96,12 @@ void MwRecordingsRows::show(Files files)
         return;
     _files = files;
     _revision = revision;
-    const Paths wanted = _wantedPaths();
-    if (_countChanges(wanted) > MOST_CHANGES)
+    const Paths wanted = _wantedPaths(files);
+    const Changes changes = _findChanges(wanted, files);
+    if (changes.areMany())
         _startOver();
-    _removeVanished(wanted);
+    else if (changes.vanished > 0)
+        _removeVanished(wanted);
     _followCatalogue();
     if (_loaded < _catalogue().size() && _loader.expired())
         _loader = WTimer::addTimer(FIRST_FRAME_SECONDS, [this](void*) {
@@ -108,36 +116,37 @@ void MwRecordingsRows::finish()
     while (_loadSlice(SLICE_SECONDS)) { }
 }
 
-MwRecordingsRows::Paths MwRecordingsRows::_wantedPaths() const
+MwRecordingsRows::Paths MwRecordingsRows::_wantedPaths(Files files) const
 {
     Paths paths;
     if (!_first())
         return paths;
     for (const MwFileInfo& info : _catalogue()) {
-        if (_accepts(info))
+        if (_accepts(info, files))
             paths.insert(info.path);
     }
     return paths;
 }
 
-// Rows that go, and those that come before the last one that stays.
-size_t MwRecordingsRows::_countChanges(const Paths& wanted) const
+bool MwRecordingsRows::Changes::areMany() const { return vanished + added > MOST_CHANGES; }
+
+MwRecordingsRows::Changes MwRecordingsRows::_findChanges(const Paths& wanted, Files files) const
 {
-    size_t changes = 0;
+    Changes changes;
     std::vector<const Item*> staying;
     forEachLoaded([&](const Item& row) {
         if (wanted.contains(row.getPath()))
             staying.push_back(&row);
         else
-            ++changes;
+            ++changes.vanished;
         return true;
     });
     auto row = staying.begin();
     for (auto info = _catalogue().begin(); info != _catalogue().end() && row != staying.end(); ++info) {
         if ((*row)->getPath() == info->path)
             ++row;
-        else if (_accepts(*info))
-            ++changes;
+        else if (_accepts(*info, files))
+            ++changes.added;
     }
     return changes;
 }
@@ -146,12 +155,35 @@ size_t MwRecordingsRows::_countChanges(const Paths& wanted) const
 void MwRecordingsRows::_startOver()
 {
     const bool hasSelectAll = getSelectAll();
-    forEachLoaded([this](const Item& row) {
+    _remember(*this);
+    elm_genlist_clear(_genlist);
+    if (hasSelectAll)
+        addSelectAll();
+    _moved = true;
+}
+
+void MwRecordingsRows::_remember(const MwRecordingsRows& rows)
+{
+    rows.forEachLoaded([this](const Item& row) {
         _former[row.getPath()] = {row.getIndex(), row.isHighlighted()};
         return true;
     });
-    elm_genlist_clear(_genlist);
-    if (hasSelectAll)
+}
+
+bool MwRecordingsRows::isRenewalCheaper(Files files) const
+{
+    const bool isShown = files == _files && _context.model->getCatalogueRevision() == _revision;
+    return !isShown && elm_genlist_items_count(_genlist) > MOST_TO_CLEAR
+        && _findChanges(_wantedPaths(files), files).areMany();
+}
+
+void MwRecordingsRows::succeed(const MwRecordingsRows& former)
+{
+    _former = former._former;
+    _remember(former);
+    _lastIndex = former._lastIndex;
+    _awaited = former._awaited;
+    if (former.getSelectAll())
         addSelectAll();
     _moved = true;
 }
@@ -166,19 +198,12 @@ MwRecordingsListItem* MwRecordingsRows::_make(const MwFileInfo& info)
 
 void MwRecordingsRows::_removeVanished(const Paths& wanted)
 {
-    if (!_first())
-        return;
-    bool removed = false;
-    for (Item* row = _first(); row;) {
-        Item* next = _next(row);
-        if (!wanted.contains(row->getPath())) {
-            elm_object_item_del(row->getItem());
-            removed = true;
-        }
-        row = next;
-    }
-    if (removed)
-        _closeGaps();
+    forEachLoaded([&](const Item& row) {
+        if (!wanted.contains(row.getPath()))
+            elm_object_item_del(row.getItem());
+        return true;
+    });
+    _closeGaps();
 }
 
 // Where rows went out of sight the list keeps their room until a row comes; so its last one comes again.
@@ -203,13 +228,13 @@ std::unordered_map<std::string, MwRecordingsListItem*> MwRecordingsRows::_rowsBy
 // slices, but for the first screens.
 void MwRecordingsRows::_followCatalogue()
 {
-    const auto known = _rowsByPath();
+    std::optional<std::unordered_map<std::string, Item*>> known; // asked for when a row is not in its place
     Item* row = _first();
     Item* above = getSelectAll();
     size_t rows = 0;
     for (_loaded = 0; _loaded < _catalogue().size() && (row || rows < FIRST_ROWS); ++_loaded) {
         const MwFileInfo& info = _catalogue()[_loaded];
-        if (!_accepts(info))
+        if (!_accepts(info, _files))
             continue;
         ++rows;
         if (row && row->getPath() == info.path) {
@@ -217,8 +242,10 @@ void MwRecordingsRows::_followCatalogue()
             above = std::exchange(row, _next(row));
             continue;
         }
-        const auto former = known.find(info.path);
-        above = _insert(info, above, former != known.end() ? former->second : nullptr);
+        if (!known)
+            known = _rowsByPath();
+        const auto former = known->find(info.path);
+        above = _insert(info, above, former != known->end() ? former->second : nullptr);
     }
 }
 
@@ -246,7 +273,7 @@ bool MwRecordingsRows::_loadSlice(double seconds)
     bool isPlaceThere = false;
     for (size_t count = 1; _loaded < _catalogue().size(); ++count) {
         const MwFileInfo& info = _catalogue()[_loaded++];
-        if (_accepts(info))
+        if (_accepts(info, _files))
             _make(info)->append(_genlist);
         isPlaceThere = isPlaceThere || (!_awaited.paths.empty() && info.path == _awaited.paths.front());
         if (count % ROWS_BETWEEN_LOOKS_AT_THE_CLOCK == 0 && ecore_time_get() > end)
@@ -264,9 +291,7 @@ bool MwRecordingsRows::_loadSlice(double seconds)
 void MwRecordingsRows::_restoreAwaited()
 {
     const Place place = std::exchange(_awaited, {});
-    int scrolled = 0;
-    elm_scroller_region_get(_genlist, nullptr, &scrolled, nullptr, nullptr);
-    if (place.paths.empty() || scrolled > 0)
+    if (place.paths.empty() || _scrolled() > 0)
         return;
     _moved = true;
     restore(place);
@@ -425,9 +450,7 @@ void MwRecordingsRows::forEachRealized(const std::function<void(Item&)>& functio
 
 MwRecordingsRows::Place MwRecordingsRows::getPlace() const
 {
-    int scrolled = 0;
-    elm_scroller_region_get(_genlist, nullptr, &scrolled, nullptr, nullptr);
-    const Item* row = scrolled > 0 ? _onTop() : nullptr;
+    const Item* row = _scrolled() > 0 ? _onTop() : nullptr;
     if (!row)
         return {};
     const Box box = boxOfRow(row->getItem());
@@ -473,8 +496,38 @@ void MwRecordingsRows::restore(const Place& place)
     }
     if (!isThere && _loaded < _catalogue().size())
         _awaited = place;
+    evas_smart_objects_calculate(evas_object_evas_get(_genlist)); // with all rows there are now
+    _scrollTo(y, place.rowHeight);
+}
+
+// The list gives its rows their places when there is nothing else to do, and does not scroll to where none is yet.
+void MwRecordingsRows::_scrollTo(int y, int rowHeight)
+{
+    WTimer::destroy(_scroller);
     int height = 0;
     evas_object_geometry_get(_genlist, nullptr, nullptr, nullptr, &height);
-    evas_smart_objects_calculate(evas_object_evas_get(_genlist)); // with all rows there are now
     elm_scroller_region_show(_genlist, 0, y, 1, height);
+    const int reached = _scrolled();
+    if (reached == y)
+        return;
+    _scroller = WTimer::addIdler([this, y, rowHeight, reached](void*) {
+        if (_scrolled() != reached)
+            return false; // by the user
+        int all = 0;
+        elm_scroller_child_size_get(_genlist, nullptr, &all);
+        int seen = 0;
+        evas_object_geometry_get(_genlist, nullptr, nullptr, nullptr, &seen);
+        const bool isThere = all >= y + seen;
+        const bool isLaidOut = all >= static_cast<int>(elm_genlist_items_count(_genlist)) * rowHeight;
+        if (isThere || isLaidOut)
+            elm_scroller_region_show(_genlist, 0, y, 1, seen);
+        return !isThere && !isLaidOut;
+    });
+}
+
+int MwRecordingsRows::_scrolled() const
+{
+    int y = 0;
+    elm_scroller_region_get(_genlist, nullptr, &y, nullptr, nullptr);
+    return y;
 }

@@ -37,6 +37,10 @@ public:
 
     // Shows these files of the catalogue; costs nothing when that is what is shown.
     void show(Files files);
+    // Whether that means to clear a list that is too long to be cleared at once: then rows in another list succeed
+    // these.
+    [[nodiscard]] bool isRenewalCheaper(Files files) const;
+    void succeed(const MwRecordingsRows& former);
     // Loads what is missing. Whatever needs all rows does it by itself.
     void finish();
 
@@ -66,7 +70,7 @@ public:
 private:
     using Item = MwRecordingsListItem;
 
-    [[nodiscard]] bool _accepts(const MwFileInfo& info) const;
+    [[nodiscard]] bool _accepts(const MwFileInfo& info, Files files) const;
     [[nodiscard]] const std::vector<MwFileInfo>& _catalogue() const;
     [[nodiscard]] Item* _first() const;
     [[nodiscard]] static Item* _next(const Item* row);
@@ -78,9 +82,15 @@ private:
         bool isHighlighted = false;
     };
 
-    [[nodiscard]] Paths _wantedPaths() const;
-    [[nodiscard]] size_t _countChanges(const Paths& wanted) const;
+    [[nodiscard]] Paths _wantedPaths(Files files) const;
+    struct Changes {
+        size_t vanished = 0; // rows
+        size_t added = 0; // before the last row that stays
+        [[nodiscard]] bool areMany() const;
+    };
+    [[nodiscard]] Changes _findChanges(const Paths& wanted, Files files) const;
     void _startOver();
+    void _remember(const MwRecordingsRows& rows);
     [[nodiscard]] Item* _make(const MwFileInfo& info);
     void _removeVanished(const Paths& wanted);
     void _closeGaps();
@@ -90,6 +100,8 @@ private:
     void _restoreAwaited();
     [[nodiscard]] Item* _highlightStart() const;
     [[nodiscard]] Item* _onTop() const;
+    void _scrollTo(int y, int rowHeight);
+    [[nodiscard]] int _scrolled() const;
     [[nodiscard]] int _yOf(const std::string& path, int rowHeight) const;
 
     Evas_Object* _genlist;
@@ -103,4 +115,5 @@ private:
     Place _awaited; // to be restored when its rows are there again
     bool _moved = false; // rows came since the place was restored
     panekit::WTimer::Weak _loader;
+    panekit::WTimer::Weak _scroller; // until its place is there
 };
