@@ -1,12 +1,12 @@
 #include "media/DatabaseSalvage.h"
 
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <map>
 #include <memory>
 #include <set>
-#include <tuple>
 
 namespace media {
 
@@ -48,6 +48,13 @@ namespace {
         }
         sqlite3_finalize(statement);
         return code == SQLITE_DONE;
+    }
+
+    bool isSound(sqlite3* database)
+    {
+        std::string verdict;
+        return visit(database, "PRAGMA integrity_check(1)", [&](sqlite3_stmt* s) { verdict = textOf(s, 0); })
+            && verdict == "ok";
     }
 
     std::set<std::string> columnsOf(sqlite3* database, const std::string& table)
@@ -106,6 +113,9 @@ namespace {
                 return {{}, {}, false};
             _readMedia();
             _readBookmarks();
+            // Rows can be missing or wrong without any read that fails.
+            if (!isSound(_database.get()))
+                _salvage.isComplete = false;
             for (auto& [id, row] : _rows)
                 _salvage.rows.push_back(std::move(row));
             for (auto& [id, bookmark] : _bookmarks)
@@ -196,21 +206,35 @@ namespace {
 
 }
 
+// A row that this one has under another identifier, or at another path, is a new one or a renamed one - or a damaged
+// one: its marks still name it as it was, its file is still where it was.
 void Salvage::fillFrom(const Salvage& other)
 {
-    std::set<std::string> ids;
-    std::set<std::string> paths;
-    for (const MediaRow& row : rows) {
-        ids.insert(row.id);
-        paths.insert(row.path);
+    std::map<std::string, MediaRow*> byId;
+    std::map<std::string, MediaRow*> byPath;
+    for (MediaRow& row : rows) {
+        byId.emplace(row.id, &row);
+        byPath.emplace(row.path, &row);
     }
-    for (const MediaRow& row : other.rows) {
-        if (ids.insert(row.id).second && paths.insert(row.path).second)
-            rows.push_back(row);
-    }
-    std::set<std::tuple<std::string, unsigned int>> marks;
-    for (const auto& [id, bookmark] : bookmarks)
+    std::set<std::string> marked;
+    std::set<std::pair<std::string, unsigned int>> marks;
+    for (const auto& [id, bookmark] : bookmarks) {
+        marked.insert(id);
         marks.emplace(id, bookmark.markedTime);
+    }
+    std::vector<MediaRow> missing;
+    for (const MediaRow& row : other.rows) {
+        const auto sameId = byId.find(row.id);
+        const auto samePath = byPath.find(row.path);
+        if (sameId == byId.end() && samePath == byPath.end())
+            missing.push_back(row);
+        else if (sameId == byId.end() && marked.contains(row.id) && !marked.contains(samePath->second->id))
+            samePath->second->id = row.id;
+        else if (samePath == byPath.end() && ::access(sameId->second->path.c_str(), F_OK) != 0
+            && ::access(row.path.c_str(), F_OK) == 0)
+            *sameId->second = row;
+    }
+    rows.insert(rows.end(), missing.begin(), missing.end());
     for (const auto& each : other.bookmarks) {
         if (marks.emplace(each.first, each.second.markedTime).second)
             bookmarks.push_back(each);

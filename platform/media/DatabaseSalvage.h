@@ -14,7 +14,7 @@ struct Salvage {
     std::vector<std::pair<std::string, BookmarkRow>> bookmarks; // by the identifier of their row
     bool isComplete = true; // nothing failed
 
-    // Takes over what only the other one has.
+    // Takes over what only the other one has, and what was sound there and is damaged here. Looks at the files.
     void fillFrom(const Salvage& other);
 };
 
