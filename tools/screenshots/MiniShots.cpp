@@ -34,6 +34,7 @@ namespace {
         bool rejects;
         const char* playing;
         const char* language;
+        bool isMirrored = false;
     };
 
     constexpr int READY = MwRecorder::REC_STATE_READY;
@@ -46,6 +47,8 @@ namespace {
         {"playing-long", READY, MwPlayer::PLAY_STATE_PLAYING, 0, false,
             "A very long conversation about everything and nothing in the old harbour.m4a", "en_US"},
         {"play-paused", READY, MwPlayer::PLAY_STATE_PAUSED, 0, false, "Voice 001.m4a", "en_US"},
+        {"recording-mirrored", MwRecorder::REC_STATE_RECORDING, SILENT, 83, false, "", "en_US", true},
+        {"playing-mirrored", READY, MwPlayer::PLAY_STATE_PLAYING, 0, false, "Voice 001.m4a", "en_US", true},
     };
 
     template <typename Surface>
@@ -70,6 +73,7 @@ void takeMiniShots(const std::string& directory, const std::string& suffix, cons
             continue;
         Program program;
         panekit::WLanguage::use(shot.language);
+        elm_config_mirrored_set(shot.isMirrored);
         program.model.setRecorderState(shot.recorder);
         program.model.setPlayerState(shot.player);
         program.model.setElapsedTime(shot.seconds * 1000ULL);
@@ -80,6 +84,7 @@ void takeMiniShots(const std::string& directory, const std::string& suffix, cons
         take<MwLockscreenMiniController>(
             program, MINICONTROL_VIEWER_LOCKSCREEN, directory + "/mini-" + shot.name + "-lock" + suffix + ".png");
         panekit::WLanguage::use("en_US");
+        elm_config_mirrored_set(EINA_FALSE);
         vconf_set_int(VCONFKEY_CALL_RECORDING_REJECT, 0);
     }
 }
