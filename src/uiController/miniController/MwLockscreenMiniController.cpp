@@ -110,7 +110,7 @@ void MwLockscreenMiniController::update()
         if (isRecording())
             _showRecording(getModel()->getRecorderState() == MwRecorder::REC_STATE_PAUSED);
         else
-            MW_LOGI("no recording or playing state!");
+            MW_LOGI("no recordering or playing state!");
     }
     _surface.restoreFocus();
 }

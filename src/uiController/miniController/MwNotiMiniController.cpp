@@ -198,7 +198,7 @@ void MwNotiMiniController::update()
         else if (recorderState == MwRecorder::REC_STATE_PAUSED)
             _showRecordPaused();
         else
-            MW_LOGI("no recording or playing state!");
+            MW_LOGI("no recordering or playing state!");
     }
     _surface.restoreFocus();
 }
