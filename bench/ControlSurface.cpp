@@ -10,7 +10,6 @@
 #include <vector>
 
 #include "MwMiniControllerMgr.h"
-#include "MwRecorder.h"
 #include "bench/LoopHold.h"
 #include "bench/PanelWindow.h"
 
@@ -30,7 +29,7 @@ void runFor(double seconds)
     ecore_main_loop_begin();
 }
 
-double held(bench::Engines& engines, int state)
+double held(bench::Engines& engines, MwRecorderState state)
 {
     bench::LoopHold::restart();
     engines.model.setRecorderState(state);
@@ -76,11 +75,11 @@ int main(int argc, char** argv)
     std::vector<double> created;
     std::vector<double> updated;
     for (int i = 0; i < ROUNDS; ++i) {
-        created.push_back(held(engines, MwRecorder::REC_STATE_RECORDING));
+        created.push_back(held(engines, REC_STATE_RECORDING));
         if (i == 0)
             std::printf("memory %ld\ncreated %.1f\n", residentKilobytes() - before, created.front());
-        updated.push_back(held(engines, MwRecorder::REC_STATE_PAUSED));
-        (void)held(engines, MwRecorder::REC_STATE_READY);
+        updated.push_back(held(engines, REC_STATE_PAUSED));
+        (void)held(engines, REC_STATE_READY);
     }
     created.erase(created.begin());
     std::printf("again %.1f\nupdated %.1f\n", median(created), median(updated));

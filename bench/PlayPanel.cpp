@@ -11,7 +11,6 @@
 #include <sys/resource.h>
 
 #include "MwPlayViewController.h"
-#include "MwPlayer.h"
 #include "bench/Engines.h"
 #include "bench/PanelWindow.h"
 
@@ -82,13 +81,13 @@ int main(int argc, char** argv)
     media_info_destroy(media);
     engines.model.createRecordedFileList();
     engines.model.setCurrentPlayPath(file);
-    engines.model.setPlayerState(MwPlayer::PLAY_STATE_PAUSED);
+    engines.model.setPlayerState(PLAY_STATE_PAUSED);
     auto* panel = new MwPlayViewController(&engines.model, &engines.controller);
     if (!panel->dock(bench::openWindow(360, 640), MwPlayViewController::QUIET))
         return 1;
     runFor(1.0);
     std::printf("paused %.2f\n", percentOfACore());
-    engines.model.setPlayerState(MwPlayer::PLAY_STATE_PLAYING);
+    engines.model.setPlayerState(PLAY_STATE_PLAYING);
     engines.controller.getPlayerUpdatedSignal().emit();
     const double begin = bench::milliseconds();
     const auto report = panekit::WTimer::addTimer(REPORT_PERIOD, [&](void*) {
@@ -97,7 +96,7 @@ int main(int argc, char** argv)
     });
     std::printf("playing %.2f\n", percentOfACore());
     panekit::WTimer::destroy(report);
-    engines.model.setPlayerState(MwPlayer::PLAY_STATE_NONE);
+    engines.model.setPlayerState(PLAY_STATE_NONE);
     panel->destroy();
     return 0;
 }

@@ -10,7 +10,6 @@
 #include <string>
 #include <time.h>
 
-#include "MwPlayer.h"
 #include "MwTrimViewController.h"
 #include "MwTrimWaveform.h"
 #include "bench/Engines.h"
@@ -79,7 +78,7 @@ int main(int argc, char** argv)
     media_info_destroy(media);
     engines.model.createRecordedFileList();
     engines.model.setCurrentPlayPath(file);
-    engines.model.setPlayerState(MwPlayer::PLAY_STATE_PAUSED);
+    engines.model.setPlayerState(PLAY_STATE_PAUSED);
     auto* panel = new MwTrimViewController(&engines.model, &engines.controller);
     Evas_Object* host = bench::openWindow(720, 1280);
     if (!panel->dock(host))

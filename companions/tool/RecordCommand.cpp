@@ -86,7 +86,7 @@ void useAmr(MwModel& model)
 void waitForTheEnd(MwAppController& controller, const MwModel& model, double seconds)
 {
     const auto ended = [&model](void*) {
-        if (model.getRecorderState() == MwRecorder::REC_STATE_RECORDING)
+        if (model.getRecorderState() == REC_STATE_RECORDING)
             return true;
         ecore_main_loop_quit();
         return false;
@@ -101,7 +101,7 @@ void waitForTheEnd(MwAppController& controller, const MwModel& model, double sec
     ecore_event_handler_del(signal);
     panekit::WTimer::destroy(watch);
     panekit::WTimer::destroy(end);
-    if (model.getRecorderState() == MwRecorder::REC_STATE_RECORDING)
+    if (model.getRecorderState() == REC_STATE_RECORDING)
         controller.dispatchCommand(MwAppController::STOP_RECORDING);
 }
 

@@ -20,7 +20,6 @@
 #include "MwLog.h"
 #include "MwMiniControllerMgr.h"
 #include "MwModel.h"
-#include "MwRecorder.h"
 #include "MwRecorderContentViewController.h"
 #include "MwRecordingRescue.h"
 #include "MwRecordingsContentViewController.h"

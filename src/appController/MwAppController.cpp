@@ -25,13 +25,13 @@ const char* indicatorValue(const MwModel& model)
 {
     if (model.getAppState() != MwModel::APP_STATE_PAUSED)
         return "mewlo_none";
-    if (model.getRecorderState() == MwRecorder::REC_STATE_RECORDING)
+    if (model.getRecorderState() == REC_STATE_RECORDING)
         return "bg_recording_start";
-    if (model.getRecorderState() == MwRecorder::REC_STATE_PAUSED)
+    if (model.getRecorderState() == REC_STATE_PAUSED)
         return "bg_recording_pause";
-    if (model.getPlayerState() == MwPlayer::PLAY_STATE_PLAYING)
+    if (model.getPlayerState() == PLAY_STATE_PLAYING)
         return "bg_playing_start";
-    if (model.getPlayerState() == MwPlayer::PLAY_STATE_PAUSED)
+    if (model.getPlayerState() == PLAY_STATE_PAUSED)
         return "bg_playing_pause";
     return "mewlo_none";
 }
@@ -108,16 +108,15 @@ void MwAppController::deinitialize()
     if (_model == nullptr)
         return;
     _disconnectRemote();
-    const int playerState = _model->getPlayerState();
-    const bool plays = playerState == MwPlayer::PLAY_STATE_PLAYING || playerState == MwPlayer::PLAY_STATE_PAUSED;
+    const auto playerState = _model->getPlayerState();
+    const bool plays = playerState == PLAY_STATE_PLAYING || playerState == PLAY_STATE_PAUSED;
     if (_player && plays && !dispatchCommand(STOP_PLAYING))
         MW_LOGE("player stop failed");
     {
         // A command of the worker is waited for, so the state read here is the final one.
         const platform::Lock lock(_commandMutex);
-        const int recorderState = _model->getRecorderState();
-        const bool records
-            = recorderState == MwRecorder::REC_STATE_RECORDING || recorderState == MwRecorder::REC_STATE_PAUSED;
+        const auto recorderState = _model->getRecorderState();
+        const bool records = recorderState == REC_STATE_RECORDING || recorderState == REC_STATE_PAUSED;
         if (_recorder && records && !dispatchCommand(STOP_RECORDING))
             MW_LOGE("recording stop failed");
     }
@@ -192,7 +191,7 @@ bool MwAppController::_createRecorder()
         return false;
     }
     _recorder = std::make_unique<MwRecorder>();
-    _model->setRecorderState(MwRecorder::REC_STATE_READY);
+    _model->setRecorderState(REC_STATE_READY);
     _recorderErrorListener
         = _recorder->errorSignal.addListener([this](MwRecorder::ErrorType type) { _recorderErrorOccurred(type); });
     _recorderInterruptedListener = _recorder->interruptedSignal.addListener([this] { _recorderInterrupted(); });
@@ -210,7 +209,7 @@ bool MwAppController::_destroyRecorder()
     mwForget(_recorder->interruptedSignal, _recorderInterruptedListener);
     mwForget(_recorder->limitReachedSignal, _recorderLimitListener);
     _recorder.reset();
-    _model->setRecorderState(MwRecorder::REC_STATE_NONE);
+    _model->setRecorderState(REC_STATE_NONE);
     return true;
 }
 
@@ -273,8 +272,8 @@ void MwAppController::_recorderErrorOccurred(MwRecorder::ErrorType type)
     _createErrorPopup("Interal Error!");
     _ungrabMediaKey();
     _releaseLock();
-    const int state = _model->getRecorderState();
-    if ((state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED) && _recorder->hasEnded())
+    const auto state = _model->getRecorderState();
+    if ((state == REC_STATE_RECORDING || state == REC_STATE_PAUSED) && _recorder->hasEnded())
         _emitSignalAfterStopRecording(true);
 }
 

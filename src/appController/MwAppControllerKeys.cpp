@@ -50,7 +50,7 @@ void MwAppController::_mediaKeyStatusChanged(media_key_e key, media_key_event_e 
 
 void MwAppController::_mediaKeyPressed(media_key_e key)
 {
-    if (_model->getPlayerState() != MwPlayer::PLAY_STATE_PLAYING)
+    if (_model->getPlayerState() != PLAY_STATE_PLAYING)
         return;
     if (key == MEDIA_KEY_FASTFORWARD)
         _holdSeekKey(_fastForwardTimer, true);
@@ -107,7 +107,7 @@ void MwAppController::_dispatchByKey(Command command, const char* failure)
 
 void MwAppController::_toggleRecording()
 {
-    if (_model->getRecorderState() == MwRecorder::REC_STATE_RECORDING)
+    if (_model->getRecorderState() == REC_STATE_RECORDING)
         _pauseRecordingByKey();
     else
         _resumeRecordingByKey();
@@ -115,27 +115,27 @@ void MwAppController::_toggleRecording()
 
 void MwAppController::_pauseRecordingByKey()
 {
-    if (_model->getRecorderState() == MwRecorder::REC_STATE_RECORDING)
+    if (_model->getRecorderState() == REC_STATE_RECORDING)
         _dispatchByKey(PAUSE_RECORDING, "pause recording failed");
 }
 
 void MwAppController::_resumeRecordingByKey()
 {
-    if (_model->getRecorderState() == MwRecorder::REC_STATE_PAUSED)
+    if (_model->getRecorderState() == REC_STATE_PAUSED)
         _dispatchByKey(RESUME_RECORDING, "resume recording failed");
 }
 
 // On the worker: the window does not wait for the save.
 void MwAppController::_stopRecordingByKey()
 {
-    const int state = _model->getRecorderState();
-    if (state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED)
+    const auto state = _model->getRecorderState();
+    if (state == REC_STATE_RECORDING || state == REC_STATE_PAUSED)
         _emitSignalAfterStopRecording(false);
 }
 
 void MwAppController::_togglePlaying()
 {
-    if (_model->getPlayerState() == MwPlayer::PLAY_STATE_PLAYING)
+    if (_model->getPlayerState() == PLAY_STATE_PLAYING)
         _pausePlayingByKey();
     else
         _resumePlayingByKey();
@@ -143,19 +143,19 @@ void MwAppController::_togglePlaying()
 
 void MwAppController::_pausePlayingByKey()
 {
-    if (_model->getPlayerState() == MwPlayer::PLAY_STATE_PLAYING)
+    if (_model->getPlayerState() == PLAY_STATE_PLAYING)
         _dispatchByKey(PAUSE_PLAYING, "pause playing failed");
 }
 
 void MwAppController::_resumePlayingByKey()
 {
-    if (_model->getPlayerState() == MwPlayer::PLAY_STATE_PAUSED)
+    if (_model->getPlayerState() == PLAY_STATE_PAUSED)
         _dispatchByKey(RESUME_PLAYING, "resume playing failed");
 }
 
 void MwAppController::_playOtherByKey(Command command)
 {
-    if (_model->getPlayerState() != MwPlayer::PLAY_STATE_NONE)
+    if (_model->getPlayerState() != PLAY_STATE_NONE)
         _dispatchByKey(command, command == PLAY_NEXT ? "play next failed!" : "play previous failed!");
 }
 
@@ -180,7 +180,7 @@ void MwAppController::_releaseSeekKey(panekit::WTimer::Weak& timer, Command shor
 
 bool MwAppController::_seekTick(bool forward)
 {
-    if (_model->getPlayerState() == MwPlayer::PLAY_STATE_NONE) {
+    if (_model->getPlayerState() == PLAY_STATE_NONE) {
         MW_LOGE("player state is none!!!!");
         return false;
     }

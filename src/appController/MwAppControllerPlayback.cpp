@@ -115,9 +115,9 @@ bool MwAppController::_stopPlaying()
         MW_LOGE("_player is nullptr");
         return false;
     }
-    const int state = _model->getPlayerState();
-    if (state != MwPlayer::PLAY_STATE_PLAYING && state != MwPlayer::PLAY_STATE_PAUSED) {
-        MW_LOGI("playing state : [%d]!!!", state);
+    const auto state = _model->getPlayerState();
+    if (state != PLAY_STATE_PLAYING && state != PLAY_STATE_PAUSED) {
+        MW_LOGI("playing state : [%d]!!!", mwNumber(state));
     } else if (!_player->stop()) {
         MW_LOGE("play stop failed");
         return false;
@@ -229,7 +229,7 @@ void MwAppController::_playerInterrupted(player_interrupted_code_e code)
     MW_LOGI("BEGIN - player_interrupted_code_e code : [%d]", code);
     _sendMessagePort();
     const bool ended = code == PLAYER_INTERRUPTED_COMPLETED;
-    if (_model->getPlayerState() != MwPlayer::PLAY_STATE_PAUSED) {
+    if (_model->getPlayerState() != PLAY_STATE_PAUSED) {
         _ungrabMediaKey();
         _avrcp->setAvrcpState(MwAvrcp::STOPPED);
     } else if (!ended) {

@@ -29,8 +29,8 @@ constexpr int AUDIO = 0; // kind of recording asked about
 
 bool isRecordingOrPaused(const MwModel& model)
 {
-    const int state = model.getRecorderState();
-    return state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED;
+    const auto state = model.getRecorderState();
+    return state == REC_STATE_RECORDING || state == REC_STATE_PAUSED;
 }
 
 bool isInBackground(const MwModel& model)
@@ -55,8 +55,8 @@ bool MwAppController::_startRecording()
 {
     if (!isComplete(_recorder.get(), _model, _soundSession.get()))
         return false;
-    if (_model->getRecorderState() != MwRecorder::REC_STATE_READY) {
-        MW_LOGE("current state is [%d]!! can't start recording", _model->getRecorderState());
+    if (_model->getRecorderState() != REC_STATE_READY) {
+        MW_LOGE("current state is [%d]!! can't start recording", mwNumber(_model->getRecorderState()));
         return false;
     }
     if (_recorder->isInRecording(AUDIO)) {
@@ -74,7 +74,7 @@ bool MwAppController::_startRecording()
         return false;
     }
     MwLoggingMgr::getInstance()->insert("RECO", "Normal Mode");
-    _model->setRecorderState(MwRecorder::REC_STATE_RECORDING);
+    _model->setRecorderState(REC_STATE_RECORDING);
     _model->saveRecordingNotes();
     _requestLock();
     return true;
@@ -140,13 +140,13 @@ bool MwAppController::_pauseRecording()
 {
     if (!isComplete(_recorder.get(), _model, _soundSession.get()))
         return false;
-    if (_model->getRecorderState() != MwRecorder::REC_STATE_RECORDING) {
-        MW_LOGE("current state is [%d]!! can't pause recording", _model->getRecorderState());
+    if (_model->getRecorderState() != REC_STATE_RECORDING) {
+        MW_LOGE("current state is [%d]!! can't pause recording", mwNumber(_model->getRecorderState()));
         return false;
     }
     const bool paused = _recorder->pause();
     if (paused)
-        _model->setRecorderState(MwRecorder::REC_STATE_PAUSED);
+        _model->setRecorderState(REC_STATE_PAUSED);
     else
         MW_LOGE("recorder pause failed");
     _releaseLock();
@@ -157,8 +157,8 @@ bool MwAppController::_resumeRecording()
 {
     if (!isComplete(_recorder.get(), _model, _soundSession.get()))
         return false;
-    if (_model->getRecorderState() != MwRecorder::REC_STATE_PAUSED) {
-        MW_LOGE("current state is [%d]!! can't resume recording", _model->getRecorderState());
+    if (_model->getRecorderState() != REC_STATE_PAUSED) {
+        MW_LOGE("current state is [%d]!! can't resume recording", mwNumber(_model->getRecorderState()));
         return false;
     }
     MwRecorder::ErrorType error = MwRecorder::ERROR_UNKNOWN;
@@ -167,7 +167,7 @@ bool MwAppController::_resumeRecording()
         _postStartFailure(error);
         return false;
     }
-    _model->setRecorderState(MwRecorder::REC_STATE_RECORDING);
+    _model->setRecorderState(REC_STATE_RECORDING);
     _requestLock();
     return true;
 }
@@ -177,7 +177,7 @@ bool MwAppController::_cancelRecording(bool interrupted)
     if (!isComplete(_recorder.get(), _model, _soundSession.get()))
         return false;
     if (!isRecordingOrPaused(*_model)) {
-        MW_LOGE("current state is [%d]!! can't cancel recording", _model->getRecorderState());
+        MW_LOGE("current state is [%d]!! can't cancel recording", mwNumber(_model->getRecorderState()));
         return false;
     }
     bool cancelled = true;
@@ -192,7 +192,7 @@ bool MwAppController::_cancelRecording(bool interrupted)
     if (hasEnded)
         _releaseTemporaryFile(); // the recorder's own cancel has done it already
     _soundSession->unsetRecordSoundSession();
-    _model->setRecorderState(MwRecorder::REC_STATE_READY);
+    _model->setRecorderState(REC_STATE_READY);
     _model->clearBookMark();
     _model->windBackRecordingFileName();
     _wasDiscarded = cancelled;
@@ -204,7 +204,7 @@ bool MwAppController::_cancelRecording(bool interrupted)
 // The recording has ended by itself, with the result that a stop asks for.
 bool MwAppController::_isOver() const
 {
-    return _model->getRecorderState() == MwRecorder::REC_STATE_READY && (_wasDiscarded || !_lastSavedPath.empty());
+    return _model->getRecorderState() == REC_STATE_READY && (_wasDiscarded || !_lastSavedPath.empty());
 }
 
 // Ends the claim on the temporary path once nothing of this recording is left there.
@@ -228,13 +228,13 @@ bool MwAppController::_stopRecording(bool interrupted)
     if (!isComplete(_recorder.get(), _model, _soundSession.get()))
         return false;
     if (!isRecordingOrPaused(*_model)) {
-        MW_LOGE("current state is [%d]!! can't stop recording", _model->getRecorderState());
+        MW_LOGE("current state is [%d]!! can't stop recording", mwNumber(_model->getRecorderState()));
         return false;
     }
     bool stopped = _commitRecording(interrupted);
     _destroyRecorderHandle();
     _soundSession->unsetRecordSoundSession();
-    _model->setRecorderState(MwRecorder::REC_STATE_READY);
+    _model->setRecorderState(REC_STATE_READY);
     if (stopped && !_saveRecordingFile()) {
         MW_LOGE("_saveRecordingFile failed!!!");
         stopped = false;

@@ -16,8 +16,8 @@ bool MwAppController::_remoteTrackCb(remote_player_track_s* track, void* userDat
 int MwAppController::_remotePositionCb(void* userData)
 {
     const MwModel& model = *static_cast<const MwAppController*>(userData)->_model;
-    const int recorder = model.getRecorderState();
-    const bool records = recorder == MwRecorder::REC_STATE_RECORDING || recorder == MwRecorder::REC_STATE_PAUSED;
+    const MwRecorderState recorder = model.getRecorderState();
+    const bool records = recorder == REC_STATE_RECORDING || recorder == REC_STATE_PAUSED;
     return records ? static_cast<int>(model.getElapsedTime()) : static_cast<int>(model.getCurrentPlayPosition());
 }
 
@@ -50,7 +50,7 @@ bool MwAppController::_remoteTrack(remote_player_track_s& track) const
 
 void MwAppController::_seekByRemote(unsigned int position)
 {
-    if (_model->getPlayerState() == MwPlayer::PLAY_STATE_NONE)
+    if (_model->getPlayerState() == PLAY_STATE_NONE)
         return;
     _model->setCurrentPlayPosition(position);
     if (!dispatchCommand(SET_PLAYER_POSITION))

@@ -14,7 +14,6 @@
 #include <utility>
 
 #include "MwLog.h"
-#include "MwRecorder.h"
 #include "MwRecordingNotes.h"
 #include "MwSavedBookmarks.h"
 #include "MwStorageRoots.h"
@@ -55,14 +54,14 @@ void postTooManyBookmarks()
 
 }
 
-void MwModel::setRecorderState(int state)
+void MwModel::setRecorderState(MwRecorderState state)
 {
-    const int before = _recorderState.exchange(state);
+    const MwRecorderState before = _recorderState.exchange(state);
     // For the desktop: what its remote controls show, and whether a shutdown waits for the recording to be saved. An
     // instance that only comes and goes beside a recording one must not speak for it.
-    const bool isRecordings = state >= MwRecorder::REC_STATE_RECORDING || before >= MwRecorder::REC_STATE_RECORDING;
+    const bool isRecordings = state >= REC_STATE_RECORDING || before >= REC_STATE_RECORDING;
     if (!_requestMode || isRecordings) {
-        vconf_set_int(VCONFKEY_MEWLO_RECORDER_STATE, state);
+        vconf_set_int(VCONFKEY_MEWLO_RECORDER_STATE, mwNumber(state));
         vconf_set_str(VCONFKEY_MEWLO_TITLE, getCurrentRecordingFileName().c_str());
     }
     if (_requestMode)
@@ -70,16 +69,16 @@ void MwModel::setRecorderState(int state)
     const auto [process, start] = identityOf(::getpid());
     MW_CALL(preference_set_int, RECORDING_PROCESS_KEY, process);
     MW_CALL(preference_set_int, RECORDING_PROCESS_START_KEY, start);
-    MW_CALL(preference_set_int, RECORDING_STATE_KEY, state);
+    MW_CALL(preference_set_int, RECORDING_STATE_KEY, mwNumber(state));
 }
 
 bool MwModel::isMainInstanceRecording()
 {
-    int state = MwRecorder::REC_STATE_NONE;
+    int state = mwNumber(REC_STATE_NONE);
     int process = 0;
     int start = 0;
     if (preference_get_int(RECORDING_STATE_KEY, &state) != 0
-        || (state != MwRecorder::REC_STATE_RECORDING && state != MwRecorder::REC_STATE_PAUSED))
+        || (state != mwNumber(REC_STATE_RECORDING) && state != mwNumber(REC_STATE_PAUSED)))
         return false;
     return preference_get_int(RECORDING_PROCESS_KEY, &process) == 0
         && preference_get_int(RECORDING_PROCESS_START_KEY, &start) == 0 && process > 0

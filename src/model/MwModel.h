@@ -12,6 +12,8 @@
 #include <vector>
 
 #include "MwHandle.h"
+#include "MwPlayerState.h"
+#include "MwRecorderState.h"
 
 enum MwStorageType : int { MW_STORAGE_DEVICE = 0, MW_STORAGE_CARD = 1 };
 
@@ -126,9 +128,9 @@ public:
 
     int getAppState() const { return _appState; }
     void setAppState(int state) { _appState = state; }
-    int getRecorderState() const { return _recorderState; }
+    MwRecorderState getRecorderState() const { return _recorderState; }
     // Also publishes the state to other instances, unless this one serves a request.
-    void setRecorderState(int state);
+    void setRecorderState(MwRecorderState state);
     // What an instance published that still runs: whether it records or holds a recording.
     [[nodiscard]] static bool isMainInstanceRecording();
     int getAudioCodec() const { return _audioCodec; }
@@ -156,8 +158,8 @@ public:
     [[nodiscard]] bool isTooShort() const { return _elapsedTime < SHORTEST_RECORDING; }
     double getLevel() const { return _level; } // decibels
     void setLevel(double decibels) { _level = decibels; }
-    int getPlayerState() const { return _playerState; }
-    void setPlayerState(int state) { _playerState = state; }
+    MwPlayerState getPlayerState() const { return _playerState; }
+    void setPlayerState(MwPlayerState state) { _playerState = state; }
     [[nodiscard]] std::string getCurrentPlayPath() const { return _text(&Texts::playPath); }
     void setCurrentPlayPath(const std::string& path) { _setText(&Texts::playPath, path); }
     unsigned int getCurrentPlayPosition() const { return _playPosition; } // milliseconds
@@ -219,7 +221,7 @@ private:
     mutable platform::Mutex _mutex;
     Texts _texts GUARDED_BY(_mutex);
     std::atomic<int> _appState = APP_STATE_CREATED;
-    std::atomic<int> _recorderState = 0;
+    std::atomic<MwRecorderState> _recorderState = REC_STATE_NONE;
     std::atomic<int> _audioCodec = CODEC_AAC;
     std::atomic<int> _fileFormat = FORMAT_MP4;
     std::atomic<int> _sizeLimit = NO_SIZE_LIMIT;
@@ -230,7 +232,7 @@ private:
     FileNumbers _numbers GUARDED_BY(_mutex);
     std::atomic<unsigned long long> _elapsedTime = 0;
     std::atomic<double> _level = SILENCE;
-    std::atomic<int> _playerState = 0;
+    std::atomic<MwPlayerState> _playerState = PLAY_STATE_NONE;
     std::atomic<unsigned int> _playPosition = 0;
     std::atomic<bool> _requestMode = false;
     std::atomic<bool> _typeRequested = false;

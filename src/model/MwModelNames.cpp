@@ -6,7 +6,6 @@
 #include <string_view>
 
 #include "MwLog.h"
-#include "MwRecorder.h"
 #include "MwText.h"
 
 namespace {
@@ -146,8 +145,7 @@ bool MwModel::updateNextRecordingFileName()
 {
     const platform::Lock lock(_mutex);
     // The screen asks again whenever it comes back; a running recording keeps the name that the screen shows.
-    const bool runs
-        = _recorderState == MwRecorder::REC_STATE_RECORDING || _recorderState == MwRecorder::REC_STATE_PAUSED;
+    const bool runs = _recorderState == REC_STATE_RECORDING || _recorderState == REC_STATE_PAUSED;
     if (runs)
         return true;
     _nameIsChosen = false;

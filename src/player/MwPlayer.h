@@ -6,6 +6,8 @@
 
 #include <panekit/WSignal.h>
 
+#include "MwPlayerState.h"
+
 class MwModel;
 class _MwPlayerImpl;
 
@@ -14,7 +16,7 @@ class _MwPlayerImpl;
 class MwPlayer {
 public:
     // Kept in the model by the engine.
-    enum PlayState : int { PLAY_STATE_NONE, PLAY_STATE_PLAYING, PLAY_STATE_PAUSED };
+    using PlayState = MwPlayerState;
     enum PlayerErrorType : int { PLAYBACK_ERROR = 2 };
 
     // The model is borrowed.

@@ -87,7 +87,7 @@ bool _MwPlayerImpl::_start()
     if (!_succeeded(player_start(_handle), "player_start")
         || !_succeeded(player_get_duration(_handle, &duration), "player_get_duration"))
         return _stopAfterFailedStart();
-    _model->setPlayerState(MwPlayer::PLAY_STATE_PLAYING);
+    _model->setPlayerState(PLAY_STATE_PLAYING);
     _startPlayerTimer();
     MW_LOGW("END");
     return true;
@@ -109,7 +109,7 @@ bool _MwPlayerImpl::_pause()
     }
     if (!_succeeded(player_pause(_handle), "player_pause"))
         return false;
-    _model->setPlayerState(MwPlayer::PLAY_STATE_PAUSED);
+    _model->setPlayerState(PLAY_STATE_PAUSED);
     _stopPlayerTimer();
     MW_LOGW("END");
     return true;
@@ -132,7 +132,7 @@ bool _MwPlayerImpl::_resume()
         MW_LOGE("setPlayPosition failed!!!");
         return false;
     }
-    _model->setPlayerState(MwPlayer::PLAY_STATE_PLAYING);
+    _model->setPlayerState(PLAY_STATE_PLAYING);
     _startPlayerTimer();
     MW_LOGW("END");
     return true;
@@ -182,7 +182,7 @@ bool _MwPlayerImpl::_destroyPlayerHandle()
         return false;
     _stopPlayerTimer();
     _model->setCurrentPlayPosition(0);
-    _model->setPlayerState(MwPlayer::PLAY_STATE_NONE);
+    _model->setPlayerState(PLAY_STATE_NONE);
     return true;
 }
 
@@ -278,7 +278,7 @@ void _MwPlayerImpl::_interruptedCb(player_interrupted_code_e code, void* userDat
     player_state_e state = PLAYER_STATE_NONE;
     _succeeded(player_get_state(self->_handle, &state), "player_get_state");
     if (state == PLAYER_STATE_PAUSED) {
-        self->_model->setPlayerState(MwPlayer::PLAY_STATE_PAUSED);
+        self->_model->setPlayerState(PLAY_STATE_PAUSED);
     } else {
         MW_LOGE("player state  : [%d]", state);
         if (!self->_destroyPlayerHandle())

@@ -4,6 +4,8 @@
 
 #include <panekit/WSignal.h>
 
+#include "MwRecorderState.h"
+
 class MwModel;
 
 // Drives one service recorder for one recording after the other: configured from the model, guarded by its state, its
@@ -19,8 +21,7 @@ public:
         ERROR_STORAGE, // it fails while the recording goes on
     };
     enum LimitType : int { LIMIT_NONE, LIMIT_TIME, LIMIT_SIZE, LIMIT_FREE_SPACE };
-    // Kept in the model by the controller.
-    enum RecordingState : int { REC_STATE_NONE, REC_STATE_READY, REC_STATE_RECORDING, REC_STATE_PAUSED };
+    using RecordingState = MwRecorderState; // kept in the model by the controller
 
     MwRecorder() = default;
     ~MwRecorder();

@@ -30,7 +30,7 @@ protected:
         media_bookmark_insert_to_db(_mediaId.c_str(), 3725, "three");
         media_bookmark_insert_to_db(_mediaId.c_str(), 5, "one");
         media_bookmark_insert_to_db(_mediaId.c_str(), 65, "two");
-        _screen.load(FILE_NAME, MwPlayer::PLAY_STATE_PAUSED);
+        _screen.load(FILE_NAME, PLAY_STATE_PAUSED);
         _top = new MwBookmarksContentViewController(&_screen.model, _screen.controller(), _mediaId);
         _view = _screen.push(_top);
         _list = elm_object_part_content_get(_view, "elm.swallow.list");
@@ -132,7 +132,7 @@ TEST_F(BookmarksScreenTest, ListsByTimeAndJumps)
     support::key(_screen.window, "Right");
     EXPECT_EQ(70000U, _screen.model.getCurrentPlayPosition());
     support::key(_screen.window, "space", " ");
-    EXPECT_EQ(MwPlayer::PLAY_STATE_PLAYING, _screen.model.getPlayerState());
+    EXPECT_EQ(PLAY_STATE_PLAYING, _screen.model.getPlayerState());
 }
 
 TEST_F(BookmarksScreenTest, DeletesWhatIsChecked)

@@ -3,8 +3,6 @@
 #include <utility>
 
 #include "MwAvrcp.h"
-#include "MwPlayer.h"
-#include "MwRecorder.h"
 #include "MwSoundSession.h"
 
 class MwAppController::AsyncCmdControl { };

@@ -9,8 +9,6 @@
 
 #include "FakeApp.h"
 #include "MwMiniControllerMgr.h"
-#include "MwPlayer.h"
-#include "MwRecorder.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
 #include "ScreenWindow.h"
@@ -27,12 +25,12 @@ namespace {
 using App = MwAppController;
 using Names = std::vector<std::string>;
 
-constexpr int RECORDS = MwRecorder::REC_STATE_RECORDING;
-constexpr int RESTS = MwRecorder::REC_STATE_PAUSED;
-constexpr int READY = MwRecorder::REC_STATE_READY;
-constexpr int PLAYS = MwPlayer::PLAY_STATE_PLAYING;
-constexpr int PLAY_RESTS = MwPlayer::PLAY_STATE_PAUSED;
-constexpr int SILENT = MwPlayer::PLAY_STATE_NONE;
+constexpr auto RECORDS = REC_STATE_RECORDING;
+constexpr auto RESTS = REC_STATE_PAUSED;
+constexpr auto READY = REC_STATE_READY;
+constexpr auto PLAYS = PLAY_STATE_PLAYING;
+constexpr auto PLAY_RESTS = PLAY_STATE_PAUSED;
+constexpr auto SILENT = PLAY_STATE_NONE;
 constexpr int PANEL = MINICONTROL_VIEWER_PANEL;
 constexpr int LOCK = MINICONTROL_VIEWER_LOCKSCREEN;
 
@@ -48,13 +46,13 @@ public:
         manager = std::make_unique<MwMiniControllerMgr>(&model, ScreenWindow::controller(), &program);
     }
     ~Surfaces() override { manager.reset(); }
-    void record(int state, unsigned long long elapsed = 5000)
+    void record(MwRecorderState state, unsigned long long elapsed = 5000)
     {
         model.setElapsedTime(elapsed);
         model.setRecorderState(state);
         ScreenWindow::controller()->getRecorderUpdatedSignal().emit();
     }
-    void play(int state)
+    void play(MwPlayerState state)
     {
         model.setCurrentPlayPath("/somewhere/Voice <1>.m4a");
         model.setPlayerState(state);
@@ -126,8 +124,8 @@ TEST(MiniControllerTest, SurfacesComeAndGoWithWhatIsGoingOn)
 {
     struct {
         const char* name;
-        int recorder;
-        int player;
+        MwRecorderState recorder;
+        MwPlayerState player;
         bool locked;
         bool panel;
         bool lockscreen;
@@ -173,8 +171,8 @@ TEST(MiniControllerTest, SurfacesComeAndGoWithWhatIsGoingOn)
 TEST(MiniControllerTest, ButtonsFitTheStateAndBecomeCommands)
 {
     struct {
-        int recorder;
-        int player;
+        MwRecorderState recorder;
+        MwPlayerState player;
         bool panelShown;
         Names panel;
         Names lockscreen;
@@ -198,8 +196,8 @@ TEST(MiniControllerTest, ButtonsFitTheStateAndBecomeCommands)
     }
     const struct {
         int viewer;
-        int recorder;
-        int player;
+        MwRecorderState recorder;
+        MwPlayerState player;
         const char* part;
         App::Command command;
     } presses[] = {
@@ -379,7 +377,7 @@ TEST(MiniControllerTest, ANotificationTakesThePlaceOfTheWindow)
         fakes::setNotificationSupported(c.isSupported);
         preference_set_boolean(PREFERENCE_USE_NOTIFICATION_CONTROL, c.isPreferred);
         const auto isShown = [] { return !fakes::notification.text.empty(); };
-        for (const int state : {RECORDS, RESTS}) {
+        for (const MwRecorderState state : {RECORDS, RESTS}) {
             surfaces.setAway(false);
             surfaces.record(state);
             EXPECT_EQ(c.window, Surfaces::has(PANEL));
@@ -407,7 +405,7 @@ TEST(MiniControllerTest, ANotificationTakesThePlaceOfTheWindow)
 TEST(MiniControllerTest, TheNotificationActsLikeTheWindow)
 {
     struct {
-        int state;
+        MwRecorderState state;
         const char* key;
         std::vector<App::Command> commands;
     } const presses[] = {

@@ -150,7 +150,7 @@ bool PanelScreen::_play(const std::string& path)
 {
     model.setCurrentPlayPath(path);
     model.setCurrentPlayPosition(0);
-    model.setPlayerState(MwPlayer::PLAY_STATE_PLAYING);
+    model.setPlayerState(PLAY_STATE_PLAYING);
     announce();
     return true;
 }
@@ -162,11 +162,11 @@ bool PanelScreen::execute(MwAppController::Command command)
     switch (command) {
     case MwAppController::START_PLAYING:
     case MwAppController::RESUME_PLAYING:
-        model.setPlayerState(MwPlayer::PLAY_STATE_PLAYING);
+        model.setPlayerState(PLAY_STATE_PLAYING);
         announce();
         return true;
     case MwAppController::PAUSE_PLAYING:
-        model.setPlayerState(MwPlayer::PLAY_STATE_PAUSED);
+        model.setPlayerState(PLAY_STATE_PAUSED);
         announce();
         return true;
     case MwAppController::PLAY_PREVIOUS:

@@ -19,7 +19,7 @@ RecorderScreen::RecorderScreen(bool requestMode, int sizeLimit, int format, int 
     model.setSizeLimit(sizeLimit);
     model.setFileFormat(format);
     model.setCurrentRecordingFileName("Voice 001");
-    model.setRecorderState(MwRecorder::REC_STATE_READY);
+    model.setRecorderState(REC_STATE_READY);
     auto* screen = new MwRecorderContentViewController(&model, controller());
     naviframe->push(screen);
     view = screen->getEvasObject();
@@ -31,13 +31,13 @@ bool RecorderScreen::execute(MwAppController::Command command)
     switch (command) {
     case MwAppController::START_RECORDING:
     case MwAppController::RESUME_RECORDING:
-        enter(MwRecorder::REC_STATE_RECORDING);
+        enter(REC_STATE_RECORDING);
         return true;
     case MwAppController::PAUSE_RECORDING:
-        enter(MwRecorder::REC_STATE_PAUSED);
+        enter(REC_STATE_PAUSED);
         return true;
     default:
-        enter(MwRecorder::REC_STATE_READY);
+        enter(REC_STATE_READY);
         return true;
     }
 }

@@ -49,7 +49,7 @@ TEST(RecorderThemeTest, TextsOnTheScreenFollowTheThemeAtOnce)
 {
     ui::RecorderScreen screen;
     screen.model.setRenameString("Interview");
-    screen.enter(MwRecorder::REC_STATE_READY);
+    screen.enter(REC_STATE_READY);
     const auto redOf = [&](const char* part) {
         int red = 0;
         support::settle(screen.window);
@@ -86,16 +86,16 @@ TEST(RecorderScreenTest, EachStateShowsItsButtons)
         const char* buttons;
         bool ring;
     } cases[] = {
-        {false, MwRecorder::REC_STATE_NONE, "record_button recordings_button", false},
-        {false, MwRecorder::REC_STATE_READY, "record_button recordings_button", false},
-        {false, MwRecorder::REC_STATE_RECORDING, "stop_button bookmark_button pause_button", true},
-        {false, MwRecorder::REC_STATE_PAUSED, "stop_button bookmark_button resume_button", false},
-        {true, MwRecorder::REC_STATE_READY, "record_button recordings_button", false},
-        {true, MwRecorder::REC_STATE_RECORDING, "stop_button pause_button", true},
-        {true, MwRecorder::REC_STATE_PAUSED, "stop_button resume_button", false},
+        {false, REC_STATE_NONE, "record_button recordings_button", false},
+        {false, REC_STATE_READY, "record_button recordings_button", false},
+        {false, REC_STATE_RECORDING, "stop_button bookmark_button pause_button", true},
+        {false, REC_STATE_PAUSED, "stop_button bookmark_button resume_button", false},
+        {true, REC_STATE_READY, "record_button recordings_button", false},
+        {true, REC_STATE_RECORDING, "stop_button pause_button", true},
+        {true, REC_STATE_PAUSED, "stop_button resume_button", false},
     };
     for (const auto& each : cases) {
-        SCOPED_TRACE(each.state);
+        SCOPED_TRACE(mwNumber(each.state));
         ui::RecorderScreen screen(each.requestMode);
         screen.enter(each.state);
         EXPECT_EQ(each.buttons, shownButtons(screen));
@@ -115,16 +115,16 @@ TEST(RecorderScreenTest, ShowsNameTimeAndFormat)
     EXPECT_EQ("Recording for a message", screen.text("subtitle_text"));
     screen.model.setRenameString("A & B");
     screen.model.setFileFormat(MwModel::FORMAT_MP4);
-    screen.enter(MwRecorder::REC_STATE_READY);
+    screen.enter(REC_STATE_READY);
     EXPECT_EQ("A &amp; B", screen.text("file_name_text"));
     EXPECT_EQ("", screen.text("subtitle_text"));
-    screen.enter(MwRecorder::REC_STATE_RECORDING);
+    screen.enter(REC_STATE_RECORDING);
     EXPECT_EQ("Voice 001", screen.text("file_name_text"));
     screen.model.setElapsedTime(3599999);
     ASSERT_TRUE(support::runUntil([&] { return screen.text("recording_time") == "59:59"; }));
     screen.model.setElapsedTime(3600000);
     ASSERT_TRUE(support::runUntil([&] { return screen.text("recording_time") == "01:00:00"; }));
-    screen.enter(MwRecorder::REC_STATE_READY);
+    screen.enter(REC_STATE_READY);
     EXPECT_EQ("00:00", screen.text("recording_time"));
     EXPECT_EQ(0U, screen.model.getElapsedTime());
 }
@@ -134,7 +134,7 @@ TEST(RecorderScreenTest, CountsDownForARequestWithALimit)
     ui::RecorderScreen screen(true, 100, MwModel::FORMAT_AMR);
     EXPECT_EQ(63, screen.model.getEstimatedRecordingMaxTime());
     EXPECT_EQ("01:03", screen.text("recording_time"));
-    screen.enter(MwRecorder::REC_STATE_RECORDING);
+    screen.enter(REC_STATE_RECORDING);
     screen.model.setElapsedTime(3000);
     ASSERT_TRUE(support::runUntil([&] { return screen.text("recording_time") == "01:00"; }));
     screen.more();
@@ -148,13 +148,13 @@ TEST(RecorderScreenTest, BlinksWhilePausedAndIsSteadyAfterwards)
 {
     ui::RecorderScreen screen;
     screen.model.setElapsedTime(5000);
-    screen.enter(MwRecorder::REC_STATE_PAUSED);
+    screen.enter(REC_STATE_PAUSED);
     const auto state = [&] { return support::partState(screen.view, "recording_time_clip_rect"); };
     EXPECT_EQ("default", state());
     ASSERT_TRUE(support::runUntil([&] { return state() == "hidden"; }));
     ASSERT_TRUE(support::runUntil([&] { return state() == "default"; }));
     ASSERT_TRUE(support::runUntil([&] { return state() == "hidden"; }));
-    screen.enter(MwRecorder::REC_STATE_RECORDING);
+    screen.enter(REC_STATE_RECORDING);
     EXPECT_EQ("default", state());
     support::runFor(1.1);
     EXPECT_EQ("default", state());
@@ -224,7 +224,7 @@ TEST(RecorderScreenTest, TooShortIsCancelledAtTheLastMillisecond)
     for (const auto& each : cases) {
         SCOPED_TRACE(each.elapsed);
         ui::RecorderScreen screen;
-        screen.enter(MwRecorder::REC_STATE_PAUSED);
+        screen.enter(REC_STATE_PAUSED);
         screen.model.setElapsedTime(each.elapsed);
         screen.press("stop_button");
         fakes::controller.finish();
@@ -238,7 +238,7 @@ TEST(RecorderScreenTest, AFailedStopSaysSoAndEnds)
 {
     for (const unsigned long long elapsed : {500ULL, 5000ULL}) {
         ui::RecorderScreen screen;
-        screen.enter(MwRecorder::REC_STATE_RECORDING);
+        screen.enter(REC_STATE_RECORDING);
         screen.model.setElapsedTime(elapsed);
         fakes::controller.onCommand = [](MwAppController::Command) { return false; };
         screen.press("stop_button");
@@ -267,7 +267,7 @@ TEST(RecorderScreenTest, AResultAfterTheScreenHasGoneIsDropped)
 TEST(RecorderScreenTest, PauseAndResumeRedrawAlsoAfterAFailure)
 {
     ui::RecorderScreen screen;
-    screen.enter(MwRecorder::REC_STATE_RECORDING);
+    screen.enter(REC_STATE_RECORDING);
     screen.press("pause_button");
     EXPECT_NE(nullptr, screen.button("resume_button"));
     screen.press("resume_button");
@@ -283,7 +283,7 @@ TEST(RecorderScreenTest, PauseAndResumeRedrawAlsoAfterAFailure)
 TEST(RecorderScreenTest, BookmarksAreTakenOncePerSecondAndShown)
 {
     ui::RecorderScreen screen;
-    screen.enter(MwRecorder::REC_STATE_RECORDING);
+    screen.enter(REC_STATE_RECORDING);
     screen.model.setElapsedTime(65000);
     screen.press("bookmark_button");
     EXPECT_EQ("01:05", screen.text("bookmark_time"));
@@ -320,7 +320,7 @@ TEST(RecorderScreenTest, TheMenuFollowsStateCallRejectionAndCard)
         vconf_set_int(VCONFKEY_SYSMAN_MMC_STATUS, 0);
     }
     ui::RecorderScreen screen;
-    screen.enter(MwRecorder::REC_STATE_RECORDING);
+    screen.enter(REC_STATE_RECORDING);
     EXPECT_EQ(Texts{"Reject calls"}, labels(screen));
     support::runFor(0.3);
     support::key(screen.window, "Return");
@@ -329,7 +329,7 @@ TEST(RecorderScreenTest, TheMenuFollowsStateCallRejectionAndCard)
     EXPECT_EQ("on", support::partState(screen.view, "call_rejection"));
     EXPECT_EQ("Calls are rejected while recording.", fakes::desktop.lastMessage);
     EXPECT_EQ(Texts{"Stop rejecting calls"}, labels(screen));
-    screen.enter(MwRecorder::REC_STATE_READY);
+    screen.enter(REC_STATE_READY);
     EXPECT_FALSE(MwSystemMgr::getInstance()->getRejectCall());
     EXPECT_EQ("default", support::partState(screen.view, "call_rejection"));
 }
@@ -337,7 +337,7 @@ TEST(RecorderScreenTest, TheMenuFollowsStateCallRejectionAndCard)
 TEST(RecorderScreenTest, BackAsksBeforeDiscarding)
 {
     ui::RecorderScreen screen;
-    screen.enter(MwRecorder::REC_STATE_RECORDING);
+    screen.enter(REC_STATE_RECORDING);
     unsigned int marked = 0;
     screen.model.setElapsedTime(5000);
     ASSERT_TRUE(screen.model.addBookMark(marked));
@@ -357,9 +357,9 @@ TEST(RecorderScreenTest, BackAsksBeforeDiscarding)
     EXPECT_EQ("record_button recordings_button", shownButtons(screen));
     EXPECT_EQ("Recording discarded.", fakes::desktop.lastMessage);
 
-    screen.enter(MwRecorder::REC_STATE_PAUSED);
+    screen.enter(REC_STATE_PAUSED);
     screen.back();
-    screen.enter(MwRecorder::REC_STATE_READY); // ended elsewhere: nothing left to discard
+    screen.enter(REC_STATE_READY); // ended elsewhere: nothing left to discard
     EXPECT_EQ(nullptr, WPopupController::topmost());
 }
 
@@ -374,9 +374,9 @@ TEST(RecorderScreenTest, KeysOfTheBigButton)
     support::key(screen.window, "b");
     EXPECT_EQ(1U, screen.model.getBookmarkList().size());
     support::key(screen.window, "space");
-    EXPECT_EQ(MwRecorder::REC_STATE_PAUSED, screen.model.getRecorderState());
+    EXPECT_EQ(REC_STATE_PAUSED, screen.model.getRecorderState());
     support::key(screen.window, "space");
-    EXPECT_EQ(MwRecorder::REC_STATE_RECORDING, screen.model.getRecorderState());
+    EXPECT_EQ(REC_STATE_RECORDING, screen.model.getRecorderState());
     screen.model.setElapsedTime(6000);
     support::settle(screen.window);
     support::key(screen.window, "Return");
@@ -416,7 +416,7 @@ TEST(RecorderScreenTest, SaveToChoosesTheStorage)
 
 TEST(RecorderScreenTest, APulledCardSavesWhatItCanAndNothingElseIsSentMeanwhile)
 {
-    for (const auto state : {MwRecorder::REC_STATE_RECORDING, MwRecorder::REC_STATE_PAUSED}) {
+    for (const auto state : {REC_STATE_RECORDING, REC_STATE_PAUSED}) {
         ui::RecorderScreen screen;
         vconf_set_int(VCONFKEY_SYSMAN_MMC_STATUS, 1);
         screen.model.setStorageType(MW_STORAGE_CARD);
@@ -445,7 +445,7 @@ TEST(RecorderScreenTest, SystemEvents)
     ui::RecorderScreen screen;
     emit(MwSignalMgr::EARJACK_INSERTED);
     EXPECT_EQ("Recording with the external microphone.", fakes::desktop.lastMessage);
-    screen.model.setRecorderState(MwRecorder::REC_STATE_NONE);
+    screen.model.setRecorderState(REC_STATE_NONE);
     emit(MwSignalMgr::EARJACK_INSERTED);
     EXPECT_EQ("The external microphone will be used to record.", fakes::desktop.lastMessage);
     emit(MwSignalMgr::MINI_CONTROLLER_RECORDING_SAVED);
@@ -453,7 +453,7 @@ TEST(RecorderScreenTest, SystemEvents)
     emit(MwSignalMgr::POWER_OFF);
     emit(MwSignalMgr::UPS_MODE_CHANGED);
     EXPECT_EQ(2U, fakes::calls.count("ui_app_exit"));
-    screen.enter(MwRecorder::REC_STATE_READY);
+    screen.enter(REC_STATE_READY);
     screen.more();
     EXPECT_TRUE(screen.naviframe->getTop()->hasAttachedPopup());
     emit(MwSignalMgr::MEDIA_DB_UPDATED);
@@ -466,7 +466,7 @@ TEST(RecorderScreenTest, PausesItsAnimationsWithTheApplication)
 {
     ui::RecorderScreen screen;
     emit(MwSignalMgr::RESUME); // the one of the start
-    screen.enter(MwRecorder::REC_STATE_RECORDING);
+    screen.enter(REC_STATE_RECORDING);
     ASSERT_TRUE(hasRing(screen));
     emit(MwSignalMgr::PAUSE);
     EXPECT_FALSE(hasRing(screen));
@@ -481,7 +481,7 @@ TEST(RecorderScreenTest, PausesItsAnimationsWithTheApplication)
 TEST(RecorderScreenTest, AWideWindowKeepsAColumnAndTouchTargetsStayLarge)
 {
     ui::RecorderScreen screen(1400, 640);
-    screen.enter(MwRecorder::REC_STATE_RECORDING);
+    screen.enter(REC_STATE_RECORDING);
     support::settle(screen.window);
     for (const char* part : {"stop_button", "bookmark_button", "pause_button", "discard_button"}) {
         int x = 0;

@@ -9,7 +9,6 @@
 #include <media_content.h>
 #include <panekit/WContentViewController.h>
 
-#include "MwPlayer.h"
 #include "MwRecordingsContentViewController.h"
 #include "support/DatabaseRows.h"
 #include "support/Recordings.h"
@@ -64,13 +63,13 @@ bool RecordingsScreen::execute(MwAppController::Command command)
     case MwAppController::START_PLAYING:
     case MwAppController::RESTART_PLAYING:
     case MwAppController::RESUME_PLAYING:
-        model.setPlayerState(MwPlayer::PLAY_STATE_PLAYING);
+        model.setPlayerState(PLAY_STATE_PLAYING);
         break;
     case MwAppController::PAUSE_PLAYING:
-        model.setPlayerState(MwPlayer::PLAY_STATE_PAUSED);
+        model.setPlayerState(PLAY_STATE_PAUSED);
         break;
     case MwAppController::STOP_PLAYING:
-        model.setPlayerState(MwPlayer::PLAY_STATE_NONE);
+        model.setPlayerState(PLAY_STATE_NONE);
         break;
     default:
         return true;

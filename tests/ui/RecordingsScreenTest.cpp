@@ -13,7 +13,6 @@
 #include <fstream>
 
 #include "MwDisplayText.h"
-#include "MwPlayer.h"
 #include "MwRecordingsListItem.h"
 #include "RecordingsScreen.h"
 #include "fakes/Fakes.h"
@@ -219,7 +218,7 @@ TEST_F(RecordingsScreenTest, ACommandThatFailsLeavesTheListAsItIs)
     EXPECT_EQ("", screen.model.getCurrentPlayPath());
     EXPECT_TRUE(screen.hasRecordButton());
     screen.model.setCurrentPlayPath(ui::recordingPath("A.m4a"));
-    screen.model.setPlayerState(MwPlayer::PLAY_STATE_PLAYING);
+    screen.model.setPlayerState(PLAY_STATE_PLAYING);
     screen.playerChanged();
     screen.tap("A.m4a");
     EXPECT_TRUE(fakes::log.has("play pause failed!"));
@@ -286,7 +285,7 @@ TEST_F(RecordingsScreenTest, ARecordingDeletedElsewhereClosesItsPlayer)
     EXPECT_TRUE(screen.hasRecordButton());
     EXPECT_EQ("", screen.model.getCurrentPlayPath());
     EXPECT_EQ(MwAppController::STOP_PLAYING, fakes::controller.commands.back());
-    EXPECT_EQ(MwPlayer::PLAY_STATE_NONE, screen.model.getPlayerState());
+    EXPECT_EQ(PLAY_STATE_NONE, screen.model.getPlayerState());
 }
 
 TEST_F(RecordingsScreenTest, EventsOfTheDeviceStopPauseAndTell)
@@ -301,10 +300,10 @@ TEST_F(RecordingsScreenTest, EventsOfTheDeviceStopPauseAndTell)
     screen.announce(MwSignalMgr::EARJACK_INSERTED);
     EXPECT_EQ("", fakes::desktop.lastMessage);
     screen.announce(MwSignalMgr::EARJACK_REMOVED);
-    EXPECT_EQ(MwPlayer::PLAY_STATE_PAUSED, screen.model.getPlayerState());
+    EXPECT_EQ(PLAY_STATE_PAUSED, screen.model.getPlayerState());
     EXPECT_FALSE(fakes::calls.has("ui_app_exit"));
     screen.announce(MwSignalMgr::POWER_OFF);
-    EXPECT_EQ(MwPlayer::PLAY_STATE_NONE, screen.model.getPlayerState());
+    EXPECT_EQ(PLAY_STATE_NONE, screen.model.getPlayerState());
     EXPECT_TRUE(fakes::calls.has("ui_app_exit"));
 }
 
@@ -494,7 +493,7 @@ TEST_F(RecordingsScreenTest, TheKeyboardDoesWhatTheMouseDoes)
     screen.key("Return");
     EXPECT_EQ(ui::recordingPath("B.m4a"), screen.model.getCurrentPlayPath());
     screen.key("space");
-    EXPECT_EQ(MwPlayer::PLAY_STATE_PAUSED, screen.model.getPlayerState());
+    EXPECT_EQ(PLAY_STATE_PAUSED, screen.model.getPlayerState());
     screen.key("Right");
     screen.key("Right");
     screen.key("Left");

@@ -190,7 +190,7 @@ TEST_F(MwPlayerTest, StartFailuresLeaveNothingPlaying)
         calls.clear();
         calls.failWith(call, PLAYER_ERROR_NOT_SUPPORTED_FILE);
         EXPECT_FALSE(_player.start()) << call;
-        EXPECT_EQ(MwPlayer::PLAY_STATE_NONE, _model.getPlayerState());
+        EXPECT_EQ(PLAY_STATE_NONE, _model.getPlayerState());
         const bool begun = std::string(call) == "player_start" || std::string(call) == "player_get_duration";
         EXPECT_EQ(begun, calls.has("player_destroy")) << call;
     }
@@ -210,7 +210,7 @@ TEST_F(MwPlayerTest, FollowsThePositionWhilePlaying)
     fakes::player.position = 700;
     EXPECT_TRUE(support::runUntil([&] { return _model.getCurrentPlayPosition() == 700; }));
     ASSERT_TRUE(_player.pause());
-    EXPECT_EQ(MwPlayer::PLAY_STATE_PAUSED, _model.getPlayerState());
+    EXPECT_EQ(PLAY_STATE_PAUSED, _model.getPlayerState());
     calls.clear();
     support::runFor(0.06);
     EXPECT_FALSE(calls.has("player_get_play_position"));
@@ -243,9 +243,9 @@ TEST_F(MwPlayerTest, LongRecordingsArePolledLessOften)
 TEST_F(MwPlayerTest, EndInterruptionAndErrorReachTheListeners)
 {
     std::string heard;
-    _player.getCompletedSignal().addListener([&] { heard += "c" + std::to_string(_model.getPlayerState()); });
+    _player.getCompletedSignal().addListener([&] { heard += "c" + std::to_string(mwNumber(_model.getPlayerState())); });
     _player.getInterruptedSignal().addListener([&](player_interrupted_code_e code) {
-        heard += "i" + std::to_string(code) + std::to_string(_model.getPlayerState());
+        heard += "i" + std::to_string(code) + std::to_string(mwNumber(_model.getPlayerState()));
     });
     _player.getErrorSignal().addListener([&](MwPlayer::PlayerErrorType type) { heard += "e" + std::to_string(type); });
     ASSERT_TRUE(_player.start());

@@ -55,7 +55,7 @@ protected:
         support::runUntil([&] { return result.has_value(); });
         return result;
     }
-    int state() const { return _model.getRecorderState(); }
+    MwRecorderState state() const { return _model.getRecorderState(); }
     static void key(media_key_e which, media_key_event_e status = MEDIA_KEY_STATUS_RELEASED)
     {
         fakes::desktop.mediaKey(which, status, fakes::desktop.mediaKeyData);
@@ -76,7 +76,7 @@ TEST_F(MwAppControllerTest, RecordsPausesResumesAndSaves)
     int updates = 0;
     _controller.getRecorderUpdatedSignal().addListener([&] { ++updates; });
     startRecording();
-    EXPECT_EQ(MwRecorder::REC_STATE_RECORDING, state());
+    EXPECT_EQ(REC_STATE_RECORDING, state());
     EXPECT_TRUE(calls.has("usage app_id=com.tovanic.mewlo-lite feature=RECO extra=Normal Mode value=-"));
     EXPECT_TRUE(calls.has("device_power_request_lock 0"));
     EXPECT_TRUE(calls.has("media_key_reserve"));
@@ -88,7 +88,7 @@ TEST_F(MwAppControllerTest, RecordsPausesResumesAndSaves)
     ASSERT_TRUE(_model.addBookMark(second));
     const std::string name = _model.getCurrentRecordingFileName();
     EXPECT_TRUE(dispatch(MwAppController::STOP_RECORDING));
-    EXPECT_EQ(MwRecorder::REC_STATE_READY, state());
+    EXPECT_EQ(REC_STATE_READY, state());
     EXPECT_EQ(4, updates) << "start, pause, resume, stop; the refused pause changes nothing";
     EXPECT_EQ("sound", support::readFile(support::recordingPath(name + ".m4a")));
     EXPECT_EQ(support::recordingPath(name + ".m4a"), _controller.getLastSavedPath());
@@ -126,7 +126,7 @@ TEST_F(MwAppControllerTest, ARefusedStartLeavesNothingBehind)
         calls.failWith(c.call, c.code);
         EXPECT_FALSE(dispatch(MwAppController::START_RECORDING)) << c.call;
         EXPECT_EQ(mwTranslate(c.message), fakes::desktop.lastMessage);
-        EXPECT_EQ(MwRecorder::REC_STATE_READY, state());
+        EXPECT_EQ(REC_STATE_READY, state());
         EXPECT_FALSE(calls.has("device_power_request_lock") || calls.has("media_key_reserve") || calls.has("usage"));
         calls.clear();
         EXPECT_TRUE(dispatch(MwAppController::START_RECORDING)) << "works again after " << c.call;
@@ -208,7 +208,7 @@ TEST_F(MwAppControllerTest, LimitsStopAndOpenTheRecordingsOnlyInTheForeground)
     startRecording();
     fakes::recorder.limitReached(RECORDER_RECORDING_LIMIT_SIZE, fakes::recorder.userData);
     EXPECT_TRUE(support::runUntil([&] { return _opened == 1; }));
-    EXPECT_EQ(MwRecorder::REC_STATE_READY, state());
+    EXPECT_EQ(REC_STATE_READY, state());
     startRecording();
     _model.setAppState(MwModel::APP_STATE_PAUSED);
     const std::string name = _model.getCurrentRecordingFileName();
@@ -225,7 +225,7 @@ TEST_F(MwAppControllerTest, AFailedCommitOrMoveLosesNothing)
     startRecording();
     calls.failWith("recorder_commit", -1);
     EXPECT_FALSE(dispatch(MwAppController::STOP_RECORDING));
-    EXPECT_EQ(MwRecorder::REC_STATE_READY, state());
+    EXPECT_EQ(REC_STATE_READY, state());
     EXPECT_TRUE(std::filesystem::exists(fakes::recorder.fileName));
     EXPECT_FALSE(calls.has("recorder_release_temporary")) << "the claim keeps the file safe";
     calls.clear();
@@ -285,7 +285,7 @@ TEST_F(MwAppControllerTest, WorkerExecutesInOrderAndDropsRepeatsOfTheWaitingHead
         std::thread opener([&] { go.set_value(); });
         const auto lockedUntilDone = _controller.dispatchCommandAsync(MwAppController::PAUSE_RECORDING, note, second);
         EXPECT_TRUE(lockedUntilDone);
-        EXPECT_EQ(MwRecorder::REC_STATE_RECORDING, state() == MwRecorder::REC_STATE_PAUSED ? 2 : state())
+        EXPECT_EQ(REC_STATE_RECORDING, state() == REC_STATE_PAUSED ? REC_STATE_RECORDING : state())
             << "the sender waited for the running command";
         opener.join();
     });
@@ -319,7 +319,7 @@ TEST_F(MwAppControllerTest, EndingExecutesWhatIsQueuedAndSavesTheRecording)
     calls.clear();
     lifeCycle(MwSignalMgr::TERMINATE);
     EXPECT_TRUE(calls.has("recorder_commit"));
-    EXPECT_EQ(MwRecorder::REC_STATE_NONE, state());
+    EXPECT_EQ(REC_STATE_NONE, state());
     EXPECT_TRUE(std::filesystem::exists(_controller.getLastSavedPath()));
     EXPECT_TRUE(calls.has("bt_deinitialize"));
 }
@@ -401,12 +401,13 @@ TEST_F(MwAppControllerTest, ASavedRecordingIsTheAnswerWhateverEndsTheRequest)
 
 TEST_F(MwAppControllerTest, MediaKeysDriveTheRecording)
 {
-    constexpr int RUNS = MwRecorder::REC_STATE_RECORDING, RESTS = MwRecorder::REC_STATE_PAUSED;
+    constexpr auto RUNS = REC_STATE_RECORDING;
+    constexpr auto RESTS = REC_STATE_PAUSED;
     startRecording(5000);
     struct {
         media_key_e key;
-        int afterRunning;
-        int afterResting;
+        MwRecorderState afterRunning;
+        MwRecorderState afterResting;
     } const cases[] = {{MEDIA_KEY_PLAY, RUNS, RUNS}, {MEDIA_KEY_PAUSE, RESTS, RESTS},
         {MEDIA_KEY_PLAYPAUSE, RESTS, RUNS}, {MEDIA_KEY_MEDIA, RESTS, RUNS}, {MEDIA_KEY_RECORD, RUNS, RUNS},
         {MEDIA_KEY_NEXT, RUNS, RESTS}, {MEDIA_KEY_FASTFORWARD, RUNS, RESTS}};
@@ -417,11 +418,11 @@ TEST_F(MwAppControllerTest, MediaKeysDriveTheRecording)
             key(c.key, MEDIA_KEY_STATUS_PRESSED);
             EXPECT_EQ(before, state());
             key(c.key);
-            EXPECT_EQ(after, state()) << c.key << " while " << before;
+            EXPECT_EQ(after, state()) << c.key << " while " << mwNumber(before);
         }
     EXPECT_EQ(5000, fakes::desktop.remote.position(fakes::desktop.remoteData));
     key(MEDIA_KEY_STOP);
-    EXPECT_TRUE(support::runUntil([&] { return state() == MwRecorder::REC_STATE_READY; }));
+    EXPECT_TRUE(support::runUntil([&] { return state() == REC_STATE_READY; }));
     EXPECT_TRUE(std::filesystem::exists(_controller.getLastSavedPath()));
     EXPECT_FALSE(calls.has("player_"));
 }
@@ -437,7 +438,7 @@ protected:
         _model.setCurrentPlayPath(support::recordingPath("one.m4a"));
     }
     bool play() { return dispatch(MwAppController::START_PLAYING); }
-    int playing() const { return _model.getPlayerState(); }
+    MwPlayerState playing() const { return _model.getPlayerState(); }
     static void interrupt(player_interrupted_code_e code, player_state_e state)
     {
         fakes::player.state = state;
@@ -466,7 +467,7 @@ TEST_F(MwPlaybackTest, SeeksRefusePauseAndStepsFollowTheList)
     ASSERT_TRUE(play());
     EXPECT_TRUE(dispatch(MwAppController::SET_PLAYER_POSITION));
     EXPECT_FALSE(dispatch(MwAppController::PAUSE_PLAYING));
-    EXPECT_EQ(MwPlayer::PLAY_STATE_PLAYING, playing());
+    EXPECT_EQ(PLAY_STATE_PLAYING, playing());
     fakes::player.seekCompleted(fakes::player.userData);
     _model.setCurrentPlayPosition(3001);
     EXPECT_TRUE(dispatch(MwAppController::PLAY_PREVIOUS));
@@ -483,7 +484,7 @@ TEST_F(MwPlaybackTest, SeeksRefusePauseAndStepsFollowTheList)
     _model.setCurrentPlayPath("/gone.m4a");
     _model.setCurrentPlayPosition(0);
     EXPECT_TRUE(dispatch(MwAppController::PLAY_NEXT));
-    EXPECT_EQ(MwPlayer::PLAY_STATE_NONE, playing());
+    EXPECT_EQ(PLAY_STATE_NONE, playing());
     EXPECT_FALSE(dispatch(MwAppController::PLAY_PREVIOUS));
     EXPECT_TRUE(fakes::log.has("getPreviousPlayPath failed!!!"));
 }
@@ -515,10 +516,10 @@ TEST_F(MwPlaybackTest, ResumesAfterACallButNotAfterAnUnpluggedHeadset)
              {PLAYER_INTERRUPTED_BY_EARJACK_UNPLUG, false}, {PLAYER_INTERRUPTED_BY_MEDIA, false}}) {
         ASSERT_TRUE(play());
         interrupt(code, PLAYER_STATE_PAUSED);
-        EXPECT_EQ(MwPlayer::PLAY_STATE_PAUSED, playing());
+        EXPECT_EQ(PLAY_STATE_PAUSED, playing());
         calls.clear();
         interrupt(PLAYER_INTERRUPTED_COMPLETED, PLAYER_STATE_PAUSED);
-        EXPECT_EQ(resumes ? MwPlayer::PLAY_STATE_PLAYING : MwPlayer::PLAY_STATE_PAUSED, playing()) << code;
+        EXPECT_EQ(resumes ? PLAY_STATE_PLAYING : PLAY_STATE_PAUSED, playing()) << code;
         EXPECT_EQ(resumes, !calls.has("device_power_release_lock")) << "locked while it plays";
         dispatch(MwAppController::STOP_PLAYING);
         EXPECT_TRUE(support::runUntil([] { return calls.has("bt_avrcp_target_notify_player_state 0"); }));
@@ -529,7 +530,7 @@ TEST_F(MwPlaybackTest, ResumesAfterACallButNotAfterAnUnpluggedHeadset)
     ASSERT_TRUE(dispatch(MwAppController::STOP_PLAYING) && play());
     interrupt(PLAYER_INTERRUPTED_BY_EARJACK_UNPLUG, PLAYER_STATE_PAUSED);
     interrupt(PLAYER_INTERRUPTED_COMPLETED, PLAYER_STATE_PAUSED);
-    EXPECT_EQ(MwPlayer::PLAY_STATE_PAUSED, playing());
+    EXPECT_EQ(PLAY_STATE_PAUSED, playing());
 }
 
 TEST_F(MwPlaybackTest, HeldKeysSeekInGrowingStepsAndShortOnesStep)

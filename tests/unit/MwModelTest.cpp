@@ -256,13 +256,13 @@ TEST_F(MwModelTest, StorageFollowsTheCardAndTheChoice)
 TEST_F(MwModelTest, PublishesItsStateUnlessItServesARequest)
 {
     int published = -1;
-    _model.setRecorderState(2);
+    _model.setRecorderState(REC_STATE_RECORDING);
     ASSERT_EQ(0, preference_get_int("MainRecordingState", &published));
     EXPECT_EQ(2, published);
     EXPECT_TRUE(MwModel::isMainInstanceRecording());
     const pid_t another = ::fork();
     if (another == 0) {
-        MwModel().setRecorderState(2);
+        MwModel().setRecorderState(REC_STATE_RECORDING);
         ::_exit(MwModel::isMainInstanceRecording() ? 0 : 1);
     }
     int status = 1;
@@ -271,21 +271,21 @@ TEST_F(MwModelTest, PublishesItsStateUnlessItServesARequest)
     EXPECT_FALSE(MwModel::isMainInstanceRecording()) << "its owner is gone";
     preference_set_int("MainRecordingProcess", ::getpid()); // the number again, for another process
     EXPECT_FALSE(MwModel::isMainInstanceRecording());
-    _model.setRecorderState(1);
+    _model.setRecorderState(REC_STATE_READY);
     EXPECT_FALSE(MwModel::isMainInstanceRecording());
-    _model.setRecorderState(2);
+    _model.setRecorderState(REC_STATE_RECORDING);
     _model.setRequestMode(true);
-    _model.setRecorderState(3);
+    _model.setRecorderState(REC_STATE_PAUSED);
     preference_get_int("MainRecordingState", &published);
     EXPECT_EQ(2, published);
-    EXPECT_EQ(3, _model.getRecorderState());
+    EXPECT_EQ(REC_STATE_PAUSED, _model.getRecorderState());
 
     vconf_set_int(VCONFKEY_MEWLO_RECORDER_STATE, 2); // of another instance
     MwModel guest;
     guest.setRequestMode(true);
     for (const auto& [state, shown] :
         std::vector<std::pair<int, int>>{{1, 2}, {0, 2}, {2, 2}, {3, 3}, {1, 1}, {0, 1}}) {
-        guest.setRecorderState(state);
+        guest.setRecorderState(static_cast<MwRecorderState>(state));
         vconf_get_int(VCONFKEY_MEWLO_RECORDER_STATE, &published);
         EXPECT_EQ(shown, published) << state;
     }

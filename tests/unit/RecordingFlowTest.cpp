@@ -68,7 +68,7 @@ protected:
     bool isReadySoon()
     {
         return support::runUntil(
-            [&] { return _model.getRecorderState() == MwRecorder::REC_STATE_READY && calls.has("recorder_destroy"); });
+            [&] { return _model.getRecorderState() == REC_STATE_READY && calls.has("recorder_destroy"); });
     }
     static void execute(const char* statement)
     {
@@ -279,7 +279,7 @@ TEST_F(RecordingFlowTest, ARefusedResumeSaysWhy)
         calls.failWith("recorder_start", code);
         EXPECT_FALSE(dispatch(MwAppController::RESUME_RECORDING));
         EXPECT_EQ(mwTranslate(message), fakes::desktop.lastMessage);
-        EXPECT_EQ(MwRecorder::REC_STATE_PAUSED, _model.getRecorderState());
+        EXPECT_EQ(REC_STATE_PAUSED, _model.getRecorderState());
     }
 }
 

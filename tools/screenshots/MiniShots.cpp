@@ -5,8 +5,6 @@
 
 #include "MwLockscreenMiniController.h"
 #include "MwNotiMiniController.h"
-#include "MwPlayer.h"
-#include "MwRecorder.h"
 #include "Picture.h"
 #include "ScreenWindow.h"
 #include "fakes/Fakes.h"
@@ -28,8 +26,8 @@ namespace {
 
     struct Shot {
         const char* name;
-        int recorder;
-        int player;
+        MwRecorderState recorder;
+        MwPlayerState player;
         unsigned int seconds;
         bool rejects;
         const char* playing;
@@ -37,18 +35,18 @@ namespace {
         bool isMirrored = false;
     };
 
-    constexpr int READY = MwRecorder::REC_STATE_READY;
-    constexpr int SILENT = MwPlayer::PLAY_STATE_NONE;
+    constexpr auto READY = REC_STATE_READY;
+    constexpr auto SILENT = PLAY_STATE_NONE;
     constexpr Shot SHOTS[] = {
-        {"recording", MwRecorder::REC_STATE_RECORDING, SILENT, 83, false, "", "en_US"},
-        {"recording-hours", MwRecorder::REC_STATE_RECORDING, SILENT, 36061, true, "", "de_DE"},
-        {"recording-paused", MwRecorder::REC_STATE_PAUSED, SILENT, 754, false, "", "en_US"},
-        {"playing", READY, MwPlayer::PLAY_STATE_PLAYING, 0, false, "Voice 001.m4a", "en_US"},
-        {"playing-long", READY, MwPlayer::PLAY_STATE_PLAYING, 0, false,
+        {"recording", REC_STATE_RECORDING, SILENT, 83, false, "", "en_US"},
+        {"recording-hours", REC_STATE_RECORDING, SILENT, 36061, true, "", "de_DE"},
+        {"recording-paused", REC_STATE_PAUSED, SILENT, 754, false, "", "en_US"},
+        {"playing", READY, PLAY_STATE_PLAYING, 0, false, "Voice 001.m4a", "en_US"},
+        {"playing-long", READY, PLAY_STATE_PLAYING, 0, false,
             "A very long conversation about everything and nothing in the old harbour.m4a", "en_US"},
-        {"play-paused", READY, MwPlayer::PLAY_STATE_PAUSED, 0, false, "Voice 001.m4a", "en_US"},
-        {"recording-mirrored", MwRecorder::REC_STATE_RECORDING, SILENT, 83, false, "", "en_US", true},
-        {"playing-mirrored", READY, MwPlayer::PLAY_STATE_PLAYING, 0, false, "Voice 001.m4a", "en_US", true},
+        {"play-paused", READY, PLAY_STATE_PAUSED, 0, false, "Voice 001.m4a", "en_US"},
+        {"recording-mirrored", REC_STATE_RECORDING, SILENT, 83, false, "", "en_US", true},
+        {"playing-mirrored", READY, PLAY_STATE_PLAYING, 0, false, "Voice 001.m4a", "en_US", true},
     };
 
     template <typename Surface>

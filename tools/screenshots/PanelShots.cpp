@@ -44,7 +44,7 @@ namespace {
     {
         const std::string path = screen.addRecording("Voice 001.m4a", duration, content);
         addBookmarks(path, 3, duration / 1000);
-        screen.load("Voice 001.m4a", MwPlayer::PLAY_STATE_PAUSED, static_cast<unsigned int>(duration) / 3);
+        screen.load("Voice 001.m4a", PLAY_STATE_PAUSED, static_cast<unsigned int>(duration) / 3);
         screen.dockTrim();
         support::runUntil([&] { return screen.trimPanel->getWaveform()->isComplete(); }, 5);
         support::runFor(0.4);
@@ -93,7 +93,7 @@ namespace {
         if (count > 2)
             media_bookmark_insert_to_db(
                 id.c_str(), 200, "What the harbour master said about the storm & the two lost boats");
-        screen.load("Voice 001.m4a", MwPlayer::PLAY_STATE_PAUSED, 83000);
+        screen.load("Voice 001.m4a", PLAY_STATE_PAUSED, 83000);
         screen.push(new MwBookmarksContentViewController(&screen.model, screen.controller(), id));
     }
 
@@ -111,7 +111,7 @@ namespace {
     {
         const std::string name = "A very long conversation about everything and nothing in the old harbour.m4a";
         screen.addRecording(name, 3 * MINUTE + 7000, std::string(3 << 20, 'x'));
-        screen.load(name, MwPlayer::PLAY_STATE_PAUSED);
+        screen.load(name, PLAY_STATE_PAUSED);
         screen.push(new MwDetailsContentViewController(
             &screen.model, screen.controller(), screen.model.getRecordedFileList().front()));
     }
@@ -119,11 +119,11 @@ namespace {
     const std::vector<Shot>& shots()
     {
         static const std::vector<Shot> all = {
-            {"panel-playing", [](auto& s) { panel(s, 4 * MINUTE, 1, MwPlayer::PLAY_STATE_PLAYING, 0.4); }},
-            {"panel-paused", [](auto& s) { panel(s, 4 * MINUTE, 0, MwPlayer::PLAY_STATE_PAUSED, 0.0); }},
-            {"panel-full", [](auto& s) { panel(s, 10 * MINUTE, 50, MwPlayer::PLAY_STATE_PAUSED, 1.0); }},
-            {"panel-hours", [](auto& s) { panel(s, 61 * MINUTE, 5, MwPlayer::PLAY_STATE_PLAYING, 0.2); }},
-            {"panel-short", [](auto& s) { panel(s, 1000, 0, MwPlayer::PLAY_STATE_NONE, 0.0); }},
+            {"panel-playing", [](auto& s) { panel(s, 4 * MINUTE, 1, PLAY_STATE_PLAYING, 0.4); }},
+            {"panel-paused", [](auto& s) { panel(s, 4 * MINUTE, 0, PLAY_STATE_PAUSED, 0.0); }},
+            {"panel-full", [](auto& s) { panel(s, 10 * MINUTE, 50, PLAY_STATE_PAUSED, 1.0); }},
+            {"panel-hours", [](auto& s) { panel(s, 61 * MINUTE, 5, PLAY_STATE_PLAYING, 0.2); }},
+            {"panel-short", [](auto& s) { panel(s, 1000, 0, PLAY_STATE_NONE, 0.0); }},
             {"trim", [](auto& s) { trim(s, 10000, PanelScreen::sound()); }},
             {"trim-range", [](auto& s) { trimRange(s, 10000); }},
             {"trim-hours", [](auto& s) { trimRange(s, 100 * MINUTE); }},

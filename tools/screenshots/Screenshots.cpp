@@ -32,7 +32,7 @@ struct Shot {
 
 void record(ui::RecorderScreen& screen, unsigned int seconds)
 {
-    screen.enter(MwRecorder::REC_STATE_RECORDING);
+    screen.enter(REC_STATE_RECORDING);
     screen.model.setElapsedTime(seconds * 1000ULL);
     screen.model.setLevel(-12.0);
 }
@@ -44,7 +44,7 @@ const std::vector<Shot>& shots()
         {"ready-named",
             [](auto& screen) {
                 screen.model.setRenameString("A conversation about everything and nothing in the old harbour");
-                screen.enter(MwRecorder::REC_STATE_READY);
+                screen.enter(REC_STATE_READY);
             }},
         {"recording",
             [](auto& screen) {
@@ -55,7 +55,7 @@ const std::vector<Shot>& shots()
         {"paused",
             [](auto& screen) {
                 record(screen, 83);
-                screen.enter(MwRecorder::REC_STATE_PAUSED);
+                screen.enter(REC_STATE_PAUSED);
             }},
         {"bookmark",
             [](auto& screen) {

@@ -12,7 +12,6 @@
 
 #include "MwLog.h"
 #include "MwModel.h"
-#include "MwRecorder.h"
 #include "MwResourceMgr.h"
 
 struct MwRecorderContentViewController::ButtonLook {
@@ -212,7 +211,7 @@ void MwRecorderContentViewController::_stopButtonKeyCb(void* data, Evas*, Evas_O
 {
     auto* self = static_cast<MwRecorderContentViewController*>(data);
     auto* event = static_cast<Evas_Event_Key_Down*>(info);
-    const bool isPaused = self->getModel()->getRecorderState() == MwRecorder::REC_STATE_PAUSED;
+    const bool isPaused = self->getModel()->getRecorderState() == REC_STATE_PAUSED;
     if (std::strcmp(event->key, "space") == 0) {
         event->event_flags = EVAS_EVENT_FLAG_ON_HOLD;
         return isPaused ? self->_resumeButtonClicked() : self->_pauseButtonClicked();

@@ -9,7 +9,6 @@
 
 #include "MwLog.h"
 #include "MwModel.h"
-#include "MwRecorder.h"
 #include "MwRenamePopupController.h"
 #include "MwResourceMgr.h"
 #include "MwSystemMgr.h"
@@ -123,15 +122,14 @@ void MwRecorderContentViewController::onTop()
     if (!_isComplete())
         return;
     _updateContentView();
-    if (getModel()->getRecorderState() == MwRecorder::REC_STATE_RECORDING
-        && MwSystemMgr::getInstance()->isEarjackInserted())
+    if (getModel()->getRecorderState() == REC_STATE_RECORDING && MwSystemMgr::getInstance()->isEarjackInserted())
         mwPost("IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
 }
 
 bool MwRecorderContentViewController::_isRecordingOrPaused() const
 {
-    const int state = getModel()->getRecorderState();
-    return state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED;
+    const auto state = getModel()->getRecorderState();
+    return state == REC_STATE_RECORDING || state == REC_STATE_PAUSED;
 }
 
 void MwRecorderContentViewController::_openRecordings() { getAppController()->openRecordings(); }
@@ -228,7 +226,6 @@ void MwRecorderContentViewController::_earjackInserted()
 {
     if (!isTop() || getModel()->getAppState() != MwModel::APP_STATE_RESUMED)
         return;
-    mwPost(getModel()->getRecorderState() == MwRecorder::REC_STATE_NONE
-            ? "IDS_MW_TPOP_EXTERNAL_MICROPHONE_WILL_BE_USED_TO_RECORD"
-            : "IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
+    mwPost(getModel()->getRecorderState() == REC_STATE_NONE ? "IDS_MW_TPOP_EXTERNAL_MICROPHONE_WILL_BE_USED_TO_RECORD"
+                                                            : "IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
 }

@@ -8,7 +8,6 @@
 #include "MwLog.h"
 #include "MwLoggingMgr.h"
 #include "MwModel.h"
-#include "MwRecorder.h"
 #include "MwRecordingTime.h"
 #include "MwRenamePopupController.h"
 #include "MwSystemMgr.h"
@@ -42,9 +41,9 @@ void MwRecorderContentViewController::_recordButtonClicked()
 {
     if (!_isComplete())
         return;
-    const int state = getModel()->getRecorderState();
-    if (state != MwRecorder::REC_STATE_READY) {
-        MW_LOGW("current recorder state is [%d]!! can't start recording", state);
+    const auto state = getModel()->getRecorderState();
+    if (state != REC_STATE_READY) {
+        MW_LOGW("current recorder state is [%d]!! can't start recording", mwNumber(state));
         return;
     }
     if (MwSystemMgr::getInstance()->isCallConnected()) {
@@ -87,7 +86,7 @@ void MwRecorderContentViewController::_stopButtonClicked()
     if (!_isComplete())
         return;
     if (!_isRecordingOrPaused()) {
-        MW_LOGW("current recorder state is [%d]!! can't stop recording", getModel()->getRecorderState());
+        MW_LOGW("current recorder state is [%d]!! can't stop recording", mwNumber(getModel()->getRecorderState()));
         return;
     }
     if (_isStopping)
@@ -177,7 +176,7 @@ void MwRecorderContentViewController::_bookmarkButtonClicked()
     if (!_isComplete() || _isStopping)
         return;
     if (!_isRecordingOrPaused()) {
-        MW_LOGE("Invalid recorder state [%d]", getModel()->getRecorderState());
+        MW_LOGE("Invalid recorder state [%d]", mwNumber(getModel()->getRecorderState()));
         return;
     }
     if (!_addBookMarkEnabled) {

@@ -14,7 +14,6 @@
 #include "MwLog.h"
 #include "MwMemoryFullPopup.h"
 #include "MwModel.h"
-#include "MwRecorder.h"
 #include "MwRenamePopupController.h"
 #include "MwSaveToPopup.h"
 #include "MwText.h"

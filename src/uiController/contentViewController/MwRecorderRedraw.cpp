@@ -13,7 +13,6 @@
 #include "MwLog.h"
 #include "MwLoggingMgr.h"
 #include "MwModel.h"
-#include "MwRecorder.h"
 #include "MwRecordingTime.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
@@ -37,17 +36,17 @@ void MwRecorderContentViewController::_updateContentView()
     if (!_isComplete())
         return;
     _destroyAllButtons();
-    const int state = getModel()->getRecorderState();
-    MW_LOGW("recorder state: [%d]", state);
+    const auto state = getModel()->getRecorderState();
+    MW_LOGW("recorder state: [%d]", mwNumber(state));
     elm_layout_signal_emit(
         getEvasObject(), getModel()->isRequestMode() ? "enter_request_mode" : "leave_request_mode", "");
     switch (state) {
-    case MwRecorder::REC_STATE_NONE:
-    case MwRecorder::REC_STATE_READY:
+    case REC_STATE_NONE:
+    case REC_STATE_READY:
         return _updateReady();
-    case MwRecorder::REC_STATE_RECORDING:
+    case REC_STATE_RECORDING:
         return _updateRecording();
-    case MwRecorder::REC_STATE_PAUSED:
+    case REC_STATE_PAUSED:
         return _updatePaused();
     }
     MW_LOGE("Invalid recorder state!");
@@ -136,9 +135,9 @@ void MwRecorderContentViewController::_createRecordingStatusUpdateTimer()
     }
     MW_LOGW("Create recording status update timer!");
     _statusUpdateTimer = WTimer::addTimer(STATUS_UPDATE_INTERVAL, [this](void*) {
-        const int state = getModel()->getRecorderState();
-        if (state != MwRecorder::REC_STATE_RECORDING) {
-            MW_LOGE("Invalid recorder state! [%d]", state);
+        const auto state = getModel()->getRecorderState();
+        if (state != REC_STATE_RECORDING) {
+            MW_LOGE("Invalid recorder state! [%d]", mwNumber(state));
             return false;
         }
         _updateRecordingTime();

@@ -14,7 +14,6 @@
 #include "MwListDates.h"
 #include "MwLog.h"
 #include "MwPlayViewController.h"
-#include "MwPlayer.h"
 #include "MwRecordingsModes.h"
 #include "MwRecordingsRows.h"
 #include "MwRenamePopupController.h"
@@ -157,8 +156,8 @@ void MwRecordingsContentViewController::onTop()
 
 bool MwRecordingsContentViewController::_isPlayingOrPaused() const
 {
-    const int state = getModel()->getPlayerState();
-    return state == MwPlayer::PLAY_STATE_PLAYING || state == MwPlayer::PLAY_STATE_PAUSED;
+    const auto state = getModel()->getPlayerState();
+    return state == PLAY_STATE_PLAYING || state == PLAY_STATE_PAUSED;
 }
 
 void MwRecordingsContentViewController::_stopPlaying()

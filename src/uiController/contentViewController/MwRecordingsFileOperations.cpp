@@ -13,7 +13,6 @@
 #include "MwFileOperationPopup.h"
 #include "MwFileOperator.h"
 #include "MwLog.h"
-#include "MwPlayer.h"
 #include "MwStorageRoots.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
@@ -176,7 +175,7 @@ void MwRecordingsContentViewController::_deletePlayingFile()
     getModel()->removeRecordedFiles({path});
     getModel()->setCurrentPlayPath("");
     _catalogueShrank();
-    if (getModel()->getPlayerState() == 0)
+    if (getModel()->getPlayerState() == PLAY_STATE_NONE)
         _update();
     else if (!getAppController()->dispatchCommand(MwAppController::STOP_PLAYING))
         MW_LOGE("play stop failed!");

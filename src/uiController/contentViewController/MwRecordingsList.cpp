@@ -94,7 +94,7 @@ void MwRecordingsContentViewController::_update()
 {
     if (!_isComplete())
         return;
-    MW_LOGW("viewType : [%d], playerState : [%d]", _viewType, getModel()->getPlayerState());
+    MW_LOGW("viewType : [%d], playerState : [%d]", _viewType, mwNumber(getModel()->getPlayerState()));
     const bool playsHere = mwRecordingsMode(_viewType).plays;
     if (std::exchange(_reloadNeeded, false))
         _loadContents();

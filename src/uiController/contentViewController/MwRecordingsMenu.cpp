@@ -253,7 +253,8 @@ void MwRecordingsContentViewController::_clickBackKey()
     const bool rests = _viewType == NORMAL || _viewType == PICK;
     if (rests && getModel()->getCurrentPlayPath().empty())
         return popOut();
-    if (getModel()->getPlayerState() != 0 && !getAppController()->dispatchCommand(MwAppController::STOP_PLAYING)) {
+    if (getModel()->getPlayerState() != PLAY_STATE_NONE
+        && !getAppController()->dispatchCommand(MwAppController::STOP_PLAYING)) {
         MW_LOGE("play stop failed!");
         return;
     }

@@ -13,7 +13,6 @@
 
 #include "MwLog.h"
 #include "MwNaviButtons.h"
-#include "MwPlayer.h"
 #include "MwRecordingsModes.h"
 #include "MwRecordingsRows.h"
 #include "MwText.h"
@@ -204,10 +203,10 @@ void MwRecordingsContentViewController::_toggleCurrent()
 {
     MwAppController::Command command = MwAppController::START_PLAYING;
     const char* failure = "play start failed!";
-    if (getModel()->getPlayerState() == MwPlayer::PLAY_STATE_PLAYING) {
+    if (getModel()->getPlayerState() == PLAY_STATE_PLAYING) {
         command = MwAppController::PAUSE_PLAYING;
         failure = "play pause failed!";
-    } else if (getModel()->getPlayerState() == MwPlayer::PLAY_STATE_PAUSED) {
+    } else if (getModel()->getPlayerState() == PLAY_STATE_PAUSED) {
         command = MwAppController::RESUME_PLAYING;
         failure = "play resume failed!";
     }

@@ -6,8 +6,6 @@
 
 #include "MwLog.h"
 #include "MwModel.h"
-#include "MwPlayer.h"
-#include "MwRecorder.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
 
@@ -100,15 +98,15 @@ void MwLockscreenMiniController::update()
     _destroyPauseBlinkTimer();
     _isTimeShown = true;
     _surface.signal("show_rec_time_animated");
-    const int playerState = getModel()->getPlayerState();
-    MW_LOGI("player state: [%d]", playerState);
-    if (playerState == MwPlayer::PLAY_STATE_PLAYING || playerState == MwPlayer::PLAY_STATE_PAUSED) {
-        _showPlaying(playerState == MwPlayer::PLAY_STATE_PAUSED);
+    const auto playerState = getModel()->getPlayerState();
+    MW_LOGI("player state: [%d]", mwNumber(playerState));
+    if (playerState == PLAY_STATE_PLAYING || playerState == PLAY_STATE_PAUSED) {
+        _showPlaying(playerState == PLAY_STATE_PAUSED);
     } else {
         MW_LOGI("No playing!");
-        MW_LOGI("recorder state: [%d]", getModel()->getRecorderState());
+        MW_LOGI("recorder state: [%d]", mwNumber(getModel()->getRecorderState()));
         if (isRecording())
-            _showRecording(getModel()->getRecorderState() == MwRecorder::REC_STATE_PAUSED);
+            _showRecording(getModel()->getRecorderState() == REC_STATE_PAUSED);
         else
             MW_LOGI("no recordering or playing state!");
     }
@@ -147,7 +145,7 @@ void MwLockscreenMiniController::_showRecording(bool paused)
 
 void MwLockscreenMiniController::_setInfoText(const std::string& text)
 {
-    const bool plays = getModel()->getPlayerState() != MwPlayer::PLAY_STATE_NONE;
+    const bool plays = getModel()->getPlayerState() != PLAY_STATE_NONE;
     _surface.setInfo(
         text, plays ? PLAYING_COLOR : RECORDING_COLOR, plays ? PLAYING_TEXT_SIZE : RECORDING_TEXT_SIZE, true);
 }
@@ -159,7 +157,7 @@ void MwLockscreenMiniController::_watchTime()
 {
     if (!_surface.isSeen() || !MwSystemMgr::getInstance()->isLCDOn())
         return;
-    if (getModel()->getRecorderState() == MwRecorder::REC_STATE_RECORDING)
+    if (getModel()->getRecorderState() == REC_STATE_RECORDING)
         _createUpdateTimeTimer();
     else
         _createPauseBlinkTimer();

@@ -6,7 +6,6 @@
 #include "MwHandle.h"
 #include "MwLog.h"
 #include "MwModel.h"
-#include "MwRecorder.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
 
@@ -27,13 +26,13 @@ MwMiniController::MwMiniController(
 
 bool MwMiniController::isRecording() const
 {
-    const int state = _model->getRecorderState();
-    return state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED;
+    const auto state = _model->getRecorderState();
+    return state == REC_STATE_RECORDING || state == REC_STATE_PAUSED;
 }
 
 std::string MwMiniController::getRecordingText() const
 {
-    if (_model->getRecorderState() == MwRecorder::REC_STATE_PAUSED)
+    if (_model->getRecorderState() == REC_STATE_PAUSED)
         return mwTranslate("IDS_MW_BODY_PAUSED_M_NOUN");
     return mwTranslate(MwSystemMgr::getInstance()->getRejectCall() ? "IDS_MW_SBODY_REJECTING_CALLS_ABB"
                                                                    : "IDS_MW_HEADER_RECORDING_M_VOICE");

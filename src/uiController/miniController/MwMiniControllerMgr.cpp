@@ -17,8 +17,6 @@
 #include "MwModel.h"
 #include "MwNotiMiniController.h"
 #include "MwNotificationMiniController.h"
-#include "MwPlayer.h"
-#include "MwRecorder.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
 
@@ -29,8 +27,8 @@ constexpr const char* FOCUS_EVENTS[] = {"focused", "unfocused"};
 
 bool isRecording(const MwModel& model)
 {
-    const int state = model.getRecorderState();
-    return state == MwRecorder::REC_STATE_RECORDING || state == MwRecorder::REC_STATE_PAUSED;
+    const auto state = model.getRecorderState();
+    return state == REC_STATE_RECORDING || state == REC_STATE_PAUSED;
 }
 
 // On the desktop's panel; the user may prefer the notification where there can be one.
@@ -115,7 +113,7 @@ void MwMiniControllerMgr::_createNotiMiniController()
 void MwMiniControllerMgr::_choosePanelSurface()
 {
     const bool records = isRecording(*_model);
-    const bool plays = _model->getPlayerState() == MwPlayer::PLAY_STATE_PLAYING;
+    const bool plays = _model->getPlayerState() == PLAY_STATE_PLAYING;
     if (canBeWindow()) {
         _destroyMiniController(NOTIFICATION);
         if (records || plays)
@@ -222,15 +220,15 @@ void MwMiniControllerMgr::_updateAll()
 
 void MwMiniControllerMgr::_onRecorderUpdated()
 {
-    const int state = _model->getRecorderState();
-    if (state == MwRecorder::REC_STATE_READY) {
+    const auto state = _model->getRecorderState();
+    if (state == REC_STATE_READY) {
         MW_LOGI("destroy mini controller");
         _destoryAllMiniController();
         return;
     }
     MW_LOGI("update mini controller");
     _choosePanelSurface();
-    if (MwSystemMgr::getInstance()->isLockscreenOn() && state == MwRecorder::REC_STATE_RECORDING)
+    if (MwSystemMgr::getInstance()->isLockscreenOn() && state == REC_STATE_RECORDING)
         _createLockscreenMiniController();
     _updateAll();
 }
@@ -239,16 +237,16 @@ void MwMiniControllerMgr::_onPlayerUpdated()
 {
     MW_LOGI("BEGIN");
     switch (_model->getPlayerState()) {
-    case MwPlayer::PLAY_STATE_NONE:
+    case PLAY_STATE_NONE:
         _later(&MwMiniControllerMgr::_playbackEnded);
         break;
-    case MwPlayer::PLAY_STATE_PLAYING:
+    case PLAY_STATE_PLAYING:
         _choosePanelSurface();
         if (MwSystemMgr::getInstance()->isLockscreenOn())
             _createLockscreenMiniController();
         _updateAll();
         break;
-    case MwPlayer::PLAY_STATE_PAUSED:
+    case PLAY_STATE_PAUSED:
         if (_miniControllers.empty())
             break;
         _requestAlarmService();
@@ -263,7 +261,7 @@ void MwMiniControllerMgr::_onPlayerUpdated()
 void MwMiniControllerMgr::_playbackEnded()
 {
     // A recording may have begun meanwhile: its surfaces are not this playback's.
-    if (_model->getPlayerState() != MwPlayer::PLAY_STATE_NONE || isRecording(*_model))
+    if (_model->getPlayerState() != PLAY_STATE_NONE || isRecording(*_model))
         return;
     MW_LOGI("destroy mini controller");
     _destoryAllMiniController();
@@ -276,7 +274,7 @@ void MwMiniControllerMgr::_onSystemInfo(MwSignalMgr::SystemInfo info)
     case MwSignalMgr::LOCKSCREEN_CHANGED: {
         if (!MwSystemMgr::getInstance()->isLockscreenOn())
             return _destroyMiniController(LOCKSCREEN);
-        if (_model->getPlayerState() != MwPlayer::PLAY_STATE_PLAYING && !isRecording(*_model))
+        if (_model->getPlayerState() != PLAY_STATE_PLAYING && !isRecording(*_model))
             return;
         _createLockscreenMiniController();
         return _updateAll();
@@ -307,7 +305,7 @@ void MwMiniControllerMgr::_onLifeCycle(MwSignalMgr::LifeCycle lifeCycle)
 void MwMiniControllerMgr::_appPause()
 {
     _choosePanelSurface();
-    if (_model->getPlayerState() == MwPlayer::PLAY_STATE_PAUSED)
+    if (_model->getPlayerState() == PLAY_STATE_PAUSED)
         _requestAlarmService();
 }
 
@@ -436,7 +434,7 @@ void MwMiniControllerMgr::_requestAlarmService()
 void MwMiniControllerMgr::_alarmReply(app_control_result_e result)
 {
     MW_LOGI("BEGIN - result : [%d]", result);
-    if (_model->getPlayerState() != MwPlayer::PLAY_STATE_PAUSED) {
+    if (_model->getPlayerState() != PLAY_STATE_PAUSED) {
         MW_LOGE("player status is not paused!!!");
         return;
     }

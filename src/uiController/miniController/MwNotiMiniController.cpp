@@ -9,8 +9,6 @@
 
 #include "MwLog.h"
 #include "MwModel.h"
-#include "MwPlayer.h"
-#include "MwRecorder.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
 
@@ -158,7 +156,7 @@ void MwNotiMiniController::_closeButtonClicked()
         return ui_app_exit();
     _isClosed = true;
     evas_object_hide(_surface.getWindow());
-    if (getModel()->getPlayerState() == MwPlayer::PLAY_STATE_PLAYING)
+    if (getModel()->getPlayerState() == PLAY_STATE_PLAYING)
         pausePlay();
 }
 
@@ -185,17 +183,17 @@ void MwNotiMiniController::update()
     _destroyTimers();
     _isTimeShown = true;
     _surface.signal("show_rec_time_animated");
-    const int playerState = getModel()->getPlayerState();
-    MW_LOGI("player state: [%d]", playerState);
-    if (playerState == MwPlayer::PLAY_STATE_PLAYING || playerState == MwPlayer::PLAY_STATE_PAUSED) {
-        _showPlaying(playerState == MwPlayer::PLAY_STATE_PAUSED);
+    const auto playerState = getModel()->getPlayerState();
+    MW_LOGI("player state: [%d]", mwNumber(playerState));
+    if (playerState == PLAY_STATE_PLAYING || playerState == PLAY_STATE_PAUSED) {
+        _showPlaying(playerState == PLAY_STATE_PAUSED);
     } else {
-        const int recorderState = getModel()->getRecorderState();
+        const auto recorderState = getModel()->getRecorderState();
         MW_LOGI("No playing!");
-        MW_LOGI("recorder state: [%d]", recorderState);
-        if (recorderState == MwRecorder::REC_STATE_RECORDING)
+        MW_LOGI("recorder state: [%d]", mwNumber(recorderState));
+        if (recorderState == REC_STATE_RECORDING)
             _showRecording();
-        else if (recorderState == MwRecorder::REC_STATE_PAUSED)
+        else if (recorderState == REC_STATE_PAUSED)
             _showRecordPaused();
         else
             MW_LOGI("no recordering or playing state!");
@@ -242,7 +240,7 @@ void MwNotiMiniController::_showRecordPaused()
 
 void MwNotiMiniController::_updateInfoText(const std::string& text)
 {
-    const bool plays = getModel()->getPlayerState() != MwPlayer::PLAY_STATE_NONE;
+    const bool plays = getModel()->getPlayerState() != PLAY_STATE_NONE;
     _surface.setInfo(text, TEXT_COLOR, plays ? PLAYING_TEXT_SIZE : RECORDING_TEXT_SIZE, plays);
 }
 
@@ -257,7 +255,7 @@ void MwNotiMiniController::_watchTime()
 {
     if (!_surface.isSeen() || !MwSystemMgr::getInstance()->isLCDOn())
         return;
-    if (getModel()->getRecorderState() == MwRecorder::REC_STATE_RECORDING)
+    if (getModel()->getRecorderState() == REC_STATE_RECORDING)
         _createRecordingStatusUpdateTimer();
     else
         _createRecordPauseBlinkTimer();
@@ -271,8 +269,8 @@ void MwNotiMiniController::_createRecordingStatusUpdateTimer()
     }
     MW_LOGI("Create recording status update timer!");
     _statusUpdateTimer = panekit::WTimer::addTimer(STATUS_INTERVAL, [this](void*) {
-        if (getModel()->getRecorderState() != MwRecorder::REC_STATE_RECORDING) {
-            MW_LOGE("Invalid recorder state! [%d]", getModel()->getRecorderState());
+        if (getModel()->getRecorderState() != REC_STATE_RECORDING) {
+            MW_LOGE("Invalid recorder state! [%d]", mwNumber(getModel()->getRecorderState()));
             return false;
         }
         if (getTimeText() != _shownTime)

@@ -4,7 +4,6 @@
 
 #include "MwLog.h"
 #include "MwModel.h"
-#include "MwRecorder.h"
 #include "MwText.h"
 
 namespace {
@@ -22,7 +21,7 @@ void MwNotificationMiniController::update()
 {
     if (!isRecording())
         return;
-    const bool paused = getModel()->getRecorderState() == MwRecorder::REC_STATE_PAUSED;
+    const bool paused = getModel()->getRecorderState() == REC_STATE_PAUSED;
     const std::string title = getModel()->getCurrentRecordingFileName();
     // A running time would be a new notification every second.
     const std::string text = paused ? getRecordingText() + " \u00b7 " + getTimeText() : getRecordingText();

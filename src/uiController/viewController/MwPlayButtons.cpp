@@ -11,7 +11,6 @@
 #include "MwFeatureChecker.h"
 #include "MwModel.h"
 #include "MwPlayRules.h"
-#include "MwPlayer.h"
 #include "MwResourceMgr.h"
 
 struct MwPlayViewController::ButtonLook {
@@ -194,7 +193,7 @@ void MwPlayViewController::_tintWhilePressed(Evas_Object* button)
 
 void MwPlayViewController::_clickPlayButton()
 {
-    if (_model->getPlayerState() == MwPlayer::PLAY_STATE_PAUSED) {
+    if (_model->getPlayerState() == PLAY_STATE_PAUSED) {
         if (_send(MwAppController::RESUME_PLAYING, "play start failed!"))
             _update();
         return;

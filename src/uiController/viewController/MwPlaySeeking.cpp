@@ -7,7 +7,6 @@
 
 #include "MwModel.h"
 #include "MwPlayRules.h"
-#include "MwPlayer.h"
 
 using panekit::WTimer;
 
@@ -42,7 +41,7 @@ void MwPlayViewController::_seekTo(unsigned int position)
 {
     const std::weak_ptr<void> panel = _token;
     _model->setCurrentPlayPosition(position);
-    if (_model->getPlayerState() != MwPlayer::PLAY_STATE_NONE)
+    if (_model->getPlayerState() != PLAY_STATE_NONE)
         (void)_send(MwAppController::SET_PLAYER_POSITION, "set play position failed!");
     if (panel.expired())
         return;

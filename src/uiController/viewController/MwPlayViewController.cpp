@@ -6,7 +6,6 @@
 
 #include "MwModel.h"
 #include "MwPlayRules.h"
-#include "MwPlayer.h"
 #include "MwResourceMgr.h"
 
 using panekit::WTimer;
@@ -112,7 +111,7 @@ void MwPlayViewController::_playerUpdated()
     _update();
 }
 
-bool MwPlayViewController::_isPlaying() const { return _model->getPlayerState() == MwPlayer::PLAY_STATE_PLAYING; }
+bool MwPlayViewController::_isPlaying() const { return _model->getPlayerState() == PLAY_STATE_PLAYING; }
 
 bool MwPlayViewController::_send(MwAppController::Command command, const char* failure)
 {

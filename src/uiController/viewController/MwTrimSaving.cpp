@@ -12,7 +12,6 @@
 #include "MwLoggingMgr.h"
 #include "MwMemoryFullPopup.h"
 #include "MwModel.h"
-#include "MwPlayer.h"
 #include "MwResourceMgr.h"
 #include "MwSavePopupMenuItem.h"
 #include "MwStorageRoots.h"
@@ -140,7 +139,7 @@ bool MwTrimSaving::_hasRoom(int storage) const
 
 void MwTrimSaving::_startTrim(bool asNewFile)
 {
-    if (_model->getPlayerState() != MwPlayer::PLAY_STATE_NONE
+    if (_model->getPlayerState() != PLAY_STATE_NONE
         && !_appController->dispatchCommand(MwAppController::STOP_PLAYING)) {
         MW_LOGE("stop failed!");
         return;

@@ -12,7 +12,6 @@
 #include "MwLog.h"
 #include "MwModel.h"
 #include "MwPlayRules.h"
-#include "MwPlayer.h"
 #include "MwResourceMgr.h"
 #include "MwSavedBookmarks.h"
 #include "MwText.h"
@@ -291,7 +290,7 @@ bool MwTrimViewController::_keyPressed(const std::string& key)
     return true;
 }
 
-bool MwTrimViewController::_isPlaying() const { return _model->getPlayerState() == MwPlayer::PLAY_STATE_PLAYING; }
+bool MwTrimViewController::_isPlaying() const { return _model->getPlayerState() == PLAY_STATE_PLAYING; }
 
 bool MwTrimViewController::_send(MwAppController::Command command, const char* failure)
 {
@@ -306,16 +305,16 @@ bool MwTrimViewController::_send(MwAppController::Command command, const char* f
 void MwTrimViewController::_playButtonClicked()
 {
     switch (_model->getPlayerState()) {
-    case MwPlayer::PLAY_STATE_PLAYING:
+    case PLAY_STATE_PLAYING:
         _send(MwAppController::PAUSE_PLAYING, "pause failed!");
         return;
-    case MwPlayer::PLAY_STATE_PAUSED:
+    case PLAY_STATE_PAUSED:
         _send(MwAppController::RESUME_PLAYING, "resume failed!");
         return;
-    case MwPlayer::PLAY_STATE_NONE:
+    case PLAY_STATE_NONE:
         break;
     default:
-        MW_LOGE("invalid state - [%d]", _model->getPlayerState());
+        MW_LOGE("invalid state - [%d]", mwNumber(_model->getPlayerState()));
         return;
     }
     if (_playPath.empty()) {
@@ -455,7 +454,7 @@ void MwTrimViewController::_moveInside()
 void MwTrimViewController::_seekTo(unsigned int position)
 {
     _model->setCurrentPlayPosition(position);
-    if (_model->getPlayerState() != MwPlayer::PLAY_STATE_NONE)
+    if (_model->getPlayerState() != PLAY_STATE_NONE)
         _send(MwAppController::SET_PLAYER_POSITION, "SET_PLAYER_POSITION failed");
 }
 
