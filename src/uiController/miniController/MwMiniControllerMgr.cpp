@@ -23,6 +23,7 @@
 namespace {
 
 constexpr auto ALARM_SERVICE_ID = "com.tovanic.mewlo-alarmservice";
+constexpr double PRELOAD_SECONDS = 1; // after the program's first frames
 constexpr const char* FOCUS_EVENTS[] = {"focused", "unfocused"};
 
 bool isRecording(const MwModel& model)
@@ -76,6 +77,11 @@ void MwMiniControllerMgr::_initialize()
     for (const char* event : FOCUS_EVENTS)
         if (Evas_Object* window = _window())
             evas_object_smart_callback_add(window, event, _focusChangedCb, this);
+    _preloading = panekit::WTimer::addTimer(PRELOAD_SECONDS, [this](void*) {
+        if (_window() && canBeWindow())
+            MwNotiMiniController::preload(_window());
+        return false;
+    });
     MwSignalMgr* signals = MwSignalMgr::getInstance();
     _lifeCycleListenerId
         = signals->getLifeCycleSignal().addListener([this](MwSignalMgr::LifeCycle change) { _onLifeCycle(change); });
@@ -91,6 +97,7 @@ void MwMiniControllerMgr::_removeListeners()
 {
     if (_lifeCycleListenerId == 0)
         return;
+    panekit::WTimer::destroy(_preloading);
     preference_unset_changed_cb(PREFERENCE_USE_NOTIFICATION_CONTROL, _preferenceChangedCb);
     notification_control_unwatch();
     for (const char* event : FOCUS_EVENTS)
@@ -182,6 +189,7 @@ void MwMiniControllerMgr::_createMiniController(Kind kind)
             MW_LOGE("_dispatchCommandToAppController : [%d] failed!!!", action);
     });
     _miniControllers.push_back({controller, id, kind});
+    controller->update();
 }
 
 void MwMiniControllerMgr::_end(Entry& entry)
@@ -227,10 +235,10 @@ void MwMiniControllerMgr::_onRecorderUpdated()
         return;
     }
     MW_LOGI("update mini controller");
+    _updateAll();
     _choosePanelSurface();
     if (MwSystemMgr::getInstance()->isLockscreenOn() && state == REC_STATE_RECORDING)
         _createLockscreenMiniController();
-    _updateAll();
 }
 
 void MwMiniControllerMgr::_onPlayerUpdated()
@@ -241,10 +249,10 @@ void MwMiniControllerMgr::_onPlayerUpdated()
         _later(&MwMiniControllerMgr::_playbackEnded);
         break;
     case PLAY_STATE_PLAYING:
+        _updateAll();
         _choosePanelSurface();
         if (MwSystemMgr::getInstance()->isLockscreenOn())
             _createLockscreenMiniController();
-        _updateAll();
         break;
     case PLAY_STATE_PAUSED:
         if (_miniControllers.empty())
@@ -276,8 +284,7 @@ void MwMiniControllerMgr::_onSystemInfo(MwSignalMgr::SystemInfo info)
             return _destroyMiniController(LOCKSCREEN);
         if (_model->getPlayerState() != PLAY_STATE_PLAYING && !isRecording(*_model))
             return;
-        _createLockscreenMiniController();
-        return _updateAll();
+        return _createLockscreenMiniController();
     }
     case MwSignalMgr::TIME_ZONE_CHANGED:
     case MwSignalMgr::REGION_FORMAT_CHANGED:

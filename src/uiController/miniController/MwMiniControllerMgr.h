@@ -73,6 +73,7 @@ private:
     MwAppController* _appController;
     panekit::WWindowController* _windowController;
     std::vector<Entry> _miniControllers; // in the order of their creation
+    panekit::WTimer::Weak _preloading;
     MwHandle<app_control_h, app_control_destroy> _alarmAppControl;
     unsigned int _lifeCycleListenerId = 0;
     unsigned int _systemInfoListenerId = 0;

@@ -16,6 +16,72 @@ namespace {
 
 constexpr auto IMAGE_FILE = "edje/MwImages.edj";
 
+// Null when it cannot be drawn (logged).
+Evas_Object* addLayout(Evas_Object* parent, const MwMiniSurfaceLook& look)
+{
+    std::string path;
+    if (!MwResourceMgr::getInstance()->getEdjPath(look.file, path)) {
+        MW_LOGE("getEdjPath fail");
+        return nullptr;
+    }
+    Evas_Object* layout = elm_layout_add(parent);
+    if (layout && elm_layout_file_set(layout, path.c_str(), look.group) != EINA_FALSE)
+        return layout;
+    MW_LOGE("elm_layout_add fail");
+    evas_object_del(layout);
+    return nullptr;
+}
+
+void addImage(Evas_Object* button, const char* part, const char* image, const char* color)
+{
+    std::string path;
+    if (!MwResourceMgr::getInstance()->getEdjPath(IMAGE_FILE, path)) {
+        MW_LOGE("getEdjPath fail");
+        return;
+    }
+    Evas_Object* icon = elm_image_add(button);
+    elm_image_file_set(icon, path.c_str(), image);
+    uxt_theme_object_set_color(icon, color);
+    elm_object_part_content_set(button, part, icon);
+    evas_object_show(icon);
+}
+
+Evas_Object* makeButton(Evas_Object* parent, const MwMiniButton& look)
+{
+    Evas_Object* button = uxt_button_add_with_style(parent, look.style);
+    if (look.icon)
+        addImage(button, "elm.icon.normal", look.icon, look.color);
+    if (look.background)
+        addImage(button, "elm.icon.bg", look.background, look.backgroundColor);
+    return button;
+}
+
+// The label asks for all of its text's width; a grid gives it what there is.
+Evas_Object* addLabel(Evas_Object* layout, const char* part)
+{
+    Evas_Object* grid = elm_grid_add(layout);
+    Evas_Object* label = elm_label_add(grid);
+    elm_object_style_set(label, "slide_roll");
+    elm_grid_size_set(grid, 1, 1);
+    elm_grid_pack(grid, label, 0, 0, 1, 1);
+    evas_object_show(label);
+    elm_object_part_content_set(layout, part, grid);
+    evas_object_show(grid);
+    return label;
+}
+
+}
+
+void MwMiniSurface::preload(
+    Evas_Object* window, const MwMiniSurfaceLook& look, std::initializer_list<const MwMiniButton*> buttons)
+{
+    Evas_Object* layout = addLayout(window, look);
+    if (!layout)
+        return;
+    addLabel(layout, look.infoPart);
+    for (const MwMiniButton* button : buttons)
+        evas_object_del(makeButton(layout, *button));
+    evas_object_del(layout);
 }
 
 MwMiniSurface::~MwMiniSurface()
@@ -36,16 +102,9 @@ bool MwMiniSurface::create(minicontrol_provider_event_cb callback, void (*seenCh
     }
     elm_win_title_set(_window, mwTranslate("IDS_MW_APP_NAME").c_str());
     elm_win_alpha_set(_window, EINA_TRUE);
-    std::string path;
-    if (!MwResourceMgr::getInstance()->getEdjPath(_look.file, path)) {
-        MW_LOGE("getEdjPath fail");
+    _layout = addLayout(_window, _look);
+    if (!_layout)
         return false;
-    }
-    _layout = elm_layout_add(_window);
-    if (!_layout || elm_layout_file_set(_layout, path.c_str(), _look.group) == EINA_FALSE) {
-        MW_LOGE("elm_layout_add fail");
-        return false;
-    }
     evas_object_name_set(_layout, _look.group);
     evas_object_size_hint_weight_set(_layout, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
     evas_object_show(_layout);
@@ -57,7 +116,7 @@ bool MwMiniSurface::create(minicontrol_provider_event_cb callback, void (*seenCh
         [](void* surface, Evas_Object*, void*) {
             const auto* self = static_cast<MwMiniSurface*>(surface);
             self->_slide();
-            if (self->_seenChanged)
+            if (self->_seenChanged && !self->_parts.empty()) // otherwise it is drawn next, seen or not
                 self->_seenChanged(self->_data);
         },
         this);
@@ -85,8 +144,6 @@ void MwMiniSurface::setInfo(const std::string& text, const char* colorCode, int 
 {
     if (!_layout)
         return;
-    if (Evas_Object* former = elm_object_part_content_unset(_layout, _look.infoPart); former)
-        evas_object_del(former); // the label with it
     int red = 0;
     int green = 0;
     int blue = 0;
@@ -95,16 +152,9 @@ void MwMiniSurface::setInfo(const std::string& text, const char* colorCode, int 
     const std::string line = mwDisplayMarkup(text);
     const char* format = centred ? "<font_size=%d><color=#%02x%02x%02x%02x><align=center>%s</align></color></font_size>"
                                  : "<font_size=%d><color=#%02x%02x%02x%02x>%s</color></font_size>";
-    // The label asks for all of its text's width; a grid gives it what there is.
-    Evas_Object* grid = elm_grid_add(_layout);
-    _label = elm_label_add(grid);
-    elm_object_style_set(_label, "slide_roll");
+    if (!_label)
+        _label = addLabel(_layout, _look.infoPart);
     elm_object_text_set(_label, mwFormat(format, size, red, green, blue, alpha, line.c_str()).c_str());
-    elm_grid_size_set(grid, 1, 1);
-    elm_grid_pack(grid, _label, 0, 0, 1, 1);
-    evas_object_show(_label);
-    elm_object_part_content_set(_layout, _look.infoPart, grid);
-    evas_object_show(grid);
     _slide();
 }
 
@@ -122,21 +172,6 @@ void MwMiniSurface::setTime(const std::string& text) const
         elm_object_part_text_set(_layout, _look.timePart, text.c_str());
 }
 
-bool MwMiniSurface::_addImage(Evas_Object* button, const char* part, const char* image, const char* color) const
-{
-    std::string path;
-    if (!MwResourceMgr::getInstance()->getEdjPath(IMAGE_FILE, path)) {
-        MW_LOGE("getEdjPath fail");
-        return false;
-    }
-    Evas_Object* icon = elm_image_add(button);
-    elm_image_file_set(icon, path.c_str(), image);
-    uxt_theme_object_set_color(icon, color);
-    elm_object_part_content_set(button, part, icon);
-    evas_object_show(icon);
-    return true;
-}
-
 void MwMiniSurface::addButton(const MwMiniButton& look, Clicked clicked, void* data)
 {
     addFixedButton(look, clicked, data);
@@ -148,11 +183,7 @@ void MwMiniSurface::addFixedButton(const MwMiniButton& look, Clicked clicked, vo
 {
     if (!_layout)
         return;
-    Evas_Object* button = uxt_button_add_with_style(_layout, look.style);
-    if (look.icon)
-        _addImage(button, "elm.icon.normal", look.icon, look.color);
-    if (look.background)
-        _addImage(button, "elm.icon.bg", look.background, look.backgroundColor);
+    Evas_Object* button = makeButton(_layout, look);
     panekit::setAccessibleName(button, look.accessibleName);
     // A click may take the window away, and the button with it.
     elm_object_focus_move_policy_set(button, ELM_FOCUS_MOVE_POLICY_KEY_ONLY);

@@ -2,7 +2,7 @@
 
 #include <minicontrol.h>
 
-#include <functional>
+#include <initializer_list>
 #include <string>
 #include <vector>
 
@@ -52,8 +52,13 @@ public:
     MwMiniSurface(const MwMiniSurface&) = delete;
     MwMiniSurface& operator=(const MwMiniSurface&) = delete;
 
+    // Has the toolkit load what such a surface is made of, so that the first one need not wait for it. The window is
+    // any of the program's.
+    static void preload(
+        Evas_Object* window, const MwMiniSurfaceLook& look, std::initializer_list<const MwMiniButton*> buttons);
+
     // False when there is nothing to draw on (logged); everything else is without effect then. The second callback
-    // comes with the data when somebody can see the surface, or nobody any more.
+    // comes with the data when somebody can see what has been drawn, or nobody any more.
     bool create(minicontrol_provider_event_cb callback, void (*seenChanged)(void* data), void* data);
     [[nodiscard]] Evas_Object* getWindow() const { return _window; }
     [[nodiscard]] Evas_Object* getLayout() const { return _layout; }
@@ -75,7 +80,6 @@ public:
     void restoreFocus();
 
 private:
-    bool _addImage(Evas_Object* button, const char* part, const char* image, const char* color) const;
     void _slide() const;
 
     const MwMiniSurfaceLook& _look;

@@ -42,6 +42,10 @@ constexpr MwMiniButton PREVIOUS = {"mini_controller_play_prev_btn", PLAY_STYLE,
     "miniNotification/player_button_prev.png", "AO104", nullptr, nullptr, "IDS_MW_BUTTON_PREVIOUS"};
 constexpr MwMiniButton NEXT = {"mini_controller_play_next_btn", PLAY_STYLE, "miniNotification/player_button_next.png",
     "AO104", nullptr, nullptr, "IDS_MW_BUTTON_NEXT"};
+constexpr MwMiniButton MENU = {"mini_controller_menu_btn", "mewlo/noti_menu",
+    "miniNotification/album_default_recorder.png", "AO104", nullptr, nullptr, "IDS_MW_APP_NAME"};
+constexpr MwMiniButton CLOSE
+    = {"close_button", "on_white_bg_mewlo", nullptr, nullptr, nullptr, nullptr, "IDS_MW_BUTTON_CLOSE"};
 
 // The service's event brings no data along.
 MwNotiMiniController* live = nullptr;
@@ -59,6 +63,11 @@ MwNotiMiniController::MwNotiMiniController(
 }
 
 MwNotiMiniController::~MwNotiMiniController() { live = nullptr; }
+
+void MwNotiMiniController::preload(Evas_Object* window)
+{
+    MwMiniSurface::preload(window, LOOK, {&MENU, &CLOSE, &PAUSE_RECORD, &RESUME_RECORD, &STOP, &PLAY});
+}
 
 void MwNotiMiniController::create()
 {
@@ -93,15 +102,11 @@ void MwNotiMiniController::_resize() { _surface.resize(MwMiniSurface::scaled(WID
 
 void MwNotiMiniController::_createMenuButton()
 {
-    static constexpr MwMiniButton MENU = {"mini_controller_menu_btn", "mewlo/noti_menu",
-        "miniNotification/album_default_recorder.png", "AO104", nullptr, nullptr, "IDS_MW_APP_NAME"};
     _surface.addFixedButton(MENU, _clickedCb<&MwNotiMiniController::_menuButtonClicked>, this);
 }
 
 void MwNotiMiniController::_createCloseButton()
 {
-    static constexpr MwMiniButton CLOSE
-        = {"close_button", "on_white_bg_mewlo", nullptr, nullptr, nullptr, nullptr, "IDS_MW_BUTTON_CLOSE"};
     _surface.addFixedButton(CLOSE, _clickedCb<&MwNotiMiniController::_closeButtonClicked>, this);
 }
 

@@ -17,6 +17,9 @@ public:
     MwNotiMiniController(MwModel* model, MwAppController* appController, panekit::WWindowController* windowController);
     ~MwNotiMiniController() override;
 
+    // See MwMiniSurface::preload.
+    static void preload(Evas_Object* window);
+
     void create() override;
     void destroy() override;
     void update() override;
