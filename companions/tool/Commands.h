@@ -25,5 +25,8 @@ constexpr int OK = 0, FAILED = 1, WRONG_USE = 2;
 std::string option(const Arguments& arguments, const std::string& name);
 // A whole text that is a decimal number.
 bool parseNumber(const std::string& text, long& number);
+// A text that stays on its line and in its column: backslash, newline, tab and other control characters as in C
+// (\\ \n \t \ooo).
+std::string escaped(const std::string& text);
 
 }

@@ -40,7 +40,8 @@ void printKeyCb(const char* key, const char* value, bool pinned, void* userData)
     const auto* wanted = static_cast<const tool::Arguments*>(userData);
     if (wanted != nullptr && !wanted->empty() && std::find(wanted->begin(), wanted->end(), key) == wanted->end())
         return;
-    std::printf("%s=%s%s\n", key, value != nullptr ? value : "", pinned ? " (pinned)" : "");
+    std::printf("%s=%s%s\n", tool::escaped(key).c_str(), value != nullptr ? tool::escaped(value).c_str() : "",
+        pinned ? " (pinned)" : "");
     std::fflush(stdout);
 }
 
@@ -72,7 +73,7 @@ int tool::state(const Arguments& arguments)
 {
     const std::string action = arguments.empty() ? "list" : arguments[0];
     const size_t count = arguments.size();
-    if (action == "list") {
+    if (action == "list" && count <= 1) {
         state_keys_list(printKeyCb, nullptr);
         return OK;
     }

@@ -17,7 +17,7 @@ int tool::list(const Arguments&)
     for (const MwFileInfo& info : model.getRecordedFileList()) {
         int bookmarks = 0;
         media_info_get_bookmark_count_from_db(info.mediaId.c_str(), nullptr, &bookmarks);
-        std::printf("%s\t%d\t%d\n", info.path.c_str(), info.duration, bookmarks);
+        std::printf("%s\t%d\t%d\n", escaped(info.path).c_str(), info.duration, bookmarks);
     }
     media_content_disconnect();
     return OK;

@@ -116,6 +116,40 @@ TEST_F(FileCompanionsTest, ToolOffersThePrivateStorageInLaterSessionsToo)
     EXPECT_EQ(1, method);
 }
 
+TEST_F(FileCompanionsTest, ToolRefusesWhatItDoesNotKnowAndTellsWhatItCannotWrite)
+{
+    struct {
+        const char* words;
+        int status;
+        const char* output; // null: anything
+    } const cases[] = {
+        {"list --wrong", 2, ""},
+        {"list extra", 2, ""},
+        {"locks extra", 2, ""},
+        {"doctor --wrong", 2, ""},
+        {"usage extra", 2, ""},
+        {"record 1 extra", 2, ""},
+        {"record 1 --format", 2, ""},
+        {"request --wrong 1", 2, ""},
+        {"state list extra", 2, ""},
+        {"", 2, ""},
+        {"--version", 0, nullptr},
+        {"--help > /dev/full", 1, ""},
+        {"state set memory/x \"$(printf 'a\\nb')\"", 0, ""},
+        {"state | grep memory/x", 0, "memory/x=a\\nb\n"},
+    };
+    for (const auto& [words, status, output] : cases) {
+        SCOPED_TRACE(words);
+        const std::string file = _programs.file("output");
+        support::writeFile(file, ""); // programs append
+        const std::string line = std::string(TEST_BIN_DIR "/mewlo-tool ") + words;
+        EXPECT_EQ(status, Program({"sh", "-c", "exec 2>/dev/null; " + line}, file).wait());
+        if (output != nullptr) {
+            EXPECT_EQ(output, support::readFile(file));
+        }
+    }
+}
+
 TEST_F(FileCompanionsTest, OffersWhatIsInstalledAndAlwaysTheClipboard)
 {
     const std::vector<std::string> paths = {"/music/a b.m4a", "/music/ö.m4a"};
