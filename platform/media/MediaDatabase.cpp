@@ -17,8 +17,6 @@ namespace media {
 
 namespace {
 
-    constexpr int BUSY_TIMEOUT_MS = 3000;
-
     constexpr auto SCHEMA = R"(
 CREATE TABLE IF NOT EXISTS media(
   MEDIA_ID TEXT PRIMARY KEY NOT NULL, MEDIA_PATH TEXT COLLATE NOCASE NOT NULL,
@@ -168,6 +166,7 @@ private:
 
 Database::Database(std::string path)
     : _path(std::move(path))
+    , _readers(_path)
 {
 }
 
@@ -203,7 +202,7 @@ int Database::_openOnce()
     int result = sqlite3_open_v2(
         _path.c_str(), &_db, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE | SQLITE_OPEN_FULLMUTEX, nullptr);
     if (result == SQLITE_OK) {
-        sqlite3_busy_timeout(_db, BUSY_TIMEOUT_MS);
+        sqlite3_busy_timeout(_db, DatabaseReaders::BUSY_TIMEOUT_MS);
         // A row is written after its file was flushed; losing the last rows in a power cut only means that the next
         // start catalogues those files again. Bookmarks have no second copy, hence FULL and not NORMAL.
         result = sqlite3_exec(_db, "PRAGMA journal_mode=WAL; PRAGMA synchronous=FULL; PRAGMA foreign_keys=ON;", nullptr,
@@ -216,17 +215,16 @@ int Database::_openOnce()
     if (result != SQLITE_OK) {
         __dlog_print(LOG_ID_MAIN, DLOG_ERROR, "MEWLO", "media database cannot be opened: %s", sqlite3_errstr(result));
         _close();
+    } else {
+        _readers.allow();
     }
-    _isOpen = result == SQLITE_OK;
     return result;
 }
 
 void Database::_close()
 {
-    _isOpen = false;
+    _readers.close();
     sqlite3_close_v2(std::exchange(_db, nullptr));
-    const platform::Lock lock(_readMutex);
-    sqlite3_close_v2(std::exchange(_reader, nullptr));
 }
 
 int Database::_migrate()
@@ -351,27 +349,10 @@ int Database::_guarded(const Work& work)
 // What finds damage is done again where damage is repaired.
 int Database::_reading(const Reading& work)
 {
-    if (!_isOpen) {
-        if (const int result = open(); result != SQLITE_OK)
-            return result;
-    }
-    const int result = _readBeside(work);
-    return isDamage(result) ? _guarded([&]() REQUIRES(_mutex) { return work(_db); }) : result;
-}
-
-int Database::_readBeside(const Reading& work)
-{
-    const platform::Lock lock(_readMutex);
-    if (_reader == nullptr) {
-        const int result
-            = sqlite3_open_v2(_path.c_str(), &_reader, SQLITE_OPEN_READWRITE | SQLITE_OPEN_FULLMUTEX, nullptr);
-        sqlite3_busy_timeout(_reader, BUSY_TIMEOUT_MS);
-        if (result != SQLITE_OK) {
-            sqlite3_close_v2(std::exchange(_reader, nullptr));
-            return result;
-        }
-    }
-    return work(_reader);
+    const std::optional<int> result = _readers.read(work);
+    if (result && !isDamage(*result))
+        return *result;
+    return _guarded([&]() REQUIRES(_mutex) { return work(_db); }); // which opens it, or mends it
 }
 
 int Database::_transaction(const Work& work)

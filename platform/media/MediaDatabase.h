@@ -11,6 +11,8 @@
 #include <utility>
 #include <vector>
 
+#include "media/DatabaseReaders.h"
+
 namespace media {
 
 // One row of the media table.
@@ -57,8 +59,8 @@ struct FileChanges {
     std::vector<std::string> removed;
 };
 
-// The SQLite file behind the media content interface: a connection that writes and one that reads, each shared by all
-// threads under a lock, so that nobody who reads waits for the thousand rows of a writer. Whatever else
+// The SQLite file behind the media content interface: a connection that writes, shared by all threads under a lock, and
+// those that read, so that nobody who reads waits for the thousand rows of a writer or of another reader. Whatever else
 // is in its place (damage, another program's database, a folder) is set aside, and a new one gets what can be salvaged
 // of it and of the last good copy beside it; the caller then compares it with the recordings.
 class Database {
@@ -104,11 +106,10 @@ public:
 private:
     class Statement;
     using Work = std::function<int()>;
-    using Reading = std::function<int(sqlite3* db)>;
+    using Reading = DatabaseReaders::Reading;
 
     int _guarded(const Work& work);
     int _reading(const Reading& work);
-    int _readBeside(const Reading& work);
     int _transaction(const Work& work);
     int _openIfClosed() REQUIRES(_mutex);
     int _openOnce() REQUIRES(_mutex);
@@ -126,12 +127,10 @@ private:
 
     std::string _path;
     std::atomic<bool> _replaced = false;
-    std::atomic<bool> _isOpen = false;
     platform::Mutex _mutex;
     sqlite3* _db GUARDED_BY(_mutex) = nullptr;
     bool _isChanged GUARDED_BY(_mutex) = false; // since the good copy
-    platform::Mutex _readMutex; // taken last
-    sqlite3* _reader GUARDED_BY(_readMutex) = nullptr;
+    DatabaseReaders _readers;
 };
 
 }

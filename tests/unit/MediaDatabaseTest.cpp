@@ -13,6 +13,7 @@
 #include <map>
 #include <thread>
 
+#include "media/DatabaseReaders.h"
 #include "support/Amr.h"
 #include "support/DatabaseRows.h"
 #include "support/Recordings.h"
@@ -481,6 +482,31 @@ TEST_F(MediaDatabaseTest, NobodyWhoReadsWaitsForAScan)
     EXPECT_EQ(Names{"a.m4a"}, before);
     scanner.join();
     EXPECT_EQ((Names{"a.m4a", "b.m4a"}), names());
+}
+
+TEST_F(MediaDatabaseTest, NobodyWhoReadsWaitsForAnotherReader)
+{
+    addRecording("a.m4a");
+    media::DatabaseReaders readers(support::databasePath());
+    const auto nothing = [](sqlite3*) { return SQLITE_OK; };
+    EXPECT_EQ(std::nullopt, readers.read(nothing));
+    readers.allow();
+    std::optional<int> other;
+    std::thread closer;
+    std::atomic<bool> isClosed = false;
+    readers.read([&](sqlite3*) {
+        std::thread([&] { other = readers.read(nothing); }).join(); // while this one reads
+        closer = std::thread([&] {
+            readers.close();
+            isClosed = true;
+        });
+        while (readers.read(nothing)) // until the closing has begun
+            std::this_thread::yield();
+        EXPECT_FALSE(isClosed);
+        return SQLITE_OK;
+    });
+    EXPECT_EQ(SQLITE_OK, other);
+    closer.join();
 }
 
 TEST_F(MediaDatabaseTest, AnUnknownLengthIsAskedForByScansOnly)
