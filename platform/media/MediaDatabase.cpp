@@ -309,18 +309,28 @@ void Database::_restore(const std::string& aside)
     sqlite3_exec(_db, "COMMIT", nullptr, nullptr, nullptr);
 }
 
+// Also that indices agree with their tables: where they do not, rows are hidden and no call fails.
+int Database::_verify()
+{
+    Statement check(_db, "PRAGMA integrity_check(1)");
+    if (check.step() && check.text(0) == "ok")
+        return SQLITE_OK;
+    return check.code() == SQLITE_OK ? SQLITE_CORRUPT : check.code();
+}
+
 void Database::keepCopy()
 {
     const platform::Lock lock(_mutex);
-    struct stat status { };
-    if (_db == nullptr || (!_isChanged && ::stat(_copyPath().c_str(), &status) == 0))
+    if (_db == nullptr)
         return;
-    // Only what is sound itself replaces a good copy.
-    {
-        Statement check(_db, "PRAGMA quick_check(1)");
-        if (!check.step() || check.text(0) != "ok")
-            return;
-    }
+    const int verdict = _verify();
+    if (isDamage(verdict))
+        _replace();
+    if (verdict != SQLITE_OK)
+        return;
+    struct stat status { };
+    if (!_isChanged && ::stat(_copyPath().c_str(), &status) == 0)
+        return;
     const std::string fresh = _copyPath() + ".new";
     ::unlink(fresh.c_str());
     if (Statement(_db, "VACUUM INTO ?").bind(fresh).run() != SQLITE_OK)
@@ -414,7 +424,9 @@ int Database::_putRow(MediaRow& row)
               "MEDIA_TIMELINE=excluded.MEDIA_TIMELINE, MEDIA_DURATION=excluded.MEDIA_DURATION");
     insert.bind(row.id).bind(row.path).bind(row.displayName).bind(row.mimeType).bind(row.mode).bind(row.storage);
     insert.bind(row.size).bind(row.addedTime).bind(row.modifiedTime).bind(row.timeline).bind(row.duration);
-    return insert.run();
+    const int result = insert.run();
+    // No row has this path, and yet its index refuses it: they do not agree.
+    return (result & 0xff) == SQLITE_CONSTRAINT ? SQLITE_CORRUPT : result;
 }
 
 int Database::put(MediaRow& row)

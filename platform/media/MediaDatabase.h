@@ -72,7 +72,8 @@ public:
 
     // 0, or SQLite's code. Creates the file and its folder as needed.
     int open();
-    // Renews the good copy when something was changed since; for a quiet moment.
+    // Looks whether all of it is sound and replaces it otherwise; renews the good copy when something was changed
+    // since. For a quiet moment.
     void keepCopy();
     [[nodiscard]] const std::string& path() const { return _path; }
     // Whether a damaged file was replaced since the last call.
@@ -119,6 +120,7 @@ private:
     int _insertBookmark(const std::string& mediaId, unsigned int markedTime, const std::string& name) REQUIRES(_mutex);
     int _migrate() REQUIRES(_mutex);
     int _checkTables() REQUIRES(_mutex);
+    int _verify() REQUIRES(_mutex);
     int _replace() REQUIRES(_mutex);
     std::string _setAside() REQUIRES(_mutex);
     void _restore(const std::string& aside) REQUIRES(_mutex);

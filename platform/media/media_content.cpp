@@ -243,6 +243,9 @@ void openNow(Connection& held)
             refill(held);
     }
     held.database.keepCopy();
+    const platform::Lock lock(held.mutex);
+    if (held.database.takeReplaced())
+        refill(held);
 }
 
 // From now on what other programs do to the files arrives by itself.
