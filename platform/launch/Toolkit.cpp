@@ -55,7 +55,6 @@ void raiseMainWindow()
 {
     if (window() == nullptr)
         return;
-    elm_win_iconified_set(window(), EINA_FALSE);
     evas_object_show(window());
     elm_win_raise(window());
     elm_win_activate(window());

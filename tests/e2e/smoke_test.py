@@ -120,20 +120,35 @@ def wakes(process):
         return int(re.search(r"^voluntary_ctxt_switches:\s+(\d+)", status.read(), re.M).group(1))
 
 
+def colours(place, window):
+    """How many the middle of the window has: one, when it is not drawn."""
+    return int(place.call("import", "-window", window, "-gravity", "center", "-crop", "50%x50%+0+0", "-format", "%k",
+                          "info:") or 0)
+
+
+def minimise(place):
+    main = place.window()
+    place.call("xdotool", "windowminimize", main)
+    place.wait_for("the surface", lambda: place.window() not in (None, main))
+    time.sleep(1)  # the first frame; before it the surface takes no clicks
+
+
 def surface_controls_what_is_minimised(place):
     recorder = start_recorder(place)
     place.make_noise(20)
     start_recording(place)
     main = place.window()
     check(len(place.call("xdotool", "search", "--onlyvisible", "--class", "mewlo-lite").split()) == 1, "no surface in front of it")
-    place.call("xdotool", "windowminimize", main)
-    place.wait_for("the surface", lambda: place.window() not in (None, main))
-    time.sleep(1)
+    minimise(place)
     before = wakes(recorder)
     time.sleep(1)
     check(wakes(recorder) - before < 100, "minimised, it does not wake for every frame and every bit of sound")
     place.click(678, 500)
     place.wait_for("the pause", lambda: place.recorder_state() == "3")
+    place.click(70, 500)
+    place.wait_for("the window", lambda: place.window() == main)
+    place.wait_for("its picture", lambda: colours(place, main) > 50)
+    minimise(place)
     place.click(678, 500)
     place.wait_for("the resume", lambda: place.recorder_state() == "2")
     time.sleep(1)
