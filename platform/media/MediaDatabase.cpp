@@ -321,15 +321,15 @@ int Database::_verify()
 void Database::keepCopy()
 {
     const platform::Lock lock(_mutex);
-    if (_db == nullptr)
+    struct stat status { };
+    const bool hasCopy = ::stat(_copyPath().c_str(), &status) == 0;
+    if (_db == nullptr || (_isVerified && !_isChanged && hasCopy))
         return;
     const int verdict = _verify();
     if (isDamage(verdict))
         _replace();
-    if (verdict != SQLITE_OK)
-        return;
-    struct stat status { };
-    if (!_isChanged && ::stat(_copyPath().c_str(), &status) == 0)
+    _isVerified = verdict == SQLITE_OK;
+    if (!_isVerified || (!_isChanged && hasCopy))
         return;
     const std::string fresh = _copyPath() + ".new";
     ::unlink(fresh.c_str());

@@ -131,6 +131,7 @@ private:
     std::atomic<bool> _replaced = false;
     platform::Mutex _mutex;
     sqlite3* _db GUARDED_BY(_mutex) = nullptr;
+    bool _isVerified GUARDED_BY(_mutex) = false; // once by this process
     bool _isChanged GUARDED_BY(_mutex) = false; // since the good copy
     DatabaseReaders _readers;
 };
