@@ -55,12 +55,38 @@ namespace {
         elm_win_icon_object_set(window, icon);
     }
 
+    // Never larger than the screen, with some room for title bar and panel: at twice the scale the design would not fit
+    // on many. False where the screen is not known yet: a Wayland compositor tells it after the first words.
+    bool applySize(Evas_Object* window)
+    {
+        int width = scaled(DESIGN_WIDTH);
+        int height = scaled(DESIGN_HEIGHT);
+        int screenWidth = 0;
+        int screenHeight = 0;
+        elm_win_screen_size_get(window, nullptr, nullptr, &screenWidth, &screenHeight);
+        const bool isKnown = screenWidth > 0 && screenHeight > 0;
+        if (isKnown) {
+            width = std::min(width, screenWidth);
+            height = std::min(height, screenHeight * 9 / 10);
+        }
+        evas_object_resize(window, width, height);
+        return isKnown;
+    }
+
     // A line for whoever measures the start; then what nobody waits for.
     void firstFrameCb(void* window, Evas* canvas, void*)
     {
         evas_event_callback_del(canvas, EVAS_CALLBACK_RENDER_POST, firstFrameCb);
         __dlog_print(LOG_ID_MAIN, DLOG_INFO, "PANEKIT", "first frame");
         applyIcon(static_cast<Evas_Object*>(window));
+    }
+
+    void firstFrameOfUnknownScreenCb(void* data, Evas* canvas, void*)
+    {
+        evas_event_callback_del(canvas, EVAS_CALLBACK_RENDER_POST, firstFrameOfUnknownScreenCb);
+        auto* window = static_cast<Evas_Object*>(data);
+        if (!elm_win_maximized_get(window) && !elm_win_fullscreen_get(window))
+            applySize(window);
     }
 
     void applyDesktopScale()
@@ -147,28 +173,15 @@ bool WWindowController::create()
     elm_win_icon_name_set(_window, _name.c_str());
     evas_object_smart_callback_add(_window, "delete,request", _closeCb, this);
     eext_window_arm(_window);
-    _applySize();
+    const bool isSized = applySize(_window);
     _watchVisibility();
     ui_app_set_window(_window);
-    evas_event_callback_add(evas_object_evas_get(_window), EVAS_CALLBACK_RENDER_POST, firstFrameCb, _window);
+    Evas* canvas = evas_object_evas_get(_window);
+    evas_event_callback_add(canvas, EVAS_CALLBACK_RENDER_POST, firstFrameCb, _window);
+    if (!isSized)
+        evas_event_callback_add(canvas, EVAS_CALLBACK_RENDER_POST, firstFrameOfUnknownScreenCb, _window);
     evas_object_show(_window);
     return true;
-}
-
-// Never larger than the screen, with some room for title bar and panel: at twice the scale the design would not fit on
-// many.
-void WWindowController::_applySize()
-{
-    int width = scaled(DESIGN_WIDTH);
-    int height = scaled(DESIGN_HEIGHT);
-    int screenWidth = 0;
-    int screenHeight = 0;
-    elm_win_screen_size_get(_window, nullptr, nullptr, &screenWidth, &screenHeight);
-    if (screenWidth > 0 && screenHeight > 0) {
-        width = std::min(width, screenWidth);
-        height = std::min(height, screenHeight * 9 / 10);
-    }
-    evas_object_resize(_window, width, height);
 }
 
 void WWindowController::_watchVisibility()

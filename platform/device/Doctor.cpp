@@ -1,6 +1,7 @@
 #include "doctor.h"
 
 #include "host/BusInLoop.h"
+#include "host/DisplayServer.h"
 #include "host/PulseWatch.h"
 #include "state/Directories.h"
 #include "storage.h"
@@ -98,23 +99,13 @@ void addBuses(Report& report)
     report.add("MPRIS", session != nullptr, "available", "keys of the keyboard only");
 }
 
-std::string environment(const char* name)
-{
-    const char* value = std::getenv(name);
-    return value != nullptr ? value : "";
-}
-
 std::string rootText(const char* root) { return std::string(root) + (::access(root, W_OK) == 0 ? "" : " (read only)"); }
 
 void addPlaces(Report& report)
 {
-    const std::string display = environment("DISPLAY");
-    const std::string wayland = environment("WAYLAND_DISPLAY");
-    report.add(
-        "display", !display.empty() || !wayland.empty(), display + (display.empty() ? "" : " ") + wayland, "no window");
-    // Where the toolkit shows windows on X11.
-    const std::string engine = environment("ELM_DISPLAY");
-    const bool x11 = !display.empty() && (engine.empty() || engine == "x11");
+    const std::string server = host::displayServer();
+    report.add("display", !server.empty(), server == "wl" ? "Wayland" : server, "no window");
+    const bool x11 = server == "x11";
     report.add("control windows", x11, "for the panel; over lock screens that let windows through",
         "a notification, where those have buttons");
     const bool device = ::access(storage_device_root(), W_OK) == 0;

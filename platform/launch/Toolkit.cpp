@@ -4,6 +4,9 @@
 #include <Elementary.h>
 
 #include <cstdlib>
+#include <string>
+
+#include "host/DisplayServer.h"
 
 namespace platform {
 
@@ -24,8 +27,8 @@ namespace {
 void prepareToolkitEnvironment()
 {
     setDefault("ECORE_NO_SYSTEM_MODULES", "1"); // they speak to the system bus on their own, noisily
-    if (std::getenv("DISPLAY") != nullptr)
-        setDefault("ELM_DISPLAY", "x11");
+    if (const std::string server = host::displayServer(); !server.empty())
+        setDefault("ELM_DISPLAY", server.c_str());
 }
 
 bool startToolkit(int argc, char** argv)

@@ -3,6 +3,7 @@
 #include "doctor.h"
 #include "host/BatteryWatch.h"
 #include "host/CallWatch.h"
+#include "host/DisplayServer.h"
 #include "host/LocaleWatch.h"
 #include "host/LogindWatch.h"
 #include "host/MountWatch.h"
@@ -15,11 +16,14 @@
 #include "support/DbusMock.h"
 #include "support/PrivateBus.h"
 #include "support/RunUntil.h"
+#include "support/TempDir.h"
 
 #include <gtest/gtest.h>
 
 #include <map>
 
+#include <sys/socket.h>
+#include <sys/un.h>
 #include <unistd.h>
 
 namespace {
@@ -380,6 +384,44 @@ TEST(HostlessTest, DoctorNamesWhatIsMissing)
     EXPECT_EQ("", fallbacks["state keys"]);
     EXPECT_EQ("", fallbacks["device storage"]);
     EXPECT_GE(missing, 7);
+}
+
+TEST(DisplayServerTest, IsACompositorThatAnswersBeforeAnXServer)
+{
+    const support::TempDir directory;
+    const auto listenAt = [](const std::string& path) {
+        sockaddr_un address{};
+        address.sun_family = AF_UNIX;
+        path.copy(address.sun_path, sizeof address.sun_path - 1);
+        const int server = ::socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0);
+        EXPECT_EQ(0, ::bind(server, reinterpret_cast<sockaddr*>(&address), sizeof address));
+        EXPECT_EQ(0, ::listen(server, 5));
+        return server;
+    };
+    const int server = listenAt(directory.file("wayland-0"));
+    ::close(listenAt(directory.file("wayland-dead")));
+    struct Case {
+        const char* chosen;
+        std::string compositor;
+        const char* display;
+        const char* expected;
+    };
+    std::map<const char*, std::string> former;
+    for (const char* name : {"XDG_RUNTIME_DIR", "ELM_DISPLAY", "WAYLAND_DISPLAY", "DISPLAY"})
+        former[name] = std::getenv(name) != nullptr ? std::getenv(name) : "";
+    ::setenv("XDG_RUNTIME_DIR", directory.path().c_str(), 1);
+    for (const Case& each : {Case{"", "wayland-0", ":0", "wl"}, Case{"", directory.file("wayland-0"), "", "wl"},
+             Case{"", "wayland-dead", ":0", "x11"}, Case{"", "wayland-none", ":0", "x11"}, Case{"", "", ":0", "x11"},
+             Case{"", "wayland-dead", "", ""}, Case{"x11", "wayland-0", ":0", "x11"},
+             Case{"buffer", "wayland-0", "", "buffer"}}) {
+        ::setenv("ELM_DISPLAY", each.chosen, 1);
+        ::setenv("WAYLAND_DISPLAY", each.compositor.c_str(), 1);
+        ::setenv("DISPLAY", each.display, 1);
+        EXPECT_EQ(each.expected, host::displayServer()) << each.compositor << " " << each.display;
+    }
+    for (const auto& [name, value] : former)
+        ::setenv(name, value.c_str(), 1);
+    ::close(server);
 }
 
 TEST(CallManagerTest, AnswersTheNumberOfCalls)

@@ -36,7 +36,6 @@ public:
 
 private:
     struct Watch;
-    void _applySize();
     void _watchVisibility();
     static void _closeCb(void* data, Evas_Object* object, void* info);
     std::string _name;
