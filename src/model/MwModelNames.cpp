@@ -145,8 +145,7 @@ bool MwModel::updateNextRecordingFileName()
 {
     const platform::Lock lock(_mutex);
     // The screen asks again whenever it comes back; a running recording keeps the name that the screen shows.
-    const bool runs = _recorderState == REC_STATE_RECORDING || _recorderState == REC_STATE_PAUSED;
-    if (runs)
+    if (mwIsRecordingOrPaused(_recorderState))
         return true;
     _nameIsChosen = false;
     _texts.currentName = _advanceToFreeName(_numbers);

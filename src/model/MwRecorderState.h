@@ -5,3 +5,8 @@ enum class MwRecorderState : int { REC_STATE_NONE, REC_STATE_READY, REC_STATE_RE
 using enum MwRecorderState;
 
 constexpr int mwNumber(MwRecorderState state) { return static_cast<int>(state); }
+
+constexpr bool mwIsRecordingOrPaused(MwRecorderState state)
+{
+    return state == REC_STATE_RECORDING || state == REC_STATE_PAUSED;
+}

@@ -5,21 +5,32 @@
 #include <Elementary.h>
 
 #include <app.h>
+#include <panekit/WMenuPopupController.h>
 #include <panekit/WPopupController.h>
 
 #include "MwLog.h"
+#include "MwLoggingMgr.h"
 #include "MwModel.h"
-#include "MwRenamePopupController.h"
+#include "MwNextRecordingName.h"
+#include "MwRecorderDisplay.h"
+#include "MwRecordingStartStop.h"
+#include "MwRecordingTime.h"
 #include "MwResourceMgr.h"
+#include "MwSaveToPopup.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
 
+using panekit::WMenuPopupController;
+using panekit::WPopupController;
 using panekit::WTimer;
 
 namespace {
 
 constexpr auto LAYOUT_FILE = "edje/MwRecorderContentView.edj";
 constexpr auto LAYOUT_GROUP = "recorder_content_view";
+constexpr double BOOKMARK_PAUSE = 1.0; // seconds
+
+void closePopup(WPopupController* popup) { popup->destroy(); }
 
 }
 
@@ -65,18 +76,34 @@ void MwRecorderContentViewController::onCreated()
 {
     if (!_isComplete())
         return;
+    _createParts();
     _listen();
     _getEstimatedRecordingMaxTime();
     _updateContentView();
 }
 
+void MwRecorderContentViewController::_createParts()
+{
+    _display = std::make_unique<MwRecorderDisplay>(getEvasObject(), getModel());
+    _buttons = std::make_unique<MwRecorderButtons>(
+        getEvasObject(), [this](MwRecorderButtons::Button button) { _buttonClicked(button); });
+    _nextName = std::make_unique<MwNextRecordingName>(
+        getModel(), [this](const std::string& name) { _display->_updateFileName(name); });
+    MwRecordingStartStop::Screen screen;
+    screen.accepted = [this] {
+        _buttons->ignoreFurtherClicks(MwRecorderButtons::RECORD);
+        _buttons->ignoreFurtherClicks(MwRecorderButtons::STOP);
+    };
+    screen.started = [this] { _updateContentView(); };
+    screen.saved = [this] { _openRecordings(); };
+    _startStop = std::make_unique<MwRecordingStartStop>(getWindow(), getModel(), getAppController(), std::move(screen));
+}
+
 void MwRecorderContentViewController::_listen()
 {
-    MwSignalMgr* signals = MwSignalMgr::getInstance();
-    _lifeCycleListener = signals->getLifeCycleSignal().addListener(
+    listenToSystemInfo([this](MwSignalMgr::SystemInfo info) { _systemInfoChanged(info); });
+    _lifeCycleListener = MwSignalMgr::getInstance()->getLifeCycleSignal().addListener(
         [this](MwSignalMgr::LifeCycle lifeCycle) { _lifeCycleChanged(lifeCycle); });
-    _systemInfoListener = signals->getSystemInfoSignal().addListener(
-        [this](MwSignalMgr::SystemInfo info) { _systemInfoChanged(info); });
     // Goes with the view, or with the controller when that ends first.
     const auto updated = [this] {
         MW_LOGW("recorder update signal");
@@ -88,21 +115,19 @@ void MwRecorderContentViewController::_listen()
 
 // On TERMINATE at the latest: afterwards the controller and the signals are gone, while the screen waits for its
 // window.
-void MwRecorderContentViewController::_stopListening()
+void MwRecorderContentViewController::_forgetLifeCycle()
 {
-    MwSignalMgr* signals = MwSignalMgr::existing();
-    if (!signals)
-        return;
-    mwForget(signals->getSystemInfoSignal(), _systemInfoListener);
-    mwForget(signals->getLifeCycleSignal(), _lifeCycleListener);
+    if (MwSignalMgr* signals = MwSignalMgr::existing(); signals)
+        mwForget(signals->getLifeCycleSignal(), _lifeCycleListener);
 }
 
 void MwRecorderContentViewController::onDestroy()
 {
-    _stopListening();
-    for (const WTimer::Weak& timer : {_blinkTimer, _statusUpdateTimer, _bookMarkAddTimer, _nextNameIdler})
-        WTimer::destroy(timer);
-    _renamePopup.reset();
+    _forgetLifeCycle();
+    WTimer::destroy(_bookMarkAddTimer);
+    _startStop.reset();
+    _nextName.reset();
+    _display.reset();
     for (auto* popup : {std::exchange(_saveToPopup, nullptr), std::exchange(_discardPopup, nullptr)}) {
         if (!popup)
             continue;
@@ -126,12 +151,6 @@ void MwRecorderContentViewController::onTop()
         mwPost("IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
 }
 
-bool MwRecorderContentViewController::_isRecordingOrPaused() const
-{
-    const auto state = getModel()->getRecorderState();
-    return state == REC_STATE_RECORDING || state == REC_STATE_PAUSED;
-}
-
 void MwRecorderContentViewController::_openRecordings() { getAppController()->openRecordings(); }
 
 void MwRecorderContentViewController::_lifeCycleChanged(MwSignalMgr::LifeCycle lifeCycle)
@@ -150,7 +169,7 @@ void MwRecorderContentViewController::_lifeCycleChanged(MwSignalMgr::LifeCycle l
 
 void MwRecorderContentViewController::_appResume()
 {
-    _createUpdateNextRecordingFileNameTimer();
+    _nextName->_createUpdateNextRecordingFileNameTimer();
     // The first resume belongs to the start, which has just drawn everything.
     if (std::exchange(_skipNextResume, false))
         return;
@@ -162,16 +181,16 @@ void MwRecorderContentViewController::_appResume()
 
 void MwRecorderContentViewController::_appPause()
 {
-    _updateRecordingEffect(false);
-    _updateBlinking(false);
-    _destroyRecordingStatusUpdateTimer();
-    WTimer::destroy(_nextNameIdler);
+    _display->_updateRecordingEffect(false);
+    _display->_updateBlinking(false);
+    _display->_destroyRecordingStatusUpdateTimer();
+    _nextName->cancelUpdate();
 }
 
 void MwRecorderContentViewController::_appTerminate()
 {
     MW_LOGW("BEGIN");
-    _stopListening();
+    _forgetLifeCycle();
     MW_LOGW("END");
 }
 
@@ -207,19 +226,17 @@ void MwRecorderContentViewController::_systemInfoChanged(MwSignalMgr::SystemInfo
 
 void MwRecorderContentViewController::_mmcRemoved()
 {
-    // What can be kept is kept: on the card, when it is only about to go, or for the rescue, when it comes back.
-    if (getModel()->getStorageType() == MW_STORAGE_CARD && _isRecordingOrPaused() && !_isStopping)
-        _isStopping
-            = _dispatchAsync(MwAppController::STOP_RECORDING, &MwRecorderContentViewController::_stoppedByRemovedCard);
+    if (getModel()->getStorageType() == MW_STORAGE_CARD && mwIsRecordingOrPaused(getModel()->getRecorderState()))
+        _startStop->stopForRemovedCard();
     _destroySaveToPopup();
 }
 
 void MwRecorderContentViewController::_mediaDBUpdated()
 {
-    if (!_isRecordingOrPaused())
+    if (!mwIsRecordingOrPaused(getModel()->getRecorderState()))
         destroyAttachedPopup();
     if (getModel()->getAppState() == MwModel::APP_STATE_RESUMED)
-        _createUpdateNextRecordingFileNameTimer();
+        _nextName->_createUpdateNextRecordingFileNameTimer();
 }
 
 void MwRecorderContentViewController::_earjackInserted()
@@ -228,4 +245,244 @@ void MwRecorderContentViewController::_earjackInserted()
         return;
     mwPost(getModel()->getRecorderState() == REC_STATE_NONE ? "IDS_MW_TPOP_EXTERNAL_MICROPHONE_WILL_BE_USED_TO_RECORD"
                                                             : "IDS_MW_TPOP_RECORDING_WITH_EXTERNAL_MICROPHONE");
+}
+
+void MwRecorderContentViewController::_updateContentView()
+{
+    if (!_isComplete())
+        return;
+    _buttons->clear();
+    const auto state = getModel()->getRecorderState();
+    MW_LOGW("recorder state: [%d]", mwNumber(state));
+    elm_layout_signal_emit(
+        getEvasObject(), getModel()->isRequestMode() ? "enter_request_mode" : "leave_request_mode", "");
+    switch (state) {
+    case REC_STATE_NONE:
+    case REC_STATE_READY:
+        return _updateReady();
+    case REC_STATE_RECORDING:
+        return _updateRecording();
+    case REC_STATE_PAUSED:
+        return _updatePaused();
+    }
+    MW_LOGE("Invalid recorder state!");
+}
+
+void MwRecorderContentViewController::_updateReady()
+{
+    if (auto* popup = std::exchange(_discardPopup, nullptr); popup) {
+        MW_LOGW("detroy discard popup");
+        popup->destroy();
+    }
+    getModel()->setElapsedTime(0);
+    _display->resetRecordingTime();
+    _setCallRejection(false);
+    _display->_destroyRecordingStatusUpdateTimer();
+    _display->_updateFileName(getModel()->getRenameString());
+    _display->_updateSubtitle();
+    _display->_updateRecordingEffect(false);
+    _display->_updateBlinking(false);
+    _display->_updateRecordingTime();
+    _showButtons({MwRecorderButtons::RECORD, MwRecorderButtons::RECORDINGS});
+}
+
+void MwRecorderContentViewController::_updateRecording()
+{
+    _display->_updateBlinking(false);
+    _display->_createRecordingStatusUpdateTimer();
+    _display->_updateFileName(getModel()->getCurrentRecordingFileName());
+    _display->_updateRecordingEffect(true);
+    _showButtons({MwRecorderButtons::STOP, MwRecorderButtons::PAUSE, MwRecorderButtons::DISCARD});
+}
+
+void MwRecorderContentViewController::_updatePaused()
+{
+    _display->_updateRecordingTime();
+    _display->_destroyRecordingStatusUpdateTimer();
+    _display->_updateBlinking(true);
+    _display->_updateRecordingEffect(false);
+    _showButtons({MwRecorderButtons::STOP, MwRecorderButtons::RESUME, MwRecorderButtons::DISCARD});
+}
+
+void MwRecorderContentViewController::_showButtons(std::initializer_list<MwRecorderButtons::Button> buttons)
+{
+    _buttons->add(buttons);
+    if (mwIsRecordingOrPaused(getModel()->getRecorderState()) && !getModel()->isRequestMode())
+        _buttons->add({MwRecorderButtons::BOOKMARK});
+    // Return and Space act on the big button unless a popup has the keyboard.
+    if (!hasAttachedPopup() && !WPopupController::topmost())
+        _buttons->focusMain();
+}
+
+void MwRecorderContentViewController::_getEstimatedRecordingMaxTime()
+{
+    if (!getModel()->isRequestMode() || getModel()->getSizeLimit() >= MwModel::NO_SIZE_LIMIT)
+        return;
+    const auto seconds = mwEstimatedSeconds(getModel()->getSizeLimit(), getModel()->getFileFormat());
+    if (!seconds) {
+        MW_LOGE("Invalid recording format!");
+        return;
+    }
+    getModel()->setEstimatedRecordingMaxTime(*seconds);
+}
+
+void MwRecorderContentViewController::_setCallRejection(bool enable)
+{
+    MwSystemMgr::getInstance()->setRejectCall(enable);
+    elm_layout_signal_emit(getEvasObject(), enable ? "enable_call_rejection" : "disable_call_rejection", "");
+    if (!enable)
+        return;
+    MwLoggingMgr::getInstance()->insert("REJC");
+    mwPost("IDS_MW_TPOP_INCOMING_CALLS_BLOCKED_WHILE_RECORDING");
+}
+
+void MwRecorderContentViewController::_buttonClicked(MwRecorderButtons::Button button)
+{
+    if (!_isComplete())
+        return;
+    switch (button) {
+    case MwRecorderButtons::RECORD:
+        return _startStop->_recordButtonClicked();
+    case MwRecorderButtons::RECORDINGS:
+        return _openRecordings();
+    case MwRecorderButtons::STOP:
+        return _startStop->_stopButtonClicked();
+    case MwRecorderButtons::BOOKMARK:
+        return _bookmarkButtonClicked();
+    case MwRecorderButtons::PAUSE:
+        return _pauseButtonClicked();
+    case MwRecorderButtons::RESUME:
+        return _resumeButtonClicked();
+    case MwRecorderButtons::DISCARD:
+        return _backKeyClicked();
+    case MwRecorderButtons::BUTTONS:
+        return;
+    }
+}
+
+void MwRecorderContentViewController::_pauseButtonClicked()
+{
+    if (_startStop->isStopping())
+        return;
+    if (!getAppController()->dispatchCommand(MwAppController::PAUSE_RECORDING))
+        MW_LOGE("Record pause failed!");
+    _updateContentView();
+}
+
+void MwRecorderContentViewController::_resumeButtonClicked()
+{
+    if (_startStop->isStopping())
+        return;
+    if (!getAppController()->dispatchCommand(MwAppController::RESUME_RECORDING))
+        MW_LOGE("Record resume failed!");
+    _updateContentView();
+}
+
+void MwRecorderContentViewController::_bookmarkButtonClicked()
+{
+    if (_startStop->isStopping())
+        return;
+    if (!mwIsRecordingOrPaused(getModel()->getRecorderState())) {
+        MW_LOGE("Invalid recorder state [%d]", mwNumber(getModel()->getRecorderState()));
+        return;
+    }
+    if (!_addBookMarkEnabled) {
+        MW_LOGE("_addBookMarkEnabled is false, ignore!!");
+        return;
+    }
+    unsigned int markedTime = 0;
+    if (!getModel()->addBookMark(markedTime)) {
+        MW_LOGE("add book mark failed!!");
+        return;
+    }
+    MwLoggingMgr::getInstance()->insert("BMRK");
+    _addBookMarkEnabled = false;
+    _createBookMarkAddTimer();
+    _display->_updateBookMarkEffect(markedTime);
+}
+
+void MwRecorderContentViewController::_createBookMarkAddTimer()
+{
+    WTimer::destroy(_bookMarkAddTimer);
+    _bookMarkAddTimer = WTimer::addTimer(BOOKMARK_PAUSE, [this](void*) {
+        _addBookMarkEnabled = true;
+        return false;
+    });
+}
+
+void MwRecorderContentViewController::_backKeyClicked()
+{
+    if (!_isComplete() || _startStop->isStopping())
+        return;
+    if (mwIsRecordingOrPaused(getModel()->getRecorderState()))
+        _createDiscardPopup();
+    else
+        popOut();
+}
+
+void MwRecorderContentViewController::_moreKeyClicked()
+{
+    if (!_isComplete() || getModel()->isRequestMode() || _nextName->isEdited() || _saveToPopup)
+        return;
+    auto* menu = new WMenuPopupController();
+    if (mwIsRecordingOrPaused(getModel()->getRecorderState()) && !MwSystemMgr::getInstance()->getRejectCall()) {
+        menu->addItem("IDS_MW_OPT_ENABLE_CALL_REJECTION_ABB", [this] { _setCallRejection(true); });
+    } else if (mwIsRecordingOrPaused(getModel()->getRecorderState())) {
+        menu->addItem("IDS_MW_OPT_DISABLE_CALL_REJECTION_ABB", [this] { _setCallRejection(false); });
+    } else {
+        menu->addItem("IDS_MUSIC_OPT_RENAME", [this] {
+            MW_LOGW("Rename recording file name");
+            _nextName->_renameRecordingFileName(getWindow());
+            MwLoggingMgr::getInstance()->insert("Rena", "StandBy");
+        });
+    }
+    if (!mwIsRecordingOrPaused(getModel()->getRecorderState()) && MwSystemMgr::getInstance()->isMMCMounted()) {
+        menu->addItem("IDS_MW_HEADER_SAVE_TO", [this] {
+            MW_LOGW("create save to menu");
+            _createSaveToPopup();
+        });
+    }
+    attachPopup(menu);
+    menu->create(getWindow(), elm_object_item_widget_get(getNaviItem()));
+}
+
+void MwRecorderContentViewController::_createSaveToPopup()
+{
+    if (_saveToPopup)
+        return;
+    _saveToPopup = mwCreateSaveToPopup(getWindow(), getModel());
+    _saveToPopup->setOnDestroyed([this] { _saveToPopup = nullptr; });
+}
+
+void MwRecorderContentViewController::_destroySaveToPopup()
+{
+    if (auto* popup = std::exchange(_saveToPopup, nullptr); popup)
+        popup->destroy();
+}
+
+void MwRecorderContentViewController::_createDiscardPopup()
+{
+    if (_discardPopup)
+        return;
+    _discardPopup = new WPopupController();
+    _discardPopup->setTitle("IDS_MW_HEADER_DISCARD_RECORDING_ABB3");
+    _discardPopup->setContent("IDS_MW_POP_RECORDING_WILL_BE_STOPPED_AND_THE_FILE_WILL_BE_DISCARDED");
+    _discardPopup->addButton("IDS_MW_BUTTON_CANCEL", closePopup);
+    _discardPopup->addButton("IDS_MW_BUTTON_DISCARD_ABB3", [this](WPopupController*) { _discardRecording(); });
+    _discardPopup->setOnDestroyed([this] { _discardPopup = nullptr; });
+    _discardPopup->create(getWindow());
+}
+
+void MwRecorderContentViewController::_discardRecording()
+{
+    if (!_isComplete())
+        return;
+    const bool discarded = getAppController()->dispatchCommand(MwAppController::CANCEL_RECORDING);
+    if (!discarded)
+        MW_LOGE("Record cancel failed!");
+    getModel()->clearBookMark();
+    // Closes the popup when the recorder is ready again.
+    _updateContentView();
+    if (discarded)
+        mwPost("IDS_MW_TPOP_RECORDING_DISCARDED_M_SOUND");
 }

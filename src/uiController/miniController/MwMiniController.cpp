@@ -24,11 +24,7 @@ MwMiniController::MwMiniController(
 {
 }
 
-bool MwMiniController::isRecording() const
-{
-    const auto state = _model->getRecorderState();
-    return state == REC_STATE_RECORDING || state == REC_STATE_PAUSED;
-}
+bool MwMiniController::isRecording() const { return mwIsRecordingOrPaused(_model->getRecorderState()); }
 
 std::string MwMiniController::getRecordingText() const
 {

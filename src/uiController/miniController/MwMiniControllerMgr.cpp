@@ -26,11 +26,7 @@ constexpr auto ALARM_SERVICE_ID = "com.tovanic.mewlo-alarmservice";
 constexpr double PRELOAD_SECONDS = 1; // after the program's first frames
 constexpr const char* FOCUS_EVENTS[] = {"focused", "unfocused"};
 
-bool isRecording(const MwModel& model)
-{
-    const auto state = model.getRecorderState();
-    return state == REC_STATE_RECORDING || state == REC_STATE_PAUSED;
-}
+bool isRecording(const MwModel& model) { return mwIsRecordingOrPaused(model.getRecorderState()); }
 
 // On the desktop's panel; the user may prefer the notification where there can be one.
 bool canBeWindow()
