@@ -20,6 +20,8 @@ public:
 
     [[nodiscard]] MwModel* getModel() const { return _model; }
     [[nodiscard]] MwAppController* getAppController() const { return _appController; }
+    // A title that is no string identifier: the number of selected rows.
+    void setCountTitle(size_t count);
 
 protected:
     ~MwContentViewController() override;
@@ -31,8 +33,6 @@ protected:
     // Hears of changes in the device until the screen goes or the application ends: then the signals and the controller
     // are gone, while the screen may still wait for its window.
     void listenToSystemInfo(std::function<void(MwSignalMgr::SystemInfo)> listener);
-    // A title that is no string identifier: the number of selected rows.
-    void setCountTitle(size_t count);
     // Expires with the screen: what may come back later holds it and gives up when it is gone.
     [[nodiscard]] std::weak_ptr<void> token() const { return _token; }
 

@@ -16,7 +16,6 @@
 #include "MwRecordingStartStop.h"
 #include "MwRecordingTime.h"
 #include "MwResourceMgr.h"
-#include "MwSaveToPopup.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
 
@@ -36,6 +35,7 @@ void closePopup(WPopupController* popup) { popup->destroy(); }
 
 MwRecorderContentViewController::MwRecorderContentViewController(MwModel* model, MwAppController* appController)
     : MwContentViewController(model, appController)
+    , _saveToPopup(model)
 {
 }
 
@@ -128,9 +128,8 @@ void MwRecorderContentViewController::onDestroy()
     _startStop.reset();
     _nextName.reset();
     _display.reset();
-    for (auto* popup : {std::exchange(_saveToPopup, nullptr), std::exchange(_discardPopup, nullptr)}) {
-        if (!popup)
-            continue;
+    _saveToPopup.close();
+    if (auto* popup = std::exchange(_discardPopup, nullptr); popup) {
         popup->setOnDestroyed(nullptr);
         popup->destroy();
     }
@@ -228,7 +227,7 @@ void MwRecorderContentViewController::_mmcRemoved()
 {
     if (getModel()->getStorageType() == MW_STORAGE_CARD && mwIsRecordingOrPaused(getModel()->getRecorderState()))
         _startStop->stopForRemovedCard();
-    _destroySaveToPopup();
+    _saveToPopup.close();
 }
 
 void MwRecorderContentViewController::_mediaDBUpdated()
@@ -422,7 +421,7 @@ void MwRecorderContentViewController::_backKeyClicked()
 
 void MwRecorderContentViewController::_moreKeyClicked()
 {
-    if (!_isComplete() || getModel()->isRequestMode() || _nextName->isEdited() || _saveToPopup)
+    if (!_isComplete() || getModel()->isRequestMode() || _nextName->isEdited() || _saveToPopup.isOpen())
         return;
     auto* menu = new WMenuPopupController();
     if (mwIsRecordingOrPaused(getModel()->getRecorderState()) && !MwSystemMgr::getInstance()->getRejectCall()) {
@@ -437,27 +436,10 @@ void MwRecorderContentViewController::_moreKeyClicked()
         });
     }
     if (!mwIsRecordingOrPaused(getModel()->getRecorderState()) && MwSystemMgr::getInstance()->isMMCMounted()) {
-        menu->addItem("IDS_MW_HEADER_SAVE_TO", [this] {
-            MW_LOGW("create save to menu");
-            _createSaveToPopup();
-        });
+        menu->addItem("IDS_MW_HEADER_SAVE_TO", [this] { _saveToPopup.open(getWindow()); });
     }
     attachPopup(menu);
     menu->create(getWindow(), elm_object_item_widget_get(getNaviItem()));
-}
-
-void MwRecorderContentViewController::_createSaveToPopup()
-{
-    if (_saveToPopup)
-        return;
-    _saveToPopup = mwCreateSaveToPopup(getWindow(), getModel());
-    _saveToPopup->setOnDestroyed([this] { _saveToPopup = nullptr; });
-}
-
-void MwRecorderContentViewController::_destroySaveToPopup()
-{
-    if (auto* popup = std::exchange(_saveToPopup, nullptr); popup)
-        popup->destroy();
 }
 
 void MwRecorderContentViewController::_createDiscardPopup()

@@ -7,6 +7,7 @@
 
 #include "MwContentViewController.h"
 #include "MwRecorderButtons.h"
+#include "MwSaveToPopup.h"
 #include "MwSignalMgr.h"
 
 class MwNextRecordingName;
@@ -70,8 +71,6 @@ private:
     void _moreKeyClicked();
 
     // Popups
-    void _createSaveToPopup();
-    void _destroySaveToPopup();
     void _createDiscardPopup();
     void _discardRecording();
 
@@ -82,7 +81,7 @@ private:
     std::unique_ptr<MwNextRecordingName> _nextName;
     std::unique_ptr<MwRecordingStartStop> _startStop;
     panekit::WTimer::Weak _bookMarkAddTimer;
-    panekit::WPopupController* _saveToPopup = nullptr; // deletes itself
+    MwSaveToPopup _saveToPopup;
     panekit::WPopupController* _discardPopup = nullptr; // deletes itself
     unsigned int _lifeCycleListener = 0;
 };

@@ -1,58 +1,26 @@
-// The recordings list: its contents, its redraw and what is docked below it.
-#include "MwRecordingsContentViewController.h"
+#include "MwRecordingsList.h"
 
+#include <algorithm>
+#include <array>
 #include <libintl.h>
 #include <utility>
 
 #include <Elementary.h>
 
-#include <panekit/WAccessibility.h>
-#include <panekit/WPopupController.h>
-#include <panekit/WTimer.h>
 #include <uxt_theme.h>
 
 #include "MwListDates.h"
 #include "MwLog.h"
-#include "MwPlayViewController.h"
-#include "MwRecordingsModes.h"
-#include "MwRecordingsRows.h"
-#include "MwResourceMgr.h"
-#include "MwText.h"
-#include "MwTrimViewController.h"
-
-using panekit::WTimer;
+#include "MwModel.h"
+#include "MwRecordingsMode.h"
 
 namespace {
 
-constexpr auto LAYOUT_FILE = "edje/MwRecordingsContentView.edj";
-constexpr auto RECORD_CONTROLLER_GROUP = "record_controller";
-constexpr auto IMAGE_FILE = "edje/MwImages.edj";
 constexpr auto LIST_PART = "elm.swallow.list";
-constexpr auto CONTROLLER_PART = "elm.swallow.controller";
-constexpr auto RECORD_PART = "record_button";
 constexpr auto RADIO_KEY = "radio";
 constexpr int NO_CHOICE_VALUE = -1;
 constexpr double TAKING_DOWN_SECONDS = 0.004;
-
-std::string edjePath(const char* file)
-{
-    std::string path;
-    if (!MwResourceMgr::getInstance()->getEdjPath(file, path) || path.empty())
-        MW_LOGE("getEdjPath fail");
-    return path;
-}
-
-void setIcon(Evas_Object* button, const char* part, const char* image, const char* color)
-{
-    const std::string path = edjePath(IMAGE_FILE);
-    if (path.empty())
-        return;
-    Evas_Object* icon = elm_image_add(button);
-    elm_image_file_set(icon, path.c_str(), image);
-    uxt_theme_object_set_color(icon, color);
-    elm_object_part_content_set(button, part, icon);
-    evas_object_show(icon);
-}
+constexpr int ALL_ROWS = 1 << 30;
 
 Eina_Bool takeDownSlice(void* list)
 {
@@ -88,63 +56,107 @@ void replaceColour(Evas_Object* layout, const char* replaced, const char* code)
         red, green, blue, alpha);
 }
 
+// How far a key moves the highlight, 0 for other keys.
+int rowsOfKey(const std::string& key, int page)
+{
+    struct Move {
+        const char* key;
+        int rows;
+    };
+    const std::array<Move, 6> moves = {{
+        {.key = "Down", .rows = 1},
+        {.key = "Up", .rows = -1},
+        {.key = "Next", .rows = page},
+        {.key = "Prior", .rows = -page},
+        {.key = "End", .rows = ALL_ROWS},
+        {.key = "Home", .rows = -ALL_ROWS},
+    }};
+    const auto found = std::find_if(moves.begin(), moves.end(), [&](const Move& move) { return key == move.key; });
+    return found != moves.end() ? found->rows : 0;
 }
 
-void MwRecordingsContentViewController::_update()
+}
+
+MwRecordingsList::MwRecordingsList(Evas_Object* layout, MwModel* model, const MwRecordingsMode& mode, Screen screen)
+    : _layout(layout)
+    , _model(model)
+    , _mode(&mode)
+    , _screen(std::move(screen))
 {
-    if (!_isComplete())
-        return;
-    MW_LOGW("viewType : [%d], playerState : [%d]", _viewType, mwNumber(getModel()->getPlayerState()));
-    const bool playsHere = mwRecordingsMode(_viewType).plays;
-    if (std::exchange(_reloadNeeded, false))
-        _loadContents();
-    if (_genlist) {
-        const MwRecordingsRows::Place place = _rows->getPlace();
-        if (_rows->isRenewalCheaper(mwRecordingsMode(_viewType).files))
-            _renewList();
-        _rows->show(mwRecordingsMode(_viewType).files);
-        if (playsHere && getModel()->getCurrentPlayPath().empty()) {
-            _removeSelectAllItem();
-            _clearChecks();
-            if (_viewType == NORMAL)
-                elm_radio_value_set(_radioGroup(), NO_CHOICE_VALUE);
-        } else if (_getListType() == MwRecordingsListItem::MULTIPLE_CHOICE) {
-            _loadSelectAllItem();
-        }
-        _rows->restore(place);
-        _refreshRealizedItems();
-    }
-    _loadTitle(_checkedCount());
-    _loadTitleButtons();
-    _loadMoreButton();
-    _updateController();
+    _rowContext.model = model;
+    _rowContext.getListType = [this] { return _mode->listType; };
+    _rowContext.onSelected = [this](Item& row) { _screen.onSelected(row); };
+}
+
+MwRecordingsList::~MwRecordingsList() = default;
+
+void MwRecordingsList::close()
+{
+    _cancelBringIn();
+    _rows.reset();
+}
+
+void MwRecordingsList::setDisabled(bool disabled)
+{
     if (_genlist)
-        elm_object_disabled_set(_genlist, getModel()->isTrimMode());
+        elm_object_disabled_set(_genlist, disabled);
 }
 
-// What is shown stays, when it is still the right one: rows then follow the catalogue one by one.
-void MwRecordingsContentViewController::_loadContents()
+void MwRecordingsList::load()
 {
-    const bool isEmpty = getModel()->getRecordedFileList().empty();
+    const bool isEmpty = _model->getRecordedFileList().empty();
     if (isEmpty ? _noContents != nullptr : _genlist != nullptr)
         return;
+    _takeDownContents();
+    if (isEmpty)
+        return _createNoContents();
+    _createList();
+    _makeRows();
+    _rows->show(_mode->files);
+    if (_mode->picks)
+        _preselect();
+}
+
+void MwRecordingsList::_takeDownContents()
+{
     _rows.reset();
-    Evas_Object* content = elm_object_part_content_unset(getEvasObject(), LIST_PART);
+    Evas_Object* content = elm_object_part_content_unset(_layout, LIST_PART);
     if (content && content == _genlist)
         takeDown(content);
     else if (content)
         evas_object_del(content);
     _genlist = nullptr;
     _noContents = nullptr;
-    if (isEmpty)
-        return _createNoContents();
-    _createList();
-    _loadListItems();
 }
 
-void MwRecordingsContentViewController::_createNoContents()
+void MwRecordingsList::update()
 {
-    _noContents = elm_layout_add(getEvasObject());
+    if (!_rows)
+        return;
+    const MwRecordingsRows::Place place = _rows->getPlace();
+    if (_rows->isRenewalCheaper(_mode->files))
+        _renewList();
+    _rows->show(_mode->files);
+    _updateChoice();
+    _rows->restore(place);
+    refreshRealizedItems();
+}
+
+void MwRecordingsList::_updateChoice()
+{
+    if (_mode->plays && _model->getCurrentPlayPath().empty()) {
+        _rows->removeSelectAll();
+        _clearChecks();
+        if (!_mode->picks)
+            elm_radio_value_set(_radioGroup(), NO_CHOICE_VALUE);
+    } else if (_mode->listType == Item::MULTIPLE_CHOICE) {
+        _rows->addSelectAll();
+    }
+}
+
+void MwRecordingsList::_createNoContents()
+{
+    _noContents = elm_layout_add(_layout);
     elm_layout_theme_set(_noContents, "layout", "nocontents", "default");
     evas_object_size_hint_weight_set(_noContents, EVAS_HINT_EXPAND, EVAS_HINT_EXPAND);
     evas_object_size_hint_align_set(_noContents, EVAS_HINT_FILL, EVAS_HINT_FILL);
@@ -154,12 +166,12 @@ void MwRecordingsContentViewController::_createNoContents()
         _noContents, "elm.help.text", domain, "IDS_MW_BODY_AFTER_YOU_RECORD_VOICE_RECORDINGS_WILL_BE_SHOWN_HERE");
     elm_layout_signal_emit(_noContents, "text,disabled", "");
     elm_layout_signal_emit(_noContents, "align.center", "elm");
-    _colourNoContents();
-    elm_object_part_content_set(getEvasObject(), LIST_PART, _noContents);
+    colourNoContents();
+    elm_object_part_content_set(_layout, LIST_PART, _noContents);
     evas_object_show(_noContents);
 }
 
-void MwRecordingsContentViewController::_colourNoContents()
+void MwRecordingsList::colourNoContents()
 {
     if (!_noContents)
         return;
@@ -167,45 +179,39 @@ void MwRecordingsContentViewController::_colourNoContents()
     replaceColour(_noContents, "T0222L2", "T0222L4");
 }
 
-void MwRecordingsContentViewController::_createList()
+void MwRecordingsList::_createList()
 {
-    if (_genlist) {
-        MW_LOGE("_genlist is already created");
-        return;
-    }
-    _genlist = elm_genlist_add(getEvasObject());
+    _genlist = elm_genlist_add(_layout);
     elm_genlist_homogeneous_set(_genlist, EINA_TRUE);
     elm_genlist_mode_set(_genlist, ELM_LIST_COMPRESS);
     elm_scroller_bounce_set(_genlist, EINA_FALSE, EINA_FALSE);
     elm_scroller_policy_set(_genlist, ELM_SCROLLER_POLICY_OFF, ELM_SCROLLER_POLICY_AUTO);
     mwRenewDates(_genlist);
     _listenToListKeys();
-    elm_object_part_content_set(getEvasObject(), LIST_PART, _genlist);
+    elm_object_part_content_set(_layout, LIST_PART, _genlist);
     evas_object_show(_genlist);
-    _focusList();
+    _screen.onListCreated();
 }
 
-// The arrow keys mean the list, unless something lies over it.
-void MwRecordingsContentViewController::_focusList()
+void MwRecordingsList::renewDates()
 {
-    if (_genlist && isTop() && !hasAttachedPopup() && !panekit::WPopupController::topmost())
+    if (_genlist)
+        mwRenewDates(_genlist);
+    refreshRealizedItems();
+}
+
+void MwRecordingsList::focus()
+{
+    if (_genlist)
         elm_object_focus_set(_genlist, EINA_TRUE);
 }
 
-void MwRecordingsContentViewController::_loadListItems()
-{
-    _makeRows();
-    _rows->show(mwRecordingsMode(_viewType).files);
-    if (_viewType == PICK)
-        _preselect();
-}
-
 // The rows come again in another list; the former one goes in slices.
-void MwRecordingsContentViewController::_renewList()
+void MwRecordingsList::_renewList()
 {
     const int chosen = elm_radio_value_get(_radioGroup());
     const std::unique_ptr<MwRecordingsRows> former = std::move(_rows);
-    takeDown(elm_object_part_content_unset(getEvasObject(), LIST_PART));
+    takeDown(elm_object_part_content_unset(_layout, LIST_PART));
     _genlist = nullptr;
     _createList();
     _makeRows();
@@ -213,7 +219,7 @@ void MwRecordingsContentViewController::_renewList()
     elm_radio_value_set(_radioGroup(), chosen);
 }
 
-void MwRecordingsContentViewController::_makeRows()
+void MwRecordingsList::_makeRows()
 {
     // The group itself, hidden: the radios of the rows come and go with scrolling.
     Evas_Object* radioMain = elm_radio_add(_genlist);
@@ -223,7 +229,7 @@ void MwRecordingsContentViewController::_makeRows()
     _rows = std::make_unique<MwRecordingsRows>(_genlist, _rowContext);
 }
 
-Evas_Object* MwRecordingsContentViewController::_radioGroup() const
+Evas_Object* MwRecordingsList::_radioGroup() const
 {
     auto* group = _genlist ? static_cast<Evas_Object*>(evas_object_data_get(_genlist, RADIO_KEY)) : nullptr;
     if (!group)
@@ -231,196 +237,150 @@ Evas_Object* MwRecordingsContentViewController::_radioGroup() const
     return group;
 }
 
-void MwRecordingsContentViewController::_loadSelectAllItem() { _rows->addSelectAll(); }
-
-void MwRecordingsContentViewController::_removeSelectAllItem() { _rows->removeSelectAll(); }
-
-void MwRecordingsContentViewController::_refreshRealizedItems()
+void MwRecordingsList::refreshRealizedItems()
 {
     if (_rows)
-        _rows->forEachRealized([](MwRecordingsListItem& row) { row.refresh(); });
+        _rows->forEachRealized([](Item& row) { row.refresh(); });
 }
 
-// What is docked below the list: nothing while rows are selected, else the player of what is loaded or the record
-// button.
-void MwRecordingsContentViewController::_updateController()
+void MwRecordingsList::forgetBookmarks()
 {
-    if (!mwRecordingsMode(_viewType).plays)
-        return _destroyController();
-    if (getModel()->isTrimMode())
-        return _createTrimViewController();
-    if (_trimView)
-        _destroyController();
-    if (!getModel()->getCurrentPlayPath().empty())
-        return _createPlayViewController();
-    if (_playView)
-        _destroyController();
-    _createRecordController();
+    if (_rows)
+        _rows->forgetBookmarks();
 }
 
-void MwRecordingsContentViewController::_createRecordController()
+void MwRecordingsList::_clearChecks()
 {
-    if (elm_object_part_content_get(getEvasObject(), CONTROLLER_PART))
-        return;
-    const std::string path = edjePath(LAYOUT_FILE);
+    _rows->forEachLoaded([](Item& row) {
+        if (row.isChecked())
+            row.setChecked(false);
+        return true;
+    });
+}
+
+// The recording that plays, else the one that was just made.
+void MwRecordingsList::_preselect()
+{
+    std::string path = _model->getCurrentPlayPath();
+    const std::string name = _model->getCurrentRecordingFileName();
+    if (path.empty() && !name.empty()) {
+        path = _model->getRecordingPath(name);
+        _model->setCurrentRecordingFileName("");
+    }
     if (path.empty())
         return;
-    Evas_Object* layout = elm_layout_add(getEvasObject());
-    elm_layout_file_set(layout, path.c_str(), RECORD_CONTROLLER_GROUP);
-    Evas_Object* button = uxt_button_add_with_style(layout, "mewlo/circle_button/large");
-    setIcon(button, "elm.icon.normal", "mainView/voice_btn_rec.png", "AO014");
-    setIcon(button, "elm.icon.bg", "mainView/voice_btn_bg_rec.png", "AO001");
-    panekit::setAccessibleName(button, "IDS_MW_BODY_RECORD");
-    elm_object_focus_move_policy_set(button, ELM_FOCUS_MOVE_POLICY_KEY_ONLY);
-    const auto clicked = [](void* data, Evas_Object*, void*) {
-        static_cast<MwRecordingsContentViewController*>(data)->_clickRecordButton();
-    };
-    evas_object_smart_callback_add(button, "clicked", clicked, this);
-    elm_object_part_content_set(layout, RECORD_PART, button);
-    elm_object_part_content_set(getEvasObject(), CONTROLLER_PART, layout);
-    evas_object_show(layout);
+    if (const Item* row = _rows->find(path); row)
+        elm_radio_value_set(_radioGroup(), row->getIndex());
 }
 
-void MwRecordingsContentViewController::_clickRecordButton()
+void MwRecordingsList::toggle(Item& item)
 {
-    const auto alive = token();
-    const auto finished = [this, alive](MwAppController::Command, MwAppController::Result result, void*) {
-        if (result != MwAppController::SUCCESS)
-            MW_LOGE("START_RECORDING failed");
-        else if (!alive.expired() && isTop())
-            popOut(); // to the screen of the recorder
-    };
-    if (!getAppController()->dispatchCommandAsync(MwAppController::START_RECORDING, finished, nullptr))
-        MW_LOGE("START_RECORDING failed");
-}
-
-void MwRecordingsContentViewController::_destroyController()
-{
-    _playView = nullptr;
-    _trimView = nullptr;
-    if (Evas_Object* content = elm_object_part_content_unset(getEvasObject(), CONTROLLER_PART); content)
-        evas_object_del(content);
-    _announcePlayViewClosed();
-}
-
-void MwRecordingsContentViewController::_announcePlayViewClosed()
-{
-    if (!getModel()->isPlayViewShown())
-        return;
-    getModel()->setPlayViewShown(false);
-    if (MwSignalMgr* signals = MwSignalMgr::existing(); signals)
-        signals->getPlayViewClosedSignal().emit();
-}
-
-void MwRecordingsContentViewController::_createPlayViewController()
-{
-    if (_playView)
-        return;
-    _destroyController();
-    _playView = new MwPlayViewController(getModel(), getAppController());
-    _playView->getEventSignal().addListener([this](MwPlayViewController::eventType type) { _playViewEvent(type); });
-    if (!_playView->dock(getEvasObject(), MwPlayViewController::REPORTS_FILE_CHANGES))
-        return std::exchange(_playView, nullptr)->destroy();
-    getModel()->setPlayViewShown(true);
-}
-
-void MwRecordingsContentViewController::_createTrimViewController()
-{
-    if (_trimView)
-        return;
-    _destroyController();
-    _trimView = new MwTrimViewController(getModel(), getAppController());
-    _trimView->getEventSignal().addListener([this](MwTrimViewController::eventType type) { _trimViewEvent(type); });
-    if (!_trimView->dock(getEvasObject())) {
-        getModel()->setTrimMode(false);
-        std::exchange(_trimView, nullptr)->destroy();
-    }
-}
-
-// Closed or saved, the player comes back. After the panel's own callback, for the redraw deletes the panel.
-void MwRecordingsContentViewController::_trimViewEvent(int event)
-{
-    if (event != MwTrimViewController::TRIM_VIEW_EVENT_CLOSE && event != MwTrimViewController::TRIM_VIEW_EVENT_SAVED) {
-        MW_LOGE("invalid eventType");
-        return;
-    }
-    getModel()->setTrimMode(false);
-    if (event == MwTrimViewController::TRIM_VIEW_EVENT_SAVED) {
-        getModel()->createRecordedFileList();
-        getModel()->setCurrentPlayPosition(0);
-        _reloadNeeded = true;
-    }
-    const auto alive = token();
-    WTimer::addJob([this, alive](void*) {
-        if (alive.expired())
-            return;
-        _update();
-        _focusList(); // what had the keyboard is gone
+    item.setChecked(!item.isChecked());
+    const bool checked = item.isChecked();
+    Item* all = _rows->getSelectAll();
+    bool areAllChecked = true;
+    _rows->forEach([&](Item& row) {
+        if (item.isSelectAll() && row.isChecked() != checked)
+            row.setChecked(checked);
+        areAllChecked = areAllChecked && row.isChecked();
+        return true;
     });
+    if (all && all->isChecked() != areAllChecked)
+        all->setChecked(areAllChecked);
 }
 
-void MwRecordingsContentViewController::_playViewEvent(int event)
+size_t MwRecordingsList::getCheckedCount() const { return getCheckedPaths().size(); }
+
+std::vector<std::string> MwRecordingsList::getCheckedPaths() const
 {
-    switch (event) {
-    case MwPlayViewController::BOOKMARK_ADDED:
-        _rows->forgetBookmarks();
-        return;
-    case MwPlayViewController::FILE_CHANGED:
-        _refreshRealizedItems();
-        return;
-    case MwPlayViewController::TRIM_REQUESTED:
-        _updateLater();
-        return;
-    default:
-        MW_LOGE("invalid eventType");
-    }
+    return _rows && _mode->listType == Item::MULTIPLE_CHOICE ? _rows->getCheckedPaths() : std::vector<std::string>();
 }
 
-// After the panel's own callback, for the redraw may delete the panel.
-void MwRecordingsContentViewController::_updateLater()
+void MwRecordingsList::choose(const Item& row) { elm_radio_value_set(_radioGroup(), row.getIndex()); }
+
+bool MwRecordingsList::hasChoice() const { return _genlist && elm_radio_value_get(_radioGroup()) > 0; }
+
+std::string MwRecordingsList::getChosenPath() const
 {
-    const auto alive = token();
-    WTimer::addJob([this, alive](void*) {
-        if (!alive.expired())
-            _update();
-    });
+    const Item* row = _rows ? _rows->findByIndex(elm_radio_value_get(_radioGroup())) : nullptr;
+    return row ? row->getPath() : std::string();
 }
 
-void MwRecordingsContentViewController::_bringInItem()
+std::string MwRecordingsList::getHighlightedPath() const
 {
-    if (!mwRecordingsMode(_viewType).plays || !_rows)
+    const Item* row = _rows ? _rows->getHighlighted() : nullptr;
+    return row ? row->getPath() : std::string();
+}
+
+void MwRecordingsList::bringInItem()
+{
+    if (!_mode->plays || !_rows)
         return;
-    const std::string path = getModel()->getCurrentPlayPath();
+    const std::string path = _model->getCurrentPlayPath();
     if (path.empty()) {
         MW_LOGW("current play path is empty!!!");
         return;
     }
-    if (const MwRecordingsListItem* row = _rows->find(path); row)
+    if (const Item* row = _rows->find(path); row)
         elm_genlist_item_bring_in(row->getItem(), ELM_GENLIST_ITEM_SCROLLTO_IN);
 }
 
 // Once the panel is there: it makes the list shorter.
-void MwRecordingsContentViewController::_bringInAfterFrame()
+void MwRecordingsList::bringInAfterFrame()
 {
     _cancelBringIn();
-    evas_event_callback_add(
-        evas_object_evas_get(getEvasObject()), EVAS_CALLBACK_RENDER_FLUSH_POST, _playerViewFulshPost, this);
+    evas_event_callback_add(evas_object_evas_get(_layout), EVAS_CALLBACK_RENDER_FLUSH_POST, _playerViewFulshPost, this);
 }
 
-void MwRecordingsContentViewController::_cancelBringIn()
+void MwRecordingsList::_cancelBringIn()
 {
-    if (getEvasObject())
+    if (_layout)
         evas_event_callback_del_full(
-            evas_object_evas_get(getEvasObject()), EVAS_CALLBACK_RENDER_FLUSH_POST, _playerViewFulshPost, this);
+            evas_object_evas_get(_layout), EVAS_CALLBACK_RENDER_FLUSH_POST, _playerViewFulshPost, this);
 }
 
-void MwRecordingsContentViewController::_playerViewFulshPost(void* data, Evas*, void*)
+void MwRecordingsList::_playerViewFulshPost(void* data, Evas*, void*)
 {
-    auto* self = static_cast<MwRecordingsContentViewController*>(data);
+    auto* self = static_cast<MwRecordingsList*>(data);
     if (!self) {
         MW_LOGE("data is nullptr");
         return;
     }
     self->_cancelBringIn();
-    self->_bringInItem();
+    self->bringInItem();
+}
+
+// Before the list makes a scroll of Left and Right; the rest is like the list's own, but for the mark, which the list
+// moves only while its window has the keyboard.
+void MwRecordingsList::_listenToListKeys()
+{
+    const auto pressed = [](void* data, Evas*, Evas_Object*, void* info) {
+        auto* event = static_cast<Evas_Event_Key_Down*>(info);
+        auto* self = static_cast<MwRecordingsList*>(data);
+        if (self->_screen.onKey(event->key) || self->_listKeyPressed(event->key))
+            event->event_flags = static_cast<Evas_Event_Flags>(event->event_flags | EVAS_EVENT_FLAG_ON_HOLD);
+    };
+    // What has the keyboard when the list is focused is its inner object.
+    evas_object_event_callback_priority_add(
+        elm_layout_edje_get(_genlist), EVAS_CALLBACK_KEY_DOWN, EVAS_CALLBACK_PRIORITY_BEFORE, pressed, this);
+    const auto unfocused = [](void* data, Evas_Object*, void*) {
+        if (const auto* self = static_cast<MwRecordingsList*>(data); self->_rows)
+            self->_rows->removeHighlight();
+    };
+    evas_object_smart_callback_add(_genlist, "unfocused", unfocused, this);
+}
+
+bool MwRecordingsList::_listKeyPressed(const std::string& key)
+{
+    if (!_rows)
+        return false;
+    if (key == "space" || key == "Return" || key == "KP_Enter") {
+        if (Item* row = _rows->getHighlighted(); row)
+            _screen.onSelected(*row);
+        return true;
+    }
+    const int rows = rowsOfKey(key, _rows->getPage());
+    if (rows != 0)
+        _rows->moveHighlight(rows);
+    return rows != 0;
 }

@@ -1,5 +1,7 @@
 #include "MwSaveToPopup.h"
 
+#include <utility>
+
 #include <Elementary.h>
 
 #include <panekit/WPopupController.h>
@@ -46,13 +48,33 @@ Evas_Object* createSaveToList(Evas_Object* popup, MwModel* model, WPopupControll
 
 }
 
-WPopupController* mwCreateSaveToPopup(Evas_Object* window, MwModel* model)
+MwSaveToPopup::MwSaveToPopup(MwModel* model)
+    : _model(model)
 {
-    auto* chooser = new WPopupController();
-    chooser->setTitle("IDS_MW_HEADER_SAVE_TO");
-    chooser->setStyle("theme_bg");
-    chooser->setContent([model, chooser](Evas_Object* popup) { return createSaveToList(popup, model, chooser); });
-    chooser->setOnBack([](WPopupController* self) { self->destroy(); });
-    chooser->create(window);
-    return chooser;
+}
+
+MwSaveToPopup::~MwSaveToPopup() { close(); }
+
+void MwSaveToPopup::open(Evas_Object* window)
+{
+    if (_popup)
+        return;
+    MW_LOGW("create save to menu");
+    _popup = new WPopupController();
+    _popup->setTitle("IDS_MW_HEADER_SAVE_TO");
+    _popup->setStyle("theme_bg");
+    _popup->setContent(
+        [model = _model, popup = _popup](Evas_Object* parent) { return createSaveToList(parent, model, popup); });
+    _popup->setOnBack([](WPopupController* self) { self->destroy(); });
+    _popup->setOnDestroyed([this] { _popup = nullptr; });
+    _popup->create(window);
+}
+
+void MwSaveToPopup::close()
+{
+    auto* popup = std::exchange(_popup, nullptr);
+    if (!popup)
+        return;
+    popup->setOnDestroyed(nullptr);
+    popup->destroy();
 }
