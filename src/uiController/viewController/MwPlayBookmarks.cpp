@@ -1,5 +1,4 @@
-// The player panel: the bookmarks of the recording.
-#include "MwPlayViewController.h"
+#include "MwPlayBookmarks.h"
 
 #include <Elementary.h>
 
@@ -12,8 +11,10 @@
 #include <utility>
 
 #include "MwBookmarkWidget.h"
+#include "MwLog.h"
 #include "MwLoggingMgr.h"
 #include "MwModel.h"
+#include "MwPlayButton.h"
 #include "MwPlayRules.h"
 #include "MwResourceMgr.h"
 #include "MwSavedBookmarks.h"
@@ -21,6 +22,8 @@
 
 namespace {
 
+constexpr auto WIDGET_PART = "bookmark_confine_rect";
+constexpr auto BUTTON_PART = "bookmark_btn";
 constexpr auto IMAGE_FILE = "edje/MwImages.edj";
 constexpr auto MARKER_IMAGE = "mainView/voice_icon_bookmark_02.png";
 constexpr auto MARKER_COLOR = "AO002";
@@ -38,23 +41,49 @@ std::vector<std::string> namesOf(const std::vector<MwSavedBookmark>& bookmarks)
 
 }
 
-Evas_Object* MwPlayViewController::_bookmarkWidget() const
+MwPlayBookmarks::MwPlayBookmarks(Evas_Object* layout, MwModel* model, std::function<void()> added)
+    : _layout(layout)
+    , _model(model)
+    , _added(std::move(added))
 {
-    return elm_object_part_content_get(getEvasObject(), _bookmarkPart.c_str());
 }
 
-void MwPlayViewController::_removeBookmarkWidget()
+void MwPlayBookmarks::load()
 {
-    if (Evas_Object* widget = elm_object_part_content_unset(getEvasObject(), _bookmarkPart.c_str()); widget)
+    _loadBookmarkButton();
+    _loadBookmark();
+}
+
+void MwPlayBookmarks::hide()
+{
+    if (Evas_Object* widget = _bookmarkWidget(); widget)
+        evas_object_hide(widget);
+}
+
+void MwPlayBookmarks::_loadBookmarkButton()
+{
+    if (_model->isRequestMode() || elm_object_part_content_get(_layout, BUTTON_PART))
+        return;
+    Evas_Object* button = MwPlayButton::create(_layout,
+        {BUTTON_PART, false, "mainView/voice_icon_bookmark.png", "IDS_MW_BODY_BOOKMARK", "IDS_MW_BODY_BOOKMARK"});
+    if (!button)
+        return;
+    const auto clicked
+        = [](void* data, Evas_Object*, void*) { static_cast<MwPlayBookmarks*>(data)->_clickBookmarkButton(); };
+    evas_object_smart_callback_add(button, "clicked", clicked, this);
+    MwPlayButton::tintWhilePressed(button);
+}
+
+Evas_Object* MwPlayBookmarks::_bookmarkWidget() const { return elm_object_part_content_get(_layout, WIDGET_PART); }
+
+void MwPlayBookmarks::_removeBookmarkWidget()
+{
+    if (Evas_Object* widget = elm_object_part_content_unset(_layout, WIDGET_PART); widget)
         evas_object_del(widget);
 }
 
-void MwPlayViewController::_clickBookmarkButton()
+void MwPlayBookmarks::_clickBookmarkButton()
 {
-    if (!_model) {
-        MW_LOGE("_model == nullptr");
-        return;
-    }
     const unsigned int second = mwBookmarkSecond(_model->getCurrentPlayPosition(), _duration);
     static const std::vector<MwSavedBookmark> NONE;
     Evas_Object* widget = _bookmarkWidget();
@@ -78,10 +107,10 @@ void MwPlayViewController::_clickBookmarkButton()
         return;
     MwLoggingMgr::getInstance()->insert("BMRK");
     _loadBookmark();
-    _eventSignal.emit(BOOKMARK_ADDED);
+    _added();
 }
 
-void MwPlayViewController::_loadBookmark()
+void MwPlayBookmarks::_loadBookmark()
 {
     const MwFileInfo* info = _model->getRecordedFileInfoByPath(_model->getCurrentPlayPath());
     if (!info) {
@@ -94,13 +123,13 @@ void MwPlayViewController::_loadBookmark()
     _removeBookmarkWidget();
     if (bookmarks.empty())
         return;
-    Evas_Object* widget = MwBookmarkWidget::add(evas_object_evas_get(getEvasObject()), std::move(bookmarks), _duration);
-    elm_object_part_content_set(getEvasObject(), _bookmarkPart.c_str(), widget);
+    Evas_Object* widget = MwBookmarkWidget::add(evas_object_evas_get(_layout), std::move(bookmarks), _duration);
+    elm_object_part_content_set(_layout, WIDGET_PART, widget);
     _addMarkers(widget);
     evas_object_show(widget);
 }
 
-void MwPlayViewController::_addMarkers(Evas_Object* widget)
+void MwPlayBookmarks::_addMarkers(Evas_Object* widget)
 {
     std::string path;
     if (!MwResourceMgr::getInstance()->getEdjPath(IMAGE_FILE, path) || path.empty()) {
@@ -108,7 +137,7 @@ void MwPlayViewController::_addMarkers(Evas_Object* widget)
         return;
     }
     for (const MwSavedBookmark& bookmark : *MwBookmarkWidget::getBookmarks(widget)) {
-        Evas_Object* marker = elm_image_add(getEvasObject());
+        Evas_Object* marker = elm_image_add(_layout);
         elm_image_file_set(marker, path.c_str(), MARKER_IMAGE);
         uxt_theme_object_set_color(marker, MARKER_COLOR);
         evas_object_size_hint_align_set(marker, EVAS_HINT_FILL, EVAS_HINT_FILL);
