@@ -3,15 +3,20 @@
 #include <Elementary.h>
 
 #include <media_content.h>
+#include <panekit/WMenuPopupController.h>
 
 #include <utility>
 
+#include "MwAppController.h"
+#include "MwBookmarksList.h"
 #include "MwHandle.h"
 #include "MwLog.h"
 #include "MwModel.h"
+#include "MwNaviButtons.h"
 #include "MwPlayViewController.h"
 #include "MwRenamePopupController.h"
 #include "MwResourceMgr.h"
+#include "MwText.h"
 
 using panekit::WTimer;
 
@@ -19,6 +24,12 @@ namespace {
 
 constexpr auto LAYOUT_FILE = "edje/MwBookmarksContentView.edj";
 constexpr auto LAYOUT_GROUP = "bookmarks_content_view";
+constexpr auto BACK_PART = "prev_btn";
+constexpr auto LEFT_PART = "title_left_btn";
+constexpr auto LEFT_STYLE = "naviframe/title_left";
+constexpr auto RIGHT_PART = "title_right_btn";
+constexpr auto RIGHT_STYLE = "naviframe/title_right";
+constexpr auto MORE_PART = "title_more_btn";
 
 }
 
@@ -49,8 +60,9 @@ void MwBookmarksContentViewController::onCreated()
 {
     listenToSystemInfo([this](MwSignalMgr::SystemInfo info) { _systemInfoChanged(info); });
     setBackKeyHandler([this] { _backKeyClicked(); });
-    _createList();
-    _loadListItems();
+    _list = std::make_unique<MwBookmarksList>(getEvasObject(), _mediaId,
+        MwBookmarksList::Screen{.onSelected = [this](MwBookmarkListItem& row) { _itemListenerCb(row); },
+            .onKey = [this](const std::string& key) { return _playView && _playView->takeKey(key); }});
     _createPlayView();
 }
 
@@ -95,7 +107,8 @@ void MwBookmarksContentViewController::_playViewEvent(int event)
 {
     switch (event) {
     case MwPlayViewController::BOOKMARK_ADDED:
-        _reloadList();
+        _list->reload();
+        _updateMoreButton();
         return _updateTitle();
     case MwPlayViewController::FILE_CHANGED:
     case MwPlayViewController::TRIM_REQUESTED:
@@ -115,7 +128,7 @@ void MwBookmarksContentViewController::_systemInfoChanged(MwSignalMgr::SystemInf
         return;
     }
     _updateTitle();
-    elm_genlist_realized_items_update(_genlist);
+    _list->refresh();
 }
 
 void MwBookmarksContentViewController::_mediaDBUpdated()
@@ -131,5 +144,150 @@ void MwBookmarksContentViewController::_backKeyClicked()
 {
     if (_mode == MwBookmarkListItem::NORMAL)
         return popOut();
+    _enterMode(MwBookmarkListItem::NORMAL);
+}
+
+void MwBookmarksContentViewController::_enterMode(Mode mode)
+{
+    _mode = mode;
+    if (mode == MwBookmarkListItem::NORMAL)
+        _createPlayView();
+    else
+        _destroyPlayView();
+    _list->setMode(mode);
+    _updateTitle();
+    _updateNaviButton();
+    _updateMoreButton();
+}
+
+void MwBookmarksContentViewController::_updateTitle()
+{
+    if (_mode == MwBookmarkListItem::NORMAL)
+        return setTitle("IDS_MW_BODY_BOOKMARKS");
+    const int count = _mode == MwBookmarkListItem::DELETE ? _list->getCheckedCount() : 0;
+    if (count == 0)
+        return setTitle("IDS_MW_HEADER_SELECT_BOOKMARKS");
+    setCountTitle(static_cast<size_t>(count));
+}
+
+void MwBookmarksContentViewController::_updateNaviButton()
+{
+    for (const char* part : {BACK_PART, LEFT_PART, RIGHT_PART})
+        mwRemoveNaviButton(getNaviItem(), part);
+    const auto leave = [](void* data, Evas_Object*, void*) {
+        static_cast<MwBookmarksContentViewController*>(data)->_backKeyClicked();
+    };
+    if (_mode == MwBookmarkListItem::NORMAL) {
+        mwSetBackButton(getNaviItem(), leave, this);
+        return;
+    }
+    mwSetTitleButton(getNaviItem(), LEFT_PART, LEFT_STYLE, "IDS_TPLATFORM_ACBUTTON_CANCEL_ABB", leave, this);
+    if (_mode != MwBookmarkListItem::DELETE)
+        return;
+    const auto clicked = [](void* data, Evas_Object*, void*) {
+        static_cast<MwBookmarksContentViewController*>(data)->_deleteSelected();
+    };
+    mwSetTitleButton(getNaviItem(), RIGHT_PART, RIGHT_STYLE, "IDS_TPLATFORM_ACBUTTON_DELETE_ABB", clicked, this);
+    _updateCount();
+}
+
+// What the menu offers needs the normal mode and a bookmark.
+void MwBookmarksContentViewController::_updateMoreButton()
+{
+    if (!getNaviItem())
+        return;
+    mwRemoveNaviButton(getNaviItem(), MORE_PART);
+    if (_mode == MwBookmarkListItem::NORMAL && !_list->isEmpty())
+        setMoreButton([this] { _moreKeyClicked(); });
+}
+
+void MwBookmarksContentViewController::_updateCount()
+{
+    if (Evas_Object* button = elm_object_item_part_content_get(getNaviItem(), RIGHT_PART); button)
+        elm_object_disabled_set(button, _list->getCheckedCount() == 0);
+    _updateTitle();
+}
+
+void MwBookmarksContentViewController::_moreKeyClicked()
+{
+    if (_mode != MwBookmarkListItem::NORMAL || _list->isEmpty())
+        return;
+    auto* menu = new panekit::WMenuPopupController;
+    menu->addItem("IDS_MUSIC_OPT_RENAME", [this] {
+        MW_LOGW("Rename mode");
+        _enterMode(MwBookmarkListItem::RENAME);
+    });
+    menu->addItem("IDS_MW_OPT_DELETE", [this] {
+        MW_LOGW("Delete mode");
+        _enterMode(MwBookmarkListItem::DELETE);
+    });
+    attachPopup(menu);
+    menu->create(getWindow(), elm_object_item_widget_get(getNaviItem()));
+}
+
+void MwBookmarksContentViewController::_itemListenerCb(MwBookmarkListItem& item)
+{
+    switch (_mode) {
+    case MwBookmarkListItem::NORMAL:
+        return _jumpTo(item);
+    case MwBookmarkListItem::RENAME:
+        return _openRenamePopup(item);
+    case MwBookmarkListItem::DELETE:
+        _list->toggle(item);
+        return _updateCount();
+    }
+}
+
+void MwBookmarksContentViewController::_jumpTo(const MwBookmarkListItem& item)
+{
+    const std::weak_ptr<void> screen = token();
+    getModel()->setCurrentPlayPosition(item.getBookmark().markedTime * 1000);
+    getAppController()->getPlayerUpdatedSignal().emit();
+    if (screen.expired() || !_playView)
+        return;
+    if (!getAppController()->dispatchCommand(MwAppController::SET_PLAYER_POSITION))
+        MW_LOGE("set play position failed!");
+}
+
+void MwBookmarksContentViewController::_openRenamePopup(MwBookmarkListItem& item)
+{
+    if (_renamePopup) {
+        MW_LOGW("rename popup already show");
+        _closeRenamePopup();
+    }
+    _list->choose(item);
+    _renamedBookmark = item.getBookmark().id;
+    _renamePopup = std::make_unique<MwRenamePopupController>(item.getBookmark().name.c_str());
+    _renamePopup->setResponseCb(
+        [this](void*, const char* name, int response) { _renameResponseCb(name, response); }, this);
+    if (!_renamePopup->create(getWindow(), nullptr))
+        _closeRenamePopup();
+}
+
+// Gone after the callback that is still running in it.
+void MwBookmarksContentViewController::_closeRenamePopup()
+{
+    _renamedBookmark = 0;
+    if (const auto popup = std::exchange(_renamePopup, nullptr); popup)
+        popup->destory();
+}
+
+void MwBookmarksContentViewController::_renameResponseCb(const char* text, int response)
+{
+    if (response != MwRenamePopupController::RESPONSE_RENAME)
+        return _closeRenamePopup();
+    const std::string name = text ? text : "";
+    if (name.find_first_not_of(' ') == std::string::npos)
+        return mwPost("IDS_MW_POP_INVALID_FILE_NAME");
+    if (_list->isNameTaken(_renamedBookmark, name))
+        return mwPost("IDS_MW_POP_RENAMEALREADYUSED");
+    _list->rename(_renamedBookmark, name);
+    _closeRenamePopup();
+    _enterMode(MwBookmarkListItem::NORMAL);
+}
+
+void MwBookmarksContentViewController::_deleteSelected()
+{
+    _list->deleteChecked();
     _enterMode(MwBookmarkListItem::NORMAL);
 }

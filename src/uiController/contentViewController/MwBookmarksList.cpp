@@ -1,5 +1,4 @@
-// The bookmarks screen: its rows and what is done to them.
-#include "MwBookmarksContentViewController.h"
+#include "MwBookmarksList.h"
 
 #include <Elementary.h>
 
@@ -8,29 +7,34 @@
 #include <algorithm>
 #include <utility>
 
-#include "MwAppController.h"
 #include "MwLog.h"
-#include "MwModel.h"
-#include "MwPlayViewController.h"
-#include "MwRenamePopupController.h"
-#include "MwText.h"
 
 namespace {
 
 constexpr auto LIST_PART = "elm.swallow.list";
+constexpr auto RADIO_KEY = "radio";
+constexpr int FIRST_ROW_MIDDLE = 120; // design units below the upper edge of the window
 
 void readingFailed(const char* call, int code) { MW_LOGW("%s()... [0x%X]", call, static_cast<unsigned int>(code)); }
 
 }
 
-void MwBookmarksContentViewController::_createList()
+MwBookmarksList::MwBookmarksList(Evas_Object* layout, std::string mediaId, Screen screen)
+    : _mediaId(std::move(mediaId))
+    , _screen(std::move(screen))
 {
-    if (Evas_Object* other = elm_object_part_content_unset(getEvasObject(), LIST_PART); other)
+    _createList(layout);
+    _loadListItems();
+}
+
+void MwBookmarksList::_createList(Evas_Object* layout)
+{
+    if (Evas_Object* other = elm_object_part_content_unset(layout, LIST_PART); other)
         evas_object_del(other);
-    _genlist = elm_genlist_add(getEvasObject());
+    _genlist = elm_genlist_add(layout);
     elm_genlist_homogeneous_set(_genlist, EINA_TRUE);
     elm_genlist_mode_set(_genlist, ELM_LIST_COMPRESS);
-    elm_object_part_content_set(getEvasObject(), LIST_PART, _genlist);
+    elm_object_part_content_set(layout, LIST_PART, _genlist);
     evas_object_show(_genlist);
     // What has the keyboard when the list is focused is its inner object; the list would scroll by Left and Right.
     evas_object_event_callback_priority_add(
@@ -38,27 +42,26 @@ void MwBookmarksContentViewController::_createList()
     elm_object_focus_set(_genlist, EINA_TRUE);
 }
 
-void MwBookmarksContentViewController::_listKeyCb(void* data, Evas*, Evas_Object*, void* info)
+void MwBookmarksList::_listKeyCb(void* data, Evas*, Evas_Object*, void* info)
 {
-    const auto* self = static_cast<MwBookmarksContentViewController*>(data);
+    const auto* self = static_cast<MwBookmarksList*>(data);
     auto* event = static_cast<Evas_Event_Key_Down*>(info);
-    if (self->_playView && self->_playView->takeKey(event->key))
+    if (self->_screen.onKey(event->key))
         event->event_flags = static_cast<Evas_Event_Flags>(event->event_flags | EVAS_EVENT_FLAG_ON_HOLD);
 }
 
-void MwBookmarksContentViewController::_loadListItems()
+void MwBookmarksList::_loadListItems()
 {
     int index = 0;
     for (MwSavedBookmark& bookmark : mwReadBookmarks(_mediaId, readingFailed)) {
-        auto* row = new MwBookmarkListItem(
-            std::move(bookmark), ++index, [this](MwBookmarkListItem& item) { _itemListenerCb(item); });
+        auto* row = new Item(std::move(bookmark), ++index, [this](Item& item) { _screen.onSelected(item); });
         if (!row->append(_genlist))
             delete row;
     }
 }
 
 // The row on top stays there.
-void MwBookmarksContentViewController::_reloadList()
+void MwBookmarksList::reload()
 {
     Eina_Rectangle area;
     evas_object_geometry_get(_genlist, &area.x, &area.y, &area.w, &area.h);
@@ -70,119 +73,118 @@ void MwBookmarksContentViewController::_reloadList()
     if (index > 1)
         elm_genlist_item_show(
             elm_genlist_nth_item_get(_genlist, static_cast<unsigned int>(index - 1)), ELM_GENLIST_ITEM_SCROLLTO_TOP);
-    _updateMoreButton();
 }
 
-std::vector<MwBookmarkListItem*> MwBookmarksContentViewController::_rows() const
+void MwBookmarksList::refresh() { elm_genlist_realized_items_update(_genlist); }
+
+std::vector<MwBookmarksList::Item*> MwBookmarksList::_rows() const
 {
-    std::vector<MwBookmarkListItem*> rows;
+    std::vector<Item*> rows;
     for (Elm_Object_Item* item = elm_genlist_first_item_get(_genlist); item; item = elm_genlist_item_next_get(item)) {
-        auto* row = static_cast<MwBookmarkListItem*>(panekit::WGenlistItem::fromItem(item));
+        auto* row = static_cast<Item*>(panekit::WGenlistItem::fromItem(item));
         if (row && !row->isSelectAll())
             rows.push_back(row);
     }
     return rows;
 }
 
-int MwBookmarksContentViewController::_checkedCount() const
+void MwBookmarksList::setMode(Item::Mode mode)
+{
+    _clearSelection();
+    if (mode == Item::DELETE)
+        _appendSelectAllItem();
+    else
+        _removeSelectAllItem();
+    if (mode == Item::RENAME)
+        _createRadioGroup();
+    for (Item* row : _rows())
+        row->setMode(mode);
+}
+
+void MwBookmarksList::_clearSelection()
+{
+    for (Item* row : _rows())
+        row->setChecked(false);
+    elm_object_disabled_set(_genlist, EINA_FALSE);
+}
+
+// The group itself, hidden: the radios of the rows come and go with scrolling.
+void MwBookmarksList::_createRadioGroup()
+{
+    if (!_radio) {
+        _radio = elm_radio_add(_genlist);
+        elm_radio_state_value_set(_radio, -1);
+        evas_object_data_set(_genlist, RADIO_KEY, _radio);
+    }
+    elm_radio_value_set(_radio, -1);
+}
+
+void MwBookmarksList::_appendSelectAllItem()
+{
+    if (_selectAllItem)
+        return;
+    int x = 0;
+    int y = 0;
+    evas_object_geometry_get(_genlist, &x, &y, nullptr, nullptr);
+    const auto below = static_cast<int>(FIRST_ROW_MIDDLE * elm_config_scale_get() / elm_app_base_scale_get());
+    Elm_Object_Item* first = elm_genlist_at_xy_item_get(_genlist, x + 1, y + below, nullptr);
+    auto* row = new Item([this](Item& item) { _screen.onSelected(item); });
+    if (!row->prepend(_genlist)) {
+        delete row;
+        return;
+    }
+    _selectAllItem = row;
+    // A list at its beginning shows the new row.
+    if (first && elm_genlist_item_prev_get(first) == row->getItem())
+        elm_genlist_item_show(row->getItem(), ELM_GENLIST_ITEM_SCROLLTO_TOP);
+}
+
+void MwBookmarksList::_removeSelectAllItem()
+{
+    if (Item* row = std::exchange(_selectAllItem, nullptr); row)
+        elm_object_item_del(row->getItem());
+}
+
+int MwBookmarksList::getCheckedCount() const
 {
     const auto rows = _rows();
     return static_cast<int>(std::count_if(rows.begin(), rows.end(), [](const auto* row) { return row->isChecked(); }));
 }
 
-void MwBookmarksContentViewController::_itemListenerCb(MwBookmarkListItem& item)
+void MwBookmarksList::toggle(Item& item)
 {
-    switch (_mode) {
-    case MwBookmarkListItem::NORMAL:
-        return _jumpTo(item);
-    case MwBookmarkListItem::RENAME:
-        return _openRenamePopup(item);
-    case MwBookmarkListItem::DELETE:
-        return item.isSelectAll() ? _toggleAll() : _toggle(item);
+    const bool checked = !item.isChecked();
+    item.setChecked(checked);
+    if (item.isSelectAll()) {
+        for (Item* row : _rows())
+            row->setChecked(checked);
+    } else if (_selectAllItem) {
+        _selectAllItem->setChecked(getCheckedCount() == static_cast<int>(_rows().size()));
     }
 }
 
-void MwBookmarksContentViewController::_jumpTo(const MwBookmarkListItem& item)
-{
-    const std::weak_ptr<void> screen = token();
-    getModel()->setCurrentPlayPosition(item.getBookmark().markedTime * 1000);
-    getAppController()->getPlayerUpdatedSignal().emit();
-    if (screen.expired() || !_playView)
-        return;
-    if (!getAppController()->dispatchCommand(MwAppController::SET_PLAYER_POSITION))
-        MW_LOGE("set play position failed!");
-}
+void MwBookmarksList::choose(const Item& row) { elm_radio_value_set(_radio, row.getIndex()); }
 
-void MwBookmarksContentViewController::_toggle(MwBookmarkListItem& item)
-{
-    item.setChecked(!item.isChecked());
-    if (_selectAllItem)
-        _selectAllItem->setChecked(_checkedCount() == static_cast<int>(_rows().size()));
-    _updateCount();
-}
-
-void MwBookmarksContentViewController::_toggleAll()
-{
-    const bool checked = !_selectAllItem->isChecked();
-    _selectAllItem->setChecked(checked);
-    for (MwBookmarkListItem* row : _rows())
-        row->setChecked(checked);
-    _updateCount();
-}
-
-void MwBookmarksContentViewController::_openRenamePopup(MwBookmarkListItem& item)
-{
-    if (_renamePopup) {
-        MW_LOGW("rename popup already show");
-        _closeRenamePopup();
-    }
-    elm_radio_value_set(_radio, item.getIndex());
-    _renamedBookmark = item.getBookmark().id;
-    _renamePopup = std::make_unique<MwRenamePopupController>(item.getBookmark().name.c_str());
-    _renamePopup->setResponseCb(
-        [this](void*, const char* name, int response) { _renameResponseCb(name, response); }, this);
-    if (!_renamePopup->create(getWindow(), nullptr))
-        _closeRenamePopup();
-}
-
-// Gone after the callback that is still running in it.
-void MwBookmarksContentViewController::_closeRenamePopup()
-{
-    _renamedBookmark = 0;
-    if (const auto popup = std::exchange(_renamePopup, nullptr); popup)
-        popup->destory();
-}
-
-bool MwBookmarksContentViewController::_isNameTaken(const std::string& name) const
+bool MwBookmarksList::isNameTaken(int bookmark, const std::string& name) const
 {
     const auto rows = _rows();
-    return std::any_of(rows.begin(), rows.end(), [&](const MwBookmarkListItem* row) {
-        return row->getBookmark().id != _renamedBookmark && row->getBookmark().name == name;
-    });
+    return std::any_of(rows.begin(), rows.end(),
+        [&](const Item* row) { return row->getBookmark().id != bookmark && row->getBookmark().name == name; });
 }
 
-void MwBookmarksContentViewController::_renameResponseCb(const char* text, int response)
+void MwBookmarksList::rename(int bookmark, const std::string& name)
 {
-    if (response != MwRenamePopupController::RESPONSE_RENAME)
-        return _closeRenamePopup();
-    const std::string name = text ? text : "";
-    if (name.find_first_not_of(' ') == std::string::npos)
-        return mwPost("IDS_MW_POP_INVALID_FILE_NAME");
-    if (_isNameTaken(name))
-        return mwPost("IDS_MW_POP_RENAMEALREADYUSED");
     const auto rows = _rows();
-    const auto found = std::find_if(rows.begin(), rows.end(),
-        [this](const MwBookmarkListItem* row) { return row->getBookmark().id == _renamedBookmark; });
+    const auto found
+        = std::find_if(rows.begin(), rows.end(), [&](const Item* row) { return row->getBookmark().id == bookmark; });
     if (found != rows.end())
-        _renameBookmark((*found)->getBookmark(), name);
-    _reloadList();
-    _closeRenamePopup();
-    _enterMode(MwBookmarkListItem::NORMAL);
+        _replace((*found)->getBookmark(), name);
+    reload();
 }
 
 // A name cannot be changed: a new bookmark takes the place of the old one. The new one first, so that nothing is lost
 // when the program ends in between.
-void MwBookmarksContentViewController::_renameBookmark(const MwSavedBookmark& bookmark, const std::string& name)
+void MwBookmarksList::_replace(const MwSavedBookmark& bookmark, const std::string& name) const
 {
     int result = media_bookmark_insert_to_db(_mediaId.c_str(), bookmark.markedTime, name.c_str());
     if (result != MEDIA_CONTENT_ERROR_NONE) {
@@ -194,9 +196,9 @@ void MwBookmarksContentViewController::_renameBookmark(const MwSavedBookmark& bo
         MW_LOGW("media_bookmark_delete_from_db()... [0x%X]", static_cast<unsigned int>(result));
 }
 
-void MwBookmarksContentViewController::_deleteSelected()
+void MwBookmarksList::deleteChecked()
 {
-    for (MwBookmarkListItem* row : _rows()) {
+    for (Item* row : _rows()) {
         if (!row->isChecked())
             continue;
         const int result = media_bookmark_delete_from_db(row->getBookmark().id);
@@ -206,5 +208,4 @@ void MwBookmarksContentViewController::_deleteSelected()
         }
         elm_object_item_del(row->getItem());
     }
-    _enterMode(MwBookmarkListItem::NORMAL);
 }
