@@ -9,6 +9,7 @@
 
 #include "MwRecorderContentViewController.h"
 #include "MwRecordingTime.h"
+#include "MwRecordingsContentViewController.h"
 #include "MwSignalMgr.h"
 #include "MwSystemMgr.h"
 #include "RecorderScreen.h"
@@ -176,6 +177,18 @@ TEST(RecorderScreenTest, ASecondTapOnRecordOrStopDoesNothing)
     EXPECT_EQ(
         (Commands{MwAppController::START_RECORDING, MwAppController::STOP_RECORDING}), fakes::controller.commands);
     EXPECT_EQ(1, fakes::controller.recordingsOpened);
+}
+
+TEST(RecorderScreenTest, SpaceRecordsAfterAnotherScreenWasLeft)
+{
+    ui::RecorderScreen screen;
+    screen.naviframe->push(new MwRecordingsContentViewController(&screen.model, screen.controller()));
+    support::settle(screen.window);
+    screen.back();
+    support::settle(screen.window);
+    ASSERT_EQ(screen.button("record_button"), elm_object_focused_object_get(screen.window));
+    support::key(screen.window, "space");
+    EXPECT_EQ(1U, fakes::controller.pending.size());
 }
 
 TEST(RecorderScreenTest, AFailedOrRefusedStartLeavesAButtonThatWorks)

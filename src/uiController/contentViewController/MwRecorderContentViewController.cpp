@@ -308,10 +308,18 @@ void MwRecorderContentViewController::_showButtons(std::initializer_list<MwRecor
     _buttons->add(buttons);
     if (mwIsRecordingOrPaused(getModel()->getRecorderState()) && !getModel()->isRequestMode())
         _buttons->add({MwRecorderButtons::BOOKMARK});
-    // Return and Space act on the big button unless a popup has the keyboard.
-    if (!hasAttachedPopup() && !WPopupController::topmost())
+    _focusMainButton();
+}
+
+// Return and Space act on the big button unless a popup has the keyboard.
+void MwRecorderContentViewController::_focusMainButton()
+{
+    if (_buttons && !hasAttachedPopup() && !WPopupController::topmost())
         _buttons->focusMain();
 }
+
+// The naviframe gives the keyboard to what comes first in the title.
+void MwRecorderContentViewController::onBecomeTop() { _focusMainButton(); }
 
 void MwRecorderContentViewController::_getEstimatedRecordingMaxTime()
 {

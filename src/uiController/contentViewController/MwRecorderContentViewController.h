@@ -35,6 +35,7 @@ protected:
     void onDestroy() override;
     void onPushed(Evas_Object* item) override;
     void onTop() override;
+    void onBecomeTop() override;
 
 private:
     // Listening
@@ -58,6 +59,7 @@ private:
     void _updateRecording();
     void _updatePaused();
     void _showButtons(std::initializer_list<MwRecorderButtons::Button> buttons);
+    void _focusMainButton();
     void _getEstimatedRecordingMaxTime();
     void _setCallRejection(bool enable);
 

@@ -195,6 +195,13 @@ void MwRecordingsContentViewController::onTop()
     _list->forgetBookmarks();
 }
 
+// The naviframe gives the keyboard to what comes first in the title.
+void MwRecordingsContentViewController::onBecomeTop()
+{
+    if (_list)
+        _focusList();
+}
+
 void MwRecordingsContentViewController::_onPlayerUpdateSignal()
 {
     if (!_isComplete())

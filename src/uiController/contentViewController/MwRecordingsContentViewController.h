@@ -40,6 +40,7 @@ protected:
     void onPushed(Evas_Object* item) override;
     bool onPop() override;
     void onTop() override;
+    void onBecomeTop() override;
 
 private:
     // Life and signals
