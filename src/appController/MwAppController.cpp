@@ -9,7 +9,9 @@
 #include "MwAsyncCmdControl.h"
 #include "MwAvrcp.h"
 #include "MwLog.h"
+#include "MwMediaKeys.h"
 #include "MwModel.h"
+#include "MwRemoteControl.h"
 #include "MwSoundSession.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
@@ -61,11 +63,7 @@ bool sendToIndicator(const char* value)
 
 MwAppController::MwAppController() = default;
 
-MwAppController::~MwAppController()
-{
-    panekit::WTimer::destroy(_rewindTimer);
-    panekit::WTimer::destroy(_fastForwardTimer);
-}
+MwAppController::~MwAppController() = default;
 
 bool MwAppController::initialize(MwModel* model, panekit::WWindowController* windowController)
 {
@@ -85,6 +83,7 @@ bool MwAppController::initialize(MwModel* model, panekit::WWindowController* win
     _systemInfoListener = MwSignalMgr::getInstance()->getSystemInfoSignal().addListener(
         [this](MwSignalMgr::SystemInfo info) { _systemInfoChanged(info); });
     _initAsyncCmdControl();
+    _createMediaKeys();
     if (!_soundSession)
         _soundSession = std::make_unique<MwSoundSession>();
     if (!_avrcp)
@@ -97,9 +96,27 @@ bool MwAppController::initialize(MwModel* model, panekit::WWindowController* win
         MW_LOGE("_createPlayer failed");
         return false;
     }
-    _connectRemote();
+    _remoteControl
+        = std::make_unique<MwRemoteControl>(_model, [this](unsigned int position) { _seekByRemote(position); });
     MW_LOGW("END");
     return true;
+}
+
+void MwAppController::_createMediaKeys()
+{
+    MwMediaKeys::Controller controller;
+    controller.dispatch = [this](Command command) { return dispatchCommand(command); };
+    controller.stopRecording = [this] { _emitSignalAfterStopRecording(false); };
+    controller.onMainLoop = [this](std::function<void()> call) { _callSafetyMainThread(std::move(call)); };
+    _mediaKeys = std::make_unique<MwMediaKeys>(_model, std::move(controller));
+}
+
+void MwAppController::_seekByRemote(unsigned int position)
+{
+    _model->setCurrentPlayPosition(position);
+    if (!dispatchCommand(SET_PLAYER_POSITION))
+        MW_LOGE("set play position failed!");
+    _emitPlayerUpdatedSignal();
 }
 
 void MwAppController::deinitialize()
@@ -107,7 +124,7 @@ void MwAppController::deinitialize()
     MW_LOGW("BEGIN");
     if (_model == nullptr)
         return;
-    _disconnectRemote();
+    _remoteControl.reset();
     const auto playerState = _model->getPlayerState();
     const bool plays = playerState == PLAY_STATE_PLAYING || playerState == PLAY_STATE_PAUSED;
     if (_player && plays && !dispatchCommand(STOP_PLAYING))
@@ -270,7 +287,7 @@ void MwAppController::_recorderErrorOccurred(MwRecorder::ErrorType type)
         return;
     }
     _createErrorPopup("Interal Error!");
-    _ungrabMediaKey();
+    _mediaKeys->release();
     _releaseLock();
     const auto state = _model->getRecorderState();
     if ((state == REC_STATE_RECORDING || state == REC_STATE_PAUSED) && _recorder->hasEnded())

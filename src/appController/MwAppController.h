@@ -2,10 +2,7 @@
 
 #include <MainLoopMailbox.h>
 #include <Mutex.h>
-#include <media_key.h>
-#include <panekit/WTimer.h>
 #include <player.h>
-#include <remote_player.h>
 
 #include <functional>
 #include <memory>
@@ -17,7 +14,9 @@
 #include <panekit/WSignal.h>
 
 class MwAvrcp;
+class MwMediaKeys;
 class MwModel;
+class MwRemoteControl;
 class MwSoundSession;
 
 namespace panekit {
@@ -148,30 +147,7 @@ private:
     void _lifeCycleChanged(MwSignalMgr::LifeCycle lifeCycle);
     void _pauseInRequestMode();
     void _recorderErrorOccurred(MwRecorder::ErrorType type);
-    void _grabMediaKey();
-    void _ungrabMediaKey();
-    static void _mediaKeyStatusChanged(media_key_e key, media_key_event_e status, void* userData);
-    void _mediaKeyPressed(media_key_e key);
-    void _mediaKeyReleased(media_key_e key);
-    void _toggleRecording();
-    void _pauseRecordingByKey();
-    void _resumeRecordingByKey();
-    void _stopRecordingByKey();
-    void _togglePlaying();
-    void _pausePlayingByKey();
-    void _resumePlayingByKey();
-    void _playOtherByKey(Command command);
-    void _holdSeekKey(panekit::WTimer::Weak& timer, bool forward);
-    void _releaseSeekKey(panekit::WTimer::Weak& timer, Command shortPress);
-    bool _seekTick(bool forward);
-    void _dispatchByKey(Command command, const char* failure);
-
-    static bool _remoteTrackCb(remote_player_track_s* track, void* userData);
-    static int _remotePositionCb(void* userData);
-    static void _remoteSeekCb(int position, void* userData);
-    void _connectRemote();
-    static void _disconnectRemote();
-    bool _remoteTrack(remote_player_track_s& track) const;
+    void _createMediaKeys();
     void _seekByRemote(unsigned int position);
 
     void _emitPlayerUpdatedSignal();
@@ -187,6 +163,8 @@ private:
     std::unique_ptr<MwRecorder> _recorder;
     std::unique_ptr<MwPlayer> _player;
     std::unique_ptr<MwAvrcp> _avrcp;
+    std::unique_ptr<MwRemoteControl> _remoteControl;
+    std::unique_ptr<MwMediaKeys> _mediaKeys; // after the mailbox that it posts to
     bool _resumeAfterInterruption = false;
     unsigned int _lifeCycleListener = 0;
     unsigned int _systemInfoListener = 0;
@@ -200,10 +178,7 @@ private:
     panekit::WSignal<void()> _playerUpdatedSignal;
     panekit::WSignal<void()> _recorderUpdatedSignal;
     std::unique_ptr<AsyncCmdControl> _asyncCmdControl;
-    panekit::WTimer::Weak _rewindTimer;
-    panekit::WTimer::Weak _fastForwardTimer;
     panekit::WPopupController* _errorPopup = nullptr;
-    unsigned int _seekStep = 0; // milliseconds
     platform::MainLoopMailbox _mailbox;
     std::function<void()> _recordingsOpener;
     // Held for the whole execution of a command, by whichever thread executes it; recursive, for what a command tells

@@ -2,6 +2,7 @@
 
 #include "MwAvrcp.h"
 #include "MwLog.h"
+#include "MwMediaKeys.h"
 #include "MwModel.h"
 #include "MwText.h"
 
@@ -74,7 +75,7 @@ bool MwAppController::_executeStart()
         _emitRecorderUpdatedSignal();
         return false;
     }
-    _grabMediaKey();
+    _mediaKeys->grab();
     _sendMessagePort();
     _emitRecorderUpdatedSignal();
     return true;
@@ -106,7 +107,7 @@ bool MwAppController::_executeCancel()
 {
     if (_isOver() && _wasDiscarded)
         return true;
-    _ungrabMediaKey();
+    _mediaKeys->release();
     if (!_cancelRecording(false)) {
         MW_LOGE("_cancelRecording failed");
         _emitRecorderUpdatedSignal();
@@ -123,7 +124,7 @@ bool MwAppController::_executeStop(bool interrupted)
         MW_LOGI("the recording is over already");
         return true;
     }
-    _ungrabMediaKey();
+    _mediaKeys->release();
     bool stopped = false;
     if (_model->isTooShort()) {
         mwPost("IDS_MW_TPOP_COULDNT_SAVE_RECORDING_RECODING_TOO_SHORT");
@@ -144,7 +145,7 @@ bool MwAppController::_executeStartPlaying()
         MW_LOGE("_startPlaying failed");
         return false;
     }
-    _grabMediaKey();
+    _mediaKeys->grab();
     _emitPlayerUpdatedSignal();
     _sendMessagePort();
     _avrcp->setAvrcpState(MwAvrcp::PLAYING);
@@ -169,8 +170,8 @@ bool MwAppController::_executeResumePlaying()
         MW_LOGE("_resumePlaying failed");
         return false;
     }
-    _ungrabMediaKey();
-    _grabMediaKey();
+    _mediaKeys->release();
+    _mediaKeys->grab();
     _emitPlayerUpdatedSignal();
     _sendMessagePort();
     _avrcp->setAvrcpState(MwAvrcp::PLAYING);
@@ -179,7 +180,7 @@ bool MwAppController::_executeResumePlaying()
 
 bool MwAppController::_executeStopPlaying()
 {
-    _ungrabMediaKey();
+    _mediaKeys->release();
     _avrcp->setAvrcpState(MwAvrcp::STOPPED);
     if (!_stopPlaying()) {
         MW_LOGE("_stopPlaying failed");
@@ -196,10 +197,10 @@ bool MwAppController::_executeRestartPlaying()
         MW_LOGE("_stopPlaying failed");
         return false;
     }
-    _ungrabMediaKey();
+    _mediaKeys->release();
     const bool started = _startPlaying();
     if (started)
-        _grabMediaKey();
+        _mediaKeys->grab();
     else
         MW_LOGE("_startPlaying failed");
     _sendMessagePort();

@@ -1,7 +1,10 @@
 #include "MwAppController.h"
 
+#include <remote_player.h>
+
 #include "MwAvrcp.h"
 #include "MwLog.h"
+#include "MwMediaKeys.h"
 #include "MwModel.h"
 #include "MwSystemMgr.h"
 #include "MwText.h"
@@ -151,8 +154,8 @@ bool MwAppController::_playOther(const std::string& path)
         _emitPlayerUpdatedSignal();
         return false;
     }
-    _ungrabMediaKey();
-    _grabMediaKey();
+    _mediaKeys->release();
+    _mediaKeys->grab();
     _sendMessagePort();
     _avrcp->setAvrcpState(MwAvrcp::PLAYING);
     return true;
@@ -216,12 +219,11 @@ bool MwAppController::_executePlayNext()
 void MwAppController::_playerCompleted()
 {
     _sendMessagePort();
-    _ungrabMediaKey();
+    _mediaKeys->release();
     _avrcp->setAvrcpState(MwAvrcp::STOPPED);
     _emitPlayerUpdatedSignal();
     MwSystemMgr::getInstance()->releaseLockCPU();
-    panekit::WTimer::destroy(_rewindTimer);
-    panekit::WTimer::destroy(_fastForwardTimer);
+    _mediaKeys->stopSeeking();
 }
 
 void MwAppController::_playerInterrupted(player_interrupted_code_e code)
@@ -230,7 +232,7 @@ void MwAppController::_playerInterrupted(player_interrupted_code_e code)
     _sendMessagePort();
     const bool ended = code == PLAYER_INTERRUPTED_COMPLETED;
     if (_model->getPlayerState() != PLAY_STATE_PAUSED) {
-        _ungrabMediaKey();
+        _mediaKeys->release();
         _avrcp->setAvrcpState(MwAvrcp::STOPPED);
     } else if (!ended) {
         _avrcp->setAvrcpState(MwAvrcp::PAUSED);
@@ -252,7 +254,7 @@ void MwAppController::_playerErrorOccurred(MwPlayer::PlayerErrorType type)
 {
     MW_LOGI("BEGIN - error type : [%d]", type);
     _sendMessagePort();
-    _ungrabMediaKey();
+    _mediaKeys->release();
     _callSafetyMainThread([this] { _createErrorPopup("Interal Error by player!"); });
     MwSystemMgr::getInstance()->releaseLockCPU();
 }

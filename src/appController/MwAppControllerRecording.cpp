@@ -18,6 +18,7 @@
 #include "MwHandle.h"
 #include "MwLog.h"
 #include "MwLoggingMgr.h"
+#include "MwMediaKeys.h"
 #include "MwModel.h"
 #include "MwRecordingNotes.h"
 #include "MwSoundSession.h"
@@ -431,7 +432,7 @@ void MwAppController::_pauseInRequestMode()
     {
         const platform::Lock lock(_commandMutex);
         if (isRecordingOrPaused(*_model)) {
-            _ungrabMediaKey();
+            _mediaKeys->release();
             if (!_stopRecording(false))
                 MW_LOGE("_stopRecording failed");
         }

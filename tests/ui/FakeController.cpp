@@ -3,9 +3,15 @@
 #include <utility>
 
 #include "MwAvrcp.h"
+#include "MwMediaKeys.h"
+#include "MwRemoteControl.h"
 #include "MwSoundSession.h"
 
 class MwAppController::AsyncCmdControl { };
+
+// Never made here.
+MwRemoteControl::~MwRemoteControl() = default;
+MwMediaKeys::~MwMediaKeys() = default;
 
 MwAppController::MwAppController() = default;
 

@@ -1,6 +1,9 @@
-#include "MwAppController.h"
+#include "MwMediaKeys.h"
 
 #include <Ecore.h>
+
+#include <algorithm>
+#include <utility>
 
 #include "MwLog.h"
 #include "MwModel.h"
@@ -18,26 +21,40 @@ Ecore_Timer* ecoreTimer(const panekit::WTimer::Weak& timer)
 
 }
 
-void MwAppController::_grabMediaKey()
+MwMediaKeys::MwMediaKeys(MwModel* model, Controller controller)
+    : _model(model)
+    , _controller(std::move(controller))
 {
-    _callSafetyMainThread([this] {
+}
+
+MwMediaKeys::~MwMediaKeys() { stopSeeking(); }
+
+void MwMediaKeys::stopSeeking()
+{
+    panekit::WTimer::destroy(_rewindTimer);
+    panekit::WTimer::destroy(_fastForwardTimer);
+}
+
+void MwMediaKeys::grab()
+{
+    _controller.onMainLoop([this] {
         if (const int result = media_key_reserve(_mediaKeyStatusChanged, this); result != 0)
             MW_LOGE("media_key_reserve failed [%d]", result);
     });
 }
 
-void MwAppController::_ungrabMediaKey()
+void MwMediaKeys::release()
 {
-    _callSafetyMainThread([] {
+    _controller.onMainLoop([] {
         if (const int result = media_key_release(); result != 0)
             MW_LOGE("media_key_release failed [%d]", result);
     });
 }
 
-void MwAppController::_mediaKeyStatusChanged(media_key_e key, media_key_event_e status, void* userData)
+void MwMediaKeys::_mediaKeyStatusChanged(media_key_e key, media_key_event_e status, void* userData)
 {
     MW_LOGI("key type:%d status:%d", key, status);
-    auto* self = static_cast<MwAppController*>(userData);
+    auto* self = static_cast<MwMediaKeys*>(userData);
     if (self == nullptr || self->_model == nullptr) {
         MW_LOGE("self is nullptr");
         return;
@@ -48,7 +65,7 @@ void MwAppController::_mediaKeyStatusChanged(media_key_e key, media_key_event_e 
         self->_mediaKeyReleased(key);
 }
 
-void MwAppController::_mediaKeyPressed(media_key_e key)
+void MwMediaKeys::_mediaKeyPressed(media_key_e key)
 {
     if (_model->getPlayerState() != PLAY_STATE_PLAYING)
         return;
@@ -58,7 +75,7 @@ void MwAppController::_mediaKeyPressed(media_key_e key)
         _holdSeekKey(_rewindTimer, false);
 }
 
-void MwAppController::_mediaKeyReleased(media_key_e key)
+void MwMediaKeys::_mediaKeyReleased(media_key_e key)
 {
     switch (key) {
     case MEDIA_KEY_PLAY:
@@ -77,16 +94,16 @@ void MwAppController::_mediaKeyReleased(media_key_e key)
         _resumeRecordingByKey();
         break;
     case MEDIA_KEY_PREVIOUS:
-        _playOtherByKey(PLAY_PREVIOUS);
+        _playOtherByKey(MwAppController::PLAY_PREVIOUS);
         break;
     case MEDIA_KEY_NEXT:
-        _playOtherByKey(PLAY_NEXT);
+        _playOtherByKey(MwAppController::PLAY_NEXT);
         break;
     case MEDIA_KEY_FASTFORWARD:
-        _releaseSeekKey(_fastForwardTimer, PLAY_NEXT);
+        _releaseSeekKey(_fastForwardTimer, MwAppController::PLAY_NEXT);
         break;
     case MEDIA_KEY_REWIND:
-        _releaseSeekKey(_rewindTimer, PLAY_PREVIOUS);
+        _releaseSeekKey(_rewindTimer, MwAppController::PLAY_PREVIOUS);
         break;
     case MEDIA_KEY_PLAYPAUSE:
         _togglePlaying();
@@ -99,13 +116,13 @@ void MwAppController::_mediaKeyReleased(media_key_e key)
     }
 }
 
-void MwAppController::_dispatchByKey(Command command, const char* failure)
+void MwMediaKeys::_dispatchByKey(MwAppController::Command command, const char* failure)
 {
-    if (!dispatchCommand(command))
+    if (!_controller.dispatch(command))
         MW_LOGE("%s", failure);
 }
 
-void MwAppController::_toggleRecording()
+void MwMediaKeys::_toggleRecording()
 {
     if (_model->getRecorderState() == REC_STATE_RECORDING)
         _pauseRecordingByKey();
@@ -113,27 +130,25 @@ void MwAppController::_toggleRecording()
         _resumeRecordingByKey();
 }
 
-void MwAppController::_pauseRecordingByKey()
+void MwMediaKeys::_pauseRecordingByKey()
 {
     if (_model->getRecorderState() == REC_STATE_RECORDING)
-        _dispatchByKey(PAUSE_RECORDING, "pause recording failed");
+        _dispatchByKey(MwAppController::PAUSE_RECORDING, "pause recording failed");
 }
 
-void MwAppController::_resumeRecordingByKey()
+void MwMediaKeys::_resumeRecordingByKey()
 {
     if (_model->getRecorderState() == REC_STATE_PAUSED)
-        _dispatchByKey(RESUME_RECORDING, "resume recording failed");
+        _dispatchByKey(MwAppController::RESUME_RECORDING, "resume recording failed");
 }
 
-// On the worker: the window does not wait for the save.
-void MwAppController::_stopRecordingByKey()
+void MwMediaKeys::_stopRecordingByKey()
 {
-    const auto state = _model->getRecorderState();
-    if (state == REC_STATE_RECORDING || state == REC_STATE_PAUSED)
-        _emitSignalAfterStopRecording(false);
+    if (mwIsRecordingOrPaused(_model->getRecorderState()))
+        _controller.stopRecording();
 }
 
-void MwAppController::_togglePlaying()
+void MwMediaKeys::_togglePlaying()
 {
     if (_model->getPlayerState() == PLAY_STATE_PLAYING)
         _pausePlayingByKey();
@@ -141,32 +156,32 @@ void MwAppController::_togglePlaying()
         _resumePlayingByKey();
 }
 
-void MwAppController::_pausePlayingByKey()
+void MwMediaKeys::_pausePlayingByKey()
 {
     if (_model->getPlayerState() == PLAY_STATE_PLAYING)
-        _dispatchByKey(PAUSE_PLAYING, "pause playing failed");
+        _dispatchByKey(MwAppController::PAUSE_PLAYING, "pause playing failed");
 }
 
-void MwAppController::_resumePlayingByKey()
+void MwMediaKeys::_resumePlayingByKey()
 {
     if (_model->getPlayerState() == PLAY_STATE_PAUSED)
-        _dispatchByKey(RESUME_PLAYING, "resume playing failed");
+        _dispatchByKey(MwAppController::RESUME_PLAYING, "resume playing failed");
 }
 
-void MwAppController::_playOtherByKey(Command command)
+void MwMediaKeys::_playOtherByKey(MwAppController::Command command)
 {
     if (_model->getPlayerState() != PLAY_STATE_NONE)
-        _dispatchByKey(command, command == PLAY_NEXT ? "play next failed!" : "play previous failed!");
+        _dispatchByKey(command, command == MwAppController::PLAY_NEXT ? "play next failed!" : "play previous failed!");
 }
 
-void MwAppController::_holdSeekKey(panekit::WTimer::Weak& timer, bool forward)
+void MwMediaKeys::_holdSeekKey(panekit::WTimer::Weak& timer, bool forward)
 {
     panekit::WTimer::destroy(timer);
     timer = panekit::WTimer::addTimer(FIRST_TICK_SECONDS, [this, forward](void*) { return _seekTick(forward); });
 }
 
 // A key let go before the first tick means the next or previous recording.
-void MwAppController::_releaseSeekKey(panekit::WTimer::Weak& timer, Command shortPress)
+void MwMediaKeys::_releaseSeekKey(panekit::WTimer::Weak& timer, MwAppController::Command shortPress)
 {
     _seekStep = 0;
     Ecore_Timer* handle = ecoreTimer(timer);
@@ -178,7 +193,7 @@ void MwAppController::_releaseSeekKey(panekit::WTimer::Weak& timer, Command shor
         _playOtherByKey(shortPress);
 }
 
-bool MwAppController::_seekTick(bool forward)
+bool MwMediaKeys::_seekTick(bool forward)
 {
     if (_model->getPlayerState() == PLAY_STATE_NONE) {
         MW_LOGE("player state is none!!!!");
@@ -192,7 +207,7 @@ bool MwAppController::_seekTick(bool forward)
         _model->setCurrentPlayPosition(std::min(position + _seekStep, _model->getCurrentPlayDuration()));
     else
         _model->setCurrentPlayPosition(position > _seekStep ? position - _seekStep : 0);
-    if (!dispatchCommand(SET_PLAYER_POSITION))
+    if (!_controller.dispatch(MwAppController::SET_PLAYER_POSITION))
         MW_LOGE("set play position failed!");
     return true;
 }
