@@ -96,7 +96,8 @@ void addBuses(Report& report)
         "buttons while recording in the background, where no control window is possible or wanted",
         "media controls (MPRIS) only");
     report.addName("portal", session, "org.freedesktop.portal.Desktop", "light theme, clock of the region");
-    report.add("MPRIS", session != nullptr, "available", "keys of the keyboard only");
+    report.add("MPRIS", session != nullptr, "available",
+        host::displayServer() == "x11" ? "keys of the keyboard only" : "no media keys");
 }
 
 std::string rootText(const char* root) { return std::string(root) + (::access(root, W_OK) == 0 ? "" : " (read only)"); }

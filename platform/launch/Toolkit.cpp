@@ -28,7 +28,7 @@ void prepareToolkitEnvironment()
 {
     setDefault("ECORE_NO_SYSTEM_MODULES", "1"); // they speak to the system bus on their own, noisily
     if (const std::string server = host::displayServer(); !server.empty())
-        setDefault("ELM_DISPLAY", server.c_str());
+        ::setenv("ELM_DISPLAY", server.c_str(), 1); // also where it is set, but empty
 }
 
 bool startToolkit(int argc, char** argv)

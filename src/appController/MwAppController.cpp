@@ -133,7 +133,7 @@ void MwAppController::deinitialize()
         // A command of the worker is waited for, so the state read here is the final one.
         const platform::Lock lock(_commandMutex);
         const auto recorderState = _model->getRecorderState();
-        const bool records = recorderState == REC_STATE_RECORDING || recorderState == REC_STATE_PAUSED;
+        const bool records = mwIsRecordingOrPaused(recorderState);
         if (_recorder && records && !dispatchCommand(STOP_RECORDING))
             MW_LOGE("recording stop failed");
     }
@@ -290,7 +290,7 @@ void MwAppController::_recorderErrorOccurred(MwRecorder::ErrorType type)
     _mediaKeys->release();
     _releaseLock();
     const auto state = _model->getRecorderState();
-    if ((state == REC_STATE_RECORDING || state == REC_STATE_PAUSED) && _recorder->hasEnded())
+    if (mwIsRecordingOrPaused(state) && _recorder->hasEnded())
         _emitSignalAfterStopRecording(true);
 }
 

@@ -164,7 +164,7 @@ private:
     std::unique_ptr<MwPlayer> _player;
     std::unique_ptr<MwAvrcp> _avrcp;
     std::unique_ptr<MwRemoteControl> _remoteControl;
-    std::unique_ptr<MwMediaKeys> _mediaKeys; // after the mailbox that it posts to
+    std::unique_ptr<MwMediaKeys> _mediaKeys; // outlives the mailbox that it posts to
     bool _resumeAfterInterruption = false;
     unsigned int _lifeCycleListener = 0;
     unsigned int _systemInfoListener = 0;

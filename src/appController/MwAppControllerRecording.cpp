@@ -28,12 +28,6 @@ namespace {
 
 constexpr int AUDIO = 0; // kind of recording asked about
 
-bool isRecordingOrPaused(const MwModel& model)
-{
-    const auto state = model.getRecorderState();
-    return state == REC_STATE_RECORDING || state == REC_STATE_PAUSED;
-}
-
 bool isInBackground(const MwModel& model)
 {
     return model.getAppState() == MwModel::APP_STATE_PAUSED || model.getAppState() == MwModel::APP_STATE_TERMINATED;
@@ -177,7 +171,7 @@ bool MwAppController::_cancelRecording(bool interrupted)
 {
     if (!isComplete(_recorder.get(), _model, _soundSession.get()))
         return false;
-    if (!isRecordingOrPaused(*_model)) {
+    if (!mwIsRecordingOrPaused(_model->getRecorderState())) {
         MW_LOGE("current state is [%d]!! can't cancel recording", mwNumber(_model->getRecorderState()));
         return false;
     }
@@ -228,7 +222,7 @@ bool MwAppController::_stopRecording(bool interrupted)
 {
     if (!isComplete(_recorder.get(), _model, _soundSession.get()))
         return false;
-    if (!isRecordingOrPaused(*_model)) {
+    if (!mwIsRecordingOrPaused(_model->getRecorderState())) {
         MW_LOGE("current state is [%d]!! can't stop recording", mwNumber(_model->getRecorderState()));
         return false;
     }
@@ -431,7 +425,7 @@ void MwAppController::_pauseInRequestMode()
 {
     {
         const platform::Lock lock(_commandMutex);
-        if (isRecordingOrPaused(*_model)) {
+        if (mwIsRecordingOrPaused(_model->getRecorderState())) {
             _mediaKeys->release();
             if (!_stopRecording(false))
                 MW_LOGE("_stopRecording failed");

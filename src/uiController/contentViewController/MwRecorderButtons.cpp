@@ -9,8 +9,7 @@
 #include <panekit/WAccessibility.h>
 #include <uxt_theme.h>
 
-#include "MwLog.h"
-#include "MwResourceMgr.h"
+#include "MwPartImage.h"
 
 struct MwRecorderButtons::Look {
     const char* part;
@@ -25,7 +24,6 @@ struct MwRecorderButtons::Look {
 
 namespace {
 
-constexpr auto IMAGE_FILE = "edje/MwImages.edj";
 constexpr auto ICON_PART = "elm.icon.normal";
 constexpr auto BACKGROUND_PART = "elm.icon.bg";
 constexpr auto LABEL_PART = "elm.text";
@@ -95,9 +93,9 @@ void MwRecorderButtons::_create(Button button)
     Evas_Object* object = uxt_button_add_with_style(_layout, look.style);
     elm_object_part_content_set(_layout, look.part, object);
     if (look.icon)
-        _setImage(object, ICON_PART, look.icon, look.iconColor);
+        mwSetPartImage(object, ICON_PART, look.icon, look.iconColor);
     if (look.background)
-        _setImage(object, BACKGROUND_PART, look.background, look.backgroundColor);
+        mwSetPartImage(object, BACKGROUND_PART, look.background, look.backgroundColor);
     if (look.label)
         elm_object_domain_translatable_part_text_set(object, LABEL_PART, textdomain(nullptr), look.label);
     panekit::setAccessibleName(object, look.accessibleName);
@@ -109,20 +107,6 @@ void MwRecorderButtons::_create(Button button)
             object, EVAS_CALLBACK_KEY_DOWN, EVAS_CALLBACK_PRIORITY_BEFORE, _stopKeyCb, this);
     }
     evas_object_show(object);
-}
-
-void MwRecorderButtons::_setImage(Evas_Object* button, const char* part, const char* image, const char* color)
-{
-    std::string path;
-    if (!MwResourceMgr::getInstance()->getEdjPath(IMAGE_FILE, path) || path.empty()) {
-        MW_LOGE("getEdjPath fail");
-        return;
-    }
-    Evas_Object* icon = elm_image_add(button);
-    elm_image_file_set(icon, path.c_str(), image);
-    uxt_theme_object_set_color(icon, color);
-    elm_object_part_content_set(button, part, icon);
-    evas_object_show(icon);
 }
 
 void MwRecorderButtons::focusMain()

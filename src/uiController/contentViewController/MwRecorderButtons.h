@@ -35,7 +35,6 @@ private:
     static const Look& _look(Button button);
     Evas_Object* _get(Button button) const;
     void _create(Button button);
-    static void _setImage(Evas_Object* button, const char* part, const char* image, const char* color);
     static void _clickedCb(void* data, Evas_Object* object, void* info);
     static void _stopKeyCb(void* data, Eo* canvas, Evas_Object* object, void* info);
 

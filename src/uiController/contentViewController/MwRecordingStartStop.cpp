@@ -110,7 +110,7 @@ void MwRecordingStartStop::_tooShortCancelled(MwAppController::Result result)
 void MwRecordingStartStop::stopForRemovedCard()
 {
     if (!_isStopping)
-        _stop(MwAppController::STOP_RECORDING, &MwRecordingStartStop::_stoppedByRemovedCard);
+        _isStopping = _dispatchAsync(MwAppController::STOP_RECORDING, &MwRecordingStartStop::_stoppedByRemovedCard);
 }
 
 // The controller has told what became of a recording that could not be saved.

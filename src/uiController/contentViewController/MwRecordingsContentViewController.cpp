@@ -685,8 +685,8 @@ void MwRecordingsContentViewController::_deletePlayingFile()
     _catalogueShrank();
     if (getModel()->getPlayerState() == PLAY_STATE_NONE)
         _update();
-    else if (!getAppController()->dispatchCommand(MwAppController::STOP_PLAYING))
-        MW_LOGE("play stop failed!");
+    else
+        _playing.stop();
 }
 
 void MwRecordingsContentViewController::_clickMoveDoneButton(const std::vector<std::string>& pathList)

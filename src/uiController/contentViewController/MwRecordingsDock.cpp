@@ -11,6 +11,7 @@
 #include "MwAppController.h"
 #include "MwLog.h"
 #include "MwModel.h"
+#include "MwPartImage.h"
 #include "MwPlayViewController.h"
 #include "MwRecordingsMode.h"
 #include "MwResourceMgr.h"
@@ -21,29 +22,8 @@ namespace {
 
 constexpr auto LAYOUT_FILE = "edje/MwRecordingsContentView.edj";
 constexpr auto RECORD_CONTROLLER_GROUP = "record_controller";
-constexpr auto IMAGE_FILE = "edje/MwImages.edj";
 constexpr auto CONTROLLER_PART = "elm.swallow.controller";
 constexpr auto RECORD_PART = "record_button";
-
-std::string edjePath(const char* file)
-{
-    std::string path;
-    if (!MwResourceMgr::getInstance()->getEdjPath(file, path) || path.empty())
-        MW_LOGE("getEdjPath fail");
-    return path;
-}
-
-void setIcon(Evas_Object* button, const char* part, const char* image, const char* color)
-{
-    const std::string path = edjePath(IMAGE_FILE);
-    if (path.empty())
-        return;
-    Evas_Object* icon = elm_image_add(button);
-    elm_image_file_set(icon, path.c_str(), image);
-    uxt_theme_object_set_color(icon, color);
-    elm_object_part_content_set(button, part, icon);
-    evas_object_show(icon);
-}
 
 }
 
@@ -74,14 +54,16 @@ void MwRecordingsDock::createRecordController()
 {
     if (elm_object_part_content_get(_layout, CONTROLLER_PART))
         return;
-    const std::string path = edjePath(LAYOUT_FILE);
-    if (path.empty())
+    std::string path;
+    if (!MwResourceMgr::getInstance()->getEdjPath(LAYOUT_FILE, path) || path.empty()) {
+        MW_LOGE("getEdjPath fail");
         return;
+    }
     Evas_Object* layout = elm_layout_add(_layout);
     elm_layout_file_set(layout, path.c_str(), RECORD_CONTROLLER_GROUP);
     Evas_Object* button = uxt_button_add_with_style(layout, "mewlo/circle_button/large");
-    setIcon(button, "elm.icon.normal", "mainView/voice_btn_rec.png", "AO014");
-    setIcon(button, "elm.icon.bg", "mainView/voice_btn_bg_rec.png", "AO001");
+    mwSetPartImage(button, "elm.icon.normal", "mainView/voice_btn_rec.png", "AO014");
+    mwSetPartImage(button, "elm.icon.bg", "mainView/voice_btn_bg_rec.png", "AO001");
     panekit::setAccessibleName(button, "IDS_MW_BODY_RECORD");
     elm_object_focus_move_policy_set(button, ELM_FOCUS_MOVE_POLICY_KEY_ONLY);
     const auto clicked

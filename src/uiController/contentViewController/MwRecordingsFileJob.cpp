@@ -157,11 +157,11 @@ void MwRecordingsFileJob::rename(const MwFileOperator::Source& source,
     _fileOperator->start();
 }
 
-// The callback ends the job, and may begin another one.
+// The callback ends the job, and may begin another one. A full bar may be seen after the end.
 void MwRecordingsFileJob::_finish()
 {
-    const auto finished = std::exchange(_finished, nullptr);
-    finished();
+    if (const auto finished = std::exchange(_finished, nullptr); finished)
+        finished();
 }
 
 void MwRecordingsFileJob::_createMovingingPopupController()

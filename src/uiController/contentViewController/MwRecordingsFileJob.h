@@ -50,7 +50,6 @@ private:
     [[nodiscard]] bool _mayStart(const Paths& pathList) const;
     [[nodiscard]] std::vector<MwFileOperator::Source> _sourcesOf(const Paths& pathList) const;
     void _cancelDeleting();
-    void _onDeleteFiles();
     void _createMovingingPopupController();
     void _cancelMoving();
     void _updateMovePopup();

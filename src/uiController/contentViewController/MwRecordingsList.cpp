@@ -334,18 +334,13 @@ void MwRecordingsList::bringInAfterFrame()
 
 void MwRecordingsList::_cancelBringIn()
 {
-    if (_layout)
-        evas_event_callback_del_full(
-            evas_object_evas_get(_layout), EVAS_CALLBACK_RENDER_FLUSH_POST, _playerViewFulshPost, this);
+    evas_event_callback_del_full(
+        evas_object_evas_get(_layout), EVAS_CALLBACK_RENDER_FLUSH_POST, _playerViewFulshPost, this);
 }
 
 void MwRecordingsList::_playerViewFulshPost(void* data, Evas*, void*)
 {
     auto* self = static_cast<MwRecordingsList*>(data);
-    if (!self) {
-        MW_LOGE("data is nullptr");
-        return;
-    }
     self->_cancelBringIn();
     self->bringInItem();
 }

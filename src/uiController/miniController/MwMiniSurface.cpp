@@ -9,12 +9,11 @@
 
 #include "MwDisplayText.h"
 #include "MwLog.h"
+#include "MwPartImage.h"
 #include "MwResourceMgr.h"
 #include "MwText.h"
 
 namespace {
-
-constexpr auto IMAGE_FILE = "edje/MwImages.edj";
 
 // Null when it cannot be drawn (logged).
 Evas_Object* addLayout(Evas_Object* parent, const MwMiniSurfaceLook& look)
@@ -32,27 +31,13 @@ Evas_Object* addLayout(Evas_Object* parent, const MwMiniSurfaceLook& look)
     return nullptr;
 }
 
-void addImage(Evas_Object* button, const char* part, const char* image, const char* color)
-{
-    std::string path;
-    if (!MwResourceMgr::getInstance()->getEdjPath(IMAGE_FILE, path)) {
-        MW_LOGE("getEdjPath fail");
-        return;
-    }
-    Evas_Object* icon = elm_image_add(button);
-    elm_image_file_set(icon, path.c_str(), image);
-    uxt_theme_object_set_color(icon, color);
-    elm_object_part_content_set(button, part, icon);
-    evas_object_show(icon);
-}
-
 Evas_Object* makeButton(Evas_Object* parent, const MwMiniButton& look)
 {
     Evas_Object* button = uxt_button_add_with_style(parent, look.style);
     if (look.icon)
-        addImage(button, "elm.icon.normal", look.icon, look.color);
+        mwSetPartImage(button, "elm.icon.normal", look.icon, look.color);
     if (look.background)
-        addImage(button, "elm.icon.bg", look.background, look.backgroundColor);
+        mwSetPartImage(button, "elm.icon.bg", look.background, look.backgroundColor);
     return button;
 }
 

@@ -8,30 +8,13 @@
 #include <panekit/WAccessibility.h>
 #include <uxt_theme.h>
 
-#include "MwLog.h"
-#include "MwResourceMgr.h"
+#include "MwPartImage.h"
 
 namespace {
 
-constexpr auto IMAGE_FILE = "edje/MwImages.edj";
 constexpr auto ICON_PART = "elm.icon.normal";
 constexpr auto LABEL_PART = "elm.text";
 constexpr std::array COLORS = {"AO024", "AO024P", "AO024D"};
-
-bool setIcon(Evas_Object* button, const char* image)
-{
-    std::string path;
-    if (!MwResourceMgr::getInstance()->getEdjPath(IMAGE_FILE, path) || path.empty()) {
-        MW_LOGE("getEdjPath fail");
-        return false;
-    }
-    Evas_Object* icon = elm_image_add(button);
-    elm_image_file_set(icon, path.c_str(), image);
-    uxt_theme_object_set_color(icon, COLORS.front());
-    elm_object_part_content_set(button, ICON_PART, icon);
-    evas_object_show(icon);
-    return true;
-}
 
 template <MwPlayButton::Tint TINT>
 void tintCb(void*, Evas_Object* button, void*)
@@ -45,7 +28,7 @@ Evas_Object* MwPlayButton::create(Evas_Object* layout, const Look& look)
 {
     Evas_Object* button = uxt_button_add_with_style(
         layout, look.isLarge ? "mewlo/circle_button/large" : "mewlo/circle_button/player_small");
-    if (!setIcon(button, look.icon)) {
+    if (!mwSetPartImage(button, ICON_PART, look.icon, COLORS.front())) {
         evas_object_del(button);
         return nullptr;
     }
@@ -61,7 +44,7 @@ Evas_Object* MwPlayButton::create(Evas_Object* layout, const Look& look)
 
 void MwPlayButton::change(Evas_Object* button, const char* icon, const char* accessibleName)
 {
-    setIcon(button, icon);
+    mwSetPartImage(button, ICON_PART, icon, COLORS.front());
     panekit::setAccessibleName(button, accessibleName);
 }
 

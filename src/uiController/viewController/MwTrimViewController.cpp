@@ -11,6 +11,7 @@
 
 #include "MwLog.h"
 #include "MwModel.h"
+#include "MwPartImage.h"
 #include "MwPlayRules.h"
 #include "MwResourceMgr.h"
 #include "MwSavedBookmarks.h"
@@ -175,7 +176,7 @@ Evas_Object* MwTrimViewController::_createButton(
     const char* part, const char* style, const char* icon, const char* label)
 {
     Evas_Object* button = uxt_button_add_with_style(getEvasObject(), style);
-    _setIcon(button, icon, COLOR);
+    mwSetPartImage(button, ICON_PART, icon, COLOR);
     if (label) {
         elm_object_domain_translatable_part_text_set(button, LABEL_PART, textdomain(nullptr), label);
         panekit::setAccessibleName(button, label);
@@ -184,15 +185,6 @@ Evas_Object* MwTrimViewController::_createButton(
     elm_object_part_content_set(getEvasObject(), part, button);
     evas_object_show(button);
     return button;
-}
-
-void MwTrimViewController::_setIcon(Evas_Object* button, const char* image, const char* color)
-{
-    Evas_Object* icon = elm_image_add(button);
-    elm_image_file_set(icon, edjePath(IMAGE_FILE).c_str(), image);
-    uxt_theme_object_set_color(icon, color);
-    elm_object_part_content_set(button, ICON_PART, icon);
-    evas_object_show(icon);
 }
 
 void MwTrimViewController::_createBookmarkUI()
@@ -393,7 +385,7 @@ void MwTrimViewController::_updatePlayButton()
     Evas_Object* button = elm_object_part_content_get(getEvasObject(), PLAY_BUTTON);
     const char* image = _isPlaying() ? PAUSE_IMAGE : PLAY_IMAGE;
     if (imageOf(button) != image)
-        _setIcon(button, image, COLOR);
+        mwSetPartImage(button, ICON_PART, image, COLOR);
     panekit::setAccessibleName(button, _isPlaying() ? "IDS_MW_BODY_PAUSE" : "IDS_MW_BUTTON_PLAY");
 }
 

@@ -56,7 +56,6 @@ private:
 
     void _createButtons();
     Evas_Object* _createButton(const char* part, const char* style, const char* icon, const char* label);
-    void _setIcon(Evas_Object* button, const char* image, const char* color);
     void _createBookmarkUI();
     void _createWaveform();
     void _createBars();
